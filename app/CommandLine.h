@@ -1,0 +1,46 @@
+// app/CommandLine.h - the command line: tokens, options, file names, and the set of open files.
+//
+// A command line replaces the set of open files: files that it names again stay as they are, new
+// ones are loaded, the others are saved when modified and closed.
+#pragma once
+
+#include <string>
+
+#include "store/BibFileSet.h"
+
+enum { COMMAND_LINE_SIZE = 1024, BASE_FOLDER_SIZE = 256, TOKEN_SIZE = 512 };
+
+// What options set, beyond the files. One for the process.
+struct CommandState {
+    char baseFolder[BASE_FOLDER_SIZE]; // relative names are resolved against it
+    uint32_t companionWindow;          // -w
+    uint32_t companionNumber;          // -w; not read
+    char companionService[BASE_FOLDER_SIZE + 1]; // -w; "" for none
+    // Answers TNSearch("bib", ...): malloc'd path or null. Null: nothing more is found.
+    char *(*findBib)(const char *name);
+};
+
+struct CommandResult {
+    int errors;  // above 0: the messages window opens
+    int changes; // above 0: rows and layout are out of date
+};
+
+// The arguments from the second on, joined by blanks; one that holds a blank is put in double
+// quotes. Null, logged, when the line does not fit in COMMAND_LINE_SIZE bytes. Static buffer.
+const char *BuildCommandLine(int argc, const char *const *argv);
+
+// Puts quotes around an argument that holds a byte of 128 or more and no blank, as the tokenizer
+// would cut it there: with ' when it holds ".
+std::string Command_QuoteArgument(const char *argument);
+
+// Copies the next token to `out` (at most size - 1 bytes) and returns where the following one
+// starts, null when there was none. Blanks separate; a token may stand in quotes of either kind.
+// Bytes compare as signed, so an unquoted token ends at a byte of 128 or more; at such a byte the
+// token is empty and the pointer does not move.
+const char *NextToken(const char *text, char *out, size_t size);
+
+// The path that a file name on the command line means. 1 when it exists.
+int Command_ResolveName(const CommandState *state, const char *token, std::string *path);
+
+// Carries out one command line.
+CommandResult Command_Process(BibFileSet *set, CommandState *state, const char *commandLine);

@@ -1,0 +1,42 @@
+// store/BibFileSet.h - the open files of a run: find, lock, count, save all.
+// The set owns its records; a record that is listed twice is closed and freed once.
+#pragma once
+
+#include "store/BibStore.h"
+
+struct BibFileSet {
+    BibFile **files; // heap, `count` pointers, in the order of the command line
+    int count;
+    char *loadErrors; // heap: what could not be opened, for the messages window; null when nothing
+    // Shows a warning with an OK button and returns when it is closed. Null: only the log.
+    void (*box)(void *owner, const char *caption, const char *text);
+    void *boxOwner;
+};
+
+void FileSet_Append(BibFileSet *set, BibFile *file);
+void FileSet_AppendError(BibFileSet *set, const char *format, ...)
+    __attribute__((format(printf, 2, 3))); // to loadErrors
+void FileSet_Free(BibFileSet *set); // unlocks and frees every file; saves nothing
+
+int FileSet_EntryCount(const BibFileSet *set);    // of all files
+int FileSet_ModifiedCount(const BibFileSet *set); // files with unsaved changes
+
+// The first file, after `after`, that is at `path` ignoring case; -1 for none. Two paths that
+// differ in case and are two files on this system are different.
+int FileSet_Find(const BibFileSet *set, const char *path);
+
+// Opens the file at `path`, which may be changed by the system's separator rule: takes the lock
+// when the file is writable, loads it, appends it, and makes it read-only when it has errors.
+// Returns the number of errors to count; what went wrong is in loadErrors and in the log.
+int FileSet_Open(BibFileSet *set, const char *path);
+
+// Unlocks, writes and locks one file again. 1, or 0 when the write failed. A failed lock is
+// shown and logged, and leaves the file saved and unlocked.
+int FileSet_SaveOne(BibFileSet *set, BibFile *file);
+
+// Saves every modified file. -1 is never returned here: the question is the panel's.
+// 0 when nothing was modified or a write failed, 1 when all were saved.
+int FileSet_SaveAll(BibFileSet *set);
+
+// "There are modified Bib-files: ..." for the question before saving; malloc'd.
+char *FileSet_SaveQuestion(const BibFileSet *set);

@@ -1,0 +1,199 @@
+// store/BibStore.h - BIB files in memory: records, name tables, loading, saving.
+//
+// A BibFile owns its lists, every record in them and every string they point to;
+// records are malloc'd and freed one by one. All text is 8-bit, NUL-terminated, in
+// the selected code page (encoding/Encoding.h).
+//
+// A value is the concatenation of the pieces of a BibTeX value: a quoted or braced
+// string stands as its inner text, a number as its digits, and an abbreviation as
+// byte 0x02, its name, byte 0x05. So `{A} # jan # "B"` is A 02 j a n 05 B.
+//
+// Functions return 1 for success and 0 (or null) for failure, and log the reason
+// where it happens. Case is ignored for the ASCII letters only, under any locale.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>
+
+struct _ast; // one parsed item of the parser library
+
+enum {
+    BIB_TYPE_LIMIT = 128,      // slots of BibTypeTable
+    BIB_FIELD_LIMIT = 512,     // slots of BibFieldTable
+    BIB_FIXED_TYPES = 4,       // slots 0 to 3 of BibTypeTable never change
+    BIB_MESSAGES_SIZE = 8192,  // bytes of BibFile::messages
+    BIB_PREAMBLE_SIZE = 8192,  // bytes of BibFile::preamble
+    BIB_BACKUP_ATTEMPTS = 26,  // dated backup names tried per save
+    BIB_OPEN_ABBREVIATION = 2, // opens an abbreviation's name in a value
+    BIB_CLOSE_ABBREVIATION = 5 // closes it
+};
+
+struct BibField {
+    int32_t name;      // index into BibFieldTable
+    int32_t companion; // travels with the field; the store only copies it
+    char *value;       // heap, never null
+};
+
+struct BibEntry {
+    BibEntry *next;
+    int32_t type; // index into BibTypeTable
+    char *key;    // heap: the citation key
+    int32_t reserved;
+    int32_t fieldCount;
+    BibField fields[1]; // fieldCount slots, `crossref` first if there is one; a change of size
+                        // means a new block
+};
+
+struct BibString { // one abbreviation of an @STRING
+    BibString *next;
+    char *name;  // heap, as written in the file
+    char *value; // heap
+};
+
+struct BibComment { // one @COMMENT
+    BibComment *next;
+    char *text; // heap, without its delimiters
+};
+
+struct BibFile {
+    FILE *stream;       // null: no stream is kept open
+    int32_t lockHandle; // Sys_LockFile's handle, 0 when the file is not locked
+    int32_t inUse;      // the current command line names the file
+    char *path;         // heap, as passed to Bib_LoadFile
+    int32_t reserved;
+    int32_t readOnly;         // 0 when the file may be written
+    int32_t readOnlyByErrors; // 1 when it is read-only because it loaded with errors
+    int32_t modified;         // changes since the last save
+    int32_t backupDone;       // 1 once a save of this run has dealt with the backup
+    char *baseName;           // heap: no folder, nothing from the first '.' on
+    BibString *strings;       // the lists are in file order; new entries go to the head
+    BibEntry *entries;
+    BibComment *comments;
+    int32_t errorCount;
+    int32_t warningCount;
+    char *messages;                   // heap, BIB_MESSAGES_SIZE bytes; null without a message
+    char preamble[BIB_PREAMBLE_SIZE]; // each piece is followed by CR LF
+};
+
+// Process-wide name tables: shared by all files, they only grow.
+extern char *BibTypeTable[BIB_TYPE_LIMIT];
+extern int BibTypeCount;
+extern char *BibFieldTable[BIB_FIELD_LIMIT];
+extern int BibFieldCount;
+
+extern BibFile *BibCurrentFile; // receives the parser's messages
+
+// Settings.
+extern int BibBackupMode;    // below 0: none; 0, 1: "name.Backup"; 2 and more: dated (default 2)
+extern const int BibLockFiles;     // 0: streams are not kept open
+extern const int BibStringOptions; // 0: the parser leaves strings as they are
+
+// --- Tables and records (BibStore.cpp) ---
+
+// Sets up the parser library and the fixed types. Call once, before anything else.
+void Bib_Initialize();
+
+// The index of `name`, which is added when it is new; the first spelling stays.
+// Ends the process when the table is full: ask Bib_HasTypeRoom or Bib_HasFieldRoom first.
+int Bib_TypeIndex(const char *name); // null or "" gives 0, "** UNKNOWN **"
+int Bib_FieldIndex(const char *name);
+int Bib_HasTypeRoom(const char *name); // 1 when Bib_TypeIndex(name) will return
+int Bib_HasFieldRoom(const char *name);
+
+// A block with room for `fieldCount` fields, all zero but fieldCount. Null when memory is out.
+BibEntry *Bib_AllocEntry(int fieldCount);
+
+// A new entry at the head of `file`'s list. `fieldSpecs` is a list of NUL-terminated items, ended
+// by an empty one: "name=*..." names a mandatory field, "name=..." an optional one that is taken
+// when `allFields` is set; items that begin with '*' or have no '=' are skipped.
+BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName,
+                       const char *fieldSpecs, int allFields);
+
+// Frees the field values, the key and the block. Unlink the entry first.
+void Bib_FreeEntry(BibEntry *entry);
+
+// 1 when a field value of the entry contains `text`, ignoring case.
+int Bib_EntryContains(const BibEntry *entry, const char *text);
+
+// Heap memory that is never checked by callers of small pieces: on failure "Can't allocate N
+// bytes" goes to standard error and null comes back.
+void *Bib_Alloc(size_t size);
+char *Bib_CopyText(const char *text, size_t length); // adds the NUL
+
+// --- Loading (BibLoad.cpp, BibChild.cpp) ---
+
+// Reads one file. The parser runs in a child process, so that no input can harm this one: when the
+// child fails, what it had read is kept and the file counts an error. Logs and returns null when
+// the path cannot be opened or is no regular file. Takes no lock.
+BibFile *Bib_LoadFile(const char *path);
+
+// Frees the record with all it owns. Close `stream` and release `lockHandle` first.
+void Bib_FreeFile(BibFile *file);
+
+// One parsed item into `file`, in this process; they push at the head of the lists.
+// Return 1; Bib_AddEntryFromAst 0 for an entry without a key, which is skipped.
+int Bib_AddEntryFromAst(BibFile *file, struct _ast *ast);
+int Bib_AddStringsFromAst(BibFile *file, struct _ast *ast);
+int Bib_AddPreambleFromAst(BibFile *file, struct _ast *ast);
+int Bib_AddCommentFromAst(BibFile *file, struct _ast *ast);
+
+// 1 when the parser's messages reach this program instead of standard error. Without it broken
+// files would look clean and be overwritten, so the program must not go on after a 0.
+int Bib_SelfTest();
+
+// --- Messages (BibMessages.cpp) ---
+
+// Counts a message of the parser against BibCurrentFile, logs it and appends it to the file's
+// messages. Only `errorClass` (0 to 7), `line` and `message` are used.
+void Bib_ReportMessage(const char *className, int errorClass, const char *fileName, int line,
+                       const char *itemDescription, int itemNumber, const char *message);
+
+// --- Saving (BibSave.cpp) ---
+
+// Writes the file back; the first save of a run keeps the old contents under a backup name.
+// The path holds the complete old or the complete new contents at any time. Returns 1 and clears
+// `modified`, or logs the reason and returns 0 with the records unchanged. Release the lock
+// before, take it again after: the path is another file then.
+int Bib_SaveFile(BibFile *file);
+
+// Writes one value in BibTeX syntax; repairs unbalanced braces, with a warning in the log.
+void Bib_WriteValue(const char *value, FILE *stream);
+
+// The backup name for attempt n: the path and ".Backup" for n < 0, else with the local time and,
+// from n = 1 on, a letter from B to Z. The text stays until the next call.
+const char *Bib_BackupName(const BibFile *file, int n);
+
+// --- Checks (BibCheck.cpp) ---
+
+// Null when the value can be written as BibTeX, else a message (static text) that says why not.
+const char *Bib_CheckValue(const char *value);
+
+// Removes the characters that no key may hold, "\"#%'(),={} " , in place. Returns 1.
+int Bib_StripKeyChars(char *key);
+
+// --- Small system functions (Sys-posix.cpp) ---
+
+const char *Sys_LastErrorText();      // the system's text for the last error; static buffer
+char *Sys_ToBackslashes(char *path);  // every '/' becomes '\', in place; null stays null
+const char *Sys_ModulePath();         // full path of the executable, at most 260 characters
+
+// --- The layout that other code may rely on ---
+
+static_assert(sizeof(BibField) == 16 && offsetof(BibField, value) == 8);
+static_assert(offsetof(BibEntry, next) == 0 && offsetof(BibEntry, type) == 8 &&
+              offsetof(BibEntry, key) == 16 && offsetof(BibEntry, reserved) == 24 &&
+              offsetof(BibEntry, fieldCount) == 28 && offsetof(BibEntry, fields) == 32);
+static_assert(sizeof(BibEntry) == (1 + 2) * 16);
+static_assert(offsetof(BibString, next) < offsetof(BibString, name) &&
+              offsetof(BibString, name) < offsetof(BibString, value));
+static_assert(offsetof(BibComment, next) < offsetof(BibComment, text));
+static_assert(offsetof(BibFile, stream) == 0 && offsetof(BibFile, lockHandle) == 8 &&
+              offsetof(BibFile, inUse) == 12 && offsetof(BibFile, path) == 16 &&
+              offsetof(BibFile, reserved) == 24 && offsetof(BibFile, readOnly) == 28 &&
+              offsetof(BibFile, readOnlyByErrors) == 32 && offsetof(BibFile, modified) == 36 &&
+              offsetof(BibFile, backupDone) == 40 && offsetof(BibFile, baseName) == 48 &&
+              offsetof(BibFile, strings) == 56 && offsetof(BibFile, entries) == 64 &&
+              offsetof(BibFile, comments) == 72 && offsetof(BibFile, errorCount) == 80 &&
+              offsetof(BibFile, warningCount) == 84 && offsetof(BibFile, messages) == 88 &&
+              offsetof(BibFile, preamble) == 96);

@@ -1,0 +1,86 @@
+// store/Sys.h - what the program asks of the operating system.
+// Includes no system header; see Sys-posix.cpp. Sys_LastErrorText, Sys_ToBackslashes and
+// Sys_ModulePath are declared in BibStore.h.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>
+
+// --- Files ---
+
+int Sys_FileExists(const char *path);  // 1 also for folders and devices
+int Sys_WriteAccess(const char *path); // 0 when writable, else -1, as BibFile::readOnly wants it
+int Sys_SameFile(const char *a, const char *b); // 1 when both exist and are one file
+
+// Opens a regular file for reading; anything else (folder, device, pipe) fails without waiting.
+// Null on failure, with the reason in Sys_LastErrorText().
+FILE *Sys_OpenRegular(const char *path);
+
+// Reads the rest of a stream. A malloc'd buffer with one spare byte behind `*length` bytes, or
+// null when reading fails or memory is out.
+char *Sys_ReadAll(FILE *stream, size_t *length);
+
+// Opens `path` (created when missing) and shuts other writers out; readers stay welcome.
+// Returns a handle, never 0; on failure 0, with the reason in Sys_LastErrorText().
+int Sys_LockFile(const char *path);
+void Sys_UnlockFile(int handle); // 0 is ignored
+
+// Gives the file at `path` a second name; a symbolic link's target is what gets it. Fails when
+// `copy` exists or the folder cannot be written. On a file system without links the file is moved,
+// which Sys_TakeBackCopy undoes. Returns 1 or 0.
+int Sys_KeepCopy(const char *path, const char *copy);
+int Sys_TakeBackCopy(const char *path, const char *copy);
+
+int Sys_RemoveFile(const char *path); // 1 or 0
+
+// Replacing a file in one step: new contents go to a temporary file in the same folder, and
+// Sys_CommitReplace puts it in place of the path (of its target, when it is a symbolic link)
+// after it reached the disk, with the old file's mode and, where allowed, owner. Until then, and
+// when anything fails, the path is untouched.
+struct SysReplace {
+    FILE *stream;    // write here; ours
+    char *target;    // heap: the file that will be replaced
+    char *temporary; // heap
+};
+int Sys_StartReplace(SysReplace *replace, const char *path); // 0: nothing to clean up
+int Sys_CommitReplace(SysReplace *replace);                  // frees; 0: the path is untouched
+void Sys_CancelReplace(SysReplace *replace);                 // frees; removes the temporary file
+
+// --- Time and places ---
+
+int32_t Sys_Milliseconds();                    // a tick count for differences
+int Sys_CurrentFolder(char *buffer, size_t size); // 1, or 0 when it does not fit
+
+// --- A child process that works for this one ---
+
+struct SysChild {
+    int pid;
+    int pipe; // what the child writes
+};
+
+enum SysChildEnd {
+    SYS_CHILD_DONE,      // left with status 0
+    SYS_CHILD_LEFT,      // left with another status
+    SYS_CHILD_CRASHED,   // ended by a signal
+    SYS_CHILD_TIME_LIMIT // used up its CPU time
+};
+
+// Runs body(argument) in a copy of this process, with at most `cpuSeconds` of CPU time and no core
+// file. The child has the calling thread alone and leaves when body returns. 1, or 0 with the
+// reason in Sys_LastErrorText().
+int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds);
+
+// What the child wrote next: the count of bytes, 0 at the end, -1 when nothing came for `seconds`.
+long Sys_ReadChild(SysChild *child, void *buffer, size_t size, int seconds);
+
+// Ends the child if it still runs, and waits for it.
+SysChildEnd Sys_EndChild(SysChild *child);
+
+// In the child.
+int Sys_WriteParent(const void *data, size_t size);     // 1, or 0 when the parent is gone
+[[noreturn]] void Sys_LeaveChild(int status);           // at once: no exit handlers, no flushing
+void Sys_OnChildCrash(void (*handler)());               // runs on a stack of its own, then the child
+                                                        // ends as it would have
+FILE *Sys_OpenText(const char *text, size_t length);    // a stream over memory, for one thread
+void Sys_UsePlainLocale();                              // letters and cases are ASCII's
