@@ -85,9 +85,10 @@ extern int BibFieldCount;
 extern BibFile *BibCurrentFile; // receives the parser's messages
 
 // Settings.
-extern int BibBackupMode;    // below 0: none; 0, 1: "name.Backup"; 2 and more: dated (default 2)
-extern const int BibLockFiles;     // 0: streams are not kept open
+extern int BibBackupMode;      // below 0: none; 0, 1: "name.Backup"; 2 and more: dated (default 2)
+extern const int BibLockFiles; // 0: streams are not kept open
 extern const int BibStringOptions; // 0: the parser leaves strings as they are
+extern int BibLoadSeconds; // CPU time for a load, and 1 s more for each 4 MB; then it is stopped
 
 // --- Tables and records (BibStore.cpp) ---
 
@@ -107,8 +108,8 @@ BibEntry *Bib_AllocEntry(int fieldCount);
 // A new entry at the head of `file`'s list. `fieldSpecs` is a list of NUL-terminated items, ended
 // by an empty one: "name=*..." names a mandatory field, "name=..." an optional one that is taken
 // when `allFields` is set; items that begin with '*' or have no '=' are skipped.
-BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName,
-                       const char *fieldSpecs, int allFields);
+BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName, const char *fieldSpecs,
+                       int allFields);
 
 // Frees the field values, the key and the block. Unlink the entry first.
 void Bib_FreeEntry(BibEntry *entry);
@@ -174,9 +175,9 @@ int Bib_StripKeyChars(char *key);
 
 // --- Small system functions (Sys-posix.cpp) ---
 
-const char *Sys_LastErrorText();      // the system's text for the last error; static buffer
-char *Sys_ToBackslashes(char *path);  // every '/' becomes '\', in place; null stays null
-const char *Sys_ModulePath();         // full path of the executable, at most 260 characters
+const char *Sys_LastErrorText();     // the system's text for the last error; static buffer
+char *Sys_ToBackslashes(char *path); // every '/' becomes '\', in place; null stays null
+const char *Sys_ModulePath();        // full path of the executable, at most 260 characters
 
 // --- The layout that other code may rely on ---
 

@@ -49,14 +49,15 @@ void Sys_CancelReplace(SysReplace *replace);                 // frees; removes t
 
 // --- Time and places ---
 
-int32_t Sys_Milliseconds();                    // a tick count for differences
+int32_t Sys_Milliseconds();                       // a tick count for differences
 int Sys_CurrentFolder(char *buffer, size_t size); // 1, or 0 when it does not fit
 
 // --- A child process that works for this one ---
 
 struct SysChild {
     int pid;
-    int pipe; // what the child writes
+    int pipe;  // what the child writes
+    int ended; // the pipe's end was read: the child is leaving
 };
 
 enum SysChildEnd {
@@ -78,9 +79,9 @@ long Sys_ReadChild(SysChild *child, void *buffer, size_t size, int seconds);
 SysChildEnd Sys_EndChild(SysChild *child);
 
 // In the child.
-int Sys_WriteParent(const void *data, size_t size);     // 1, or 0 when the parent is gone
-[[noreturn]] void Sys_LeaveChild(int status);           // at once: no exit handlers, no flushing
-void Sys_OnChildCrash(void (*handler)());               // runs on a stack of its own, then the child
-                                                        // ends as it would have
-FILE *Sys_OpenText(const char *text, size_t length);    // a stream over memory, for one thread
-void Sys_UsePlainLocale();                              // letters and cases are ASCII's
+int Sys_WriteParent(const void *data, size_t size);  // 1, or 0 when the parent is gone
+[[noreturn]] void Sys_LeaveChild(int status);        // at once: no exit handlers, no flushing
+void Sys_OnChildCrash(void (*handler)());            // runs on a stack of its own, then the child
+                                                     // ends as it would have
+FILE *Sys_OpenText(const char *text, size_t length); // a stream over memory, for one thread
+void Sys_UsePlainLocale();                           // letters and cases are ASCII's

@@ -1,0 +1,393 @@
+// store/BibChild.cpp - the parser's side of loading: items from the parser, packed as bytes.
+//
+// The parser library ends or breaks its process on input that people really have, so it runs in a
+// child of the editor. Here are the functions of the library that this program replaces: they are
+// called through the dynamic symbol table, so they must be exported from the executable. They
+// stand in this object because every user of the loader links it.
+
+#include <cstdarg>
+#include <cstdlib>
+#include <cstring>
+
+#include <btparse.h>
+
+#include "store/BibItem.h"
+#include "store/BibStore.h"
+#include "store/Sys.h"
+
+extern "C" {
+// The lexer's state, exported by the library.
+extern int zzline;
+extern char *zzlextext;
+
+// The library's own, replaced below.
+void report_error(bt_errclass errclass, char *filename, int line, char *item_desc, int item,
+                  char *fmt, va_list arglist);
+void zzerrstd(const char *text);
+char *strlwr(char *text);
+
+void dump_ast(char *heading, AST *ast); // prints to standard output
+}
+
+enum {
+    FLUSH_SIZE = 64 * 1024,  // what a pipe holds
+    LEAVE_TREE_SIZE = 100000 // pieces; the library frees a tree by recursion along them
+};
+
+// --- Packing ---
+
+static void Reserve(BibItems *items, size_t size)
+{
+    if (items->length + size <= items->room)
+        return;
+    size_t room = 2 * (items->length + size);
+    char *bytes = static_cast<char *>(realloc(items->bytes, room));
+    if (!bytes)
+        abort(); // only the child works with large items; the parent reports its end
+    items->bytes = bytes;
+    items->room = room;
+}
+
+static void Append(BibItems *items, const void *bytes, size_t size)
+{
+    Reserve(items, size);
+    memcpy(items->bytes + items->length, bytes, size);
+    items->length += size;
+}
+
+static void BeginItem(BibItems *items, BibItemKind kind, int line, int number)
+{
+    BibItemHeader header = {0, kind, line, number};
+    Append(items, &header, sizeof header);
+}
+
+static void SetNumber(BibItems *items, int number)
+{
+    BibItemHeader header;
+    memcpy(&header, items->bytes + items->whole, sizeof header);
+    header.number = number;
+    memcpy(items->bytes + items->whole, &header, sizeof header);
+}
+
+static void EndItem(BibItems *items)
+{
+    uint32_t size = static_cast<uint32_t>(items->length - items->whole);
+    memcpy(items->bytes + items->whole, &size, sizeof size);
+    items->whole = items->length;
+}
+
+static size_t BeginText(BibItems *items)
+{
+    uint32_t length = 0;
+    Append(items, &length, sizeof length);
+    return items->length;
+}
+
+static void EndText(BibItems *items, size_t start)
+{
+    uint32_t length = static_cast<uint32_t>(items->length - start);
+    memcpy(items->bytes + start - sizeof length, &length, sizeof length);
+    Append(items, "", 1);
+}
+
+static void PackText(BibItems *items, const char *text)
+{
+    size_t start = BeginText(items);
+    if (text)
+        Append(items, text, strlen(text));
+    EndText(items, start);
+}
+
+// --- The parser's trees ---
+
+static void PackMessage(BibItems *items, int errorClass, int line, const char *message)
+{
+    BeginItem(items, BIB_ITEM_MESSAGE, line, errorClass);
+    PackText(items, message);
+    EndItem(items);
+}
+
+static size_t PackValue(BibItems *items, AST *field)
+{
+    size_t pieces = 0;
+    size_t start = BeginText(items);
+    bt_nodetype kind;
+    char *text;
+    for (AST *piece = bt_next_value(field, nullptr, &kind, &text); piece;
+         piece = bt_next_value(field, piece, &kind, &text)) {
+        ++pieces;
+        if (!text)
+            continue;
+        static const char open = BIB_OPEN_ABBREVIATION, close = BIB_CLOSE_ABBREVIATION;
+        if (kind == BTAST_MACRO)
+            Append(items, &open, 1);
+        Append(items, text, strlen(text));
+        if (kind == BTAST_MACRO)
+            Append(items, &close, 1);
+    }
+    EndText(items, start);
+    return pieces;
+}
+
+static size_t PackFields(BibItems *items, AST *ast)
+{
+    size_t pieces = 0;
+    int count = 0;
+    char *name;
+    for (AST *field = bt_next_field(ast, nullptr, &name); field;
+         field = bt_next_field(ast, field, &name)) {
+        PackText(items, name);
+        pieces += PackValue(items, field) + 1;
+        ++count;
+    }
+    SetNumber(items, count);
+    return pieces;
+}
+
+// The library's own way to a preamble's pieces aborts on everything but a string.
+static size_t PackPieces(BibItems *items, AST *ast)
+{
+    int count = 0;
+    for (AST *piece = ast->down; piece; piece = piece->right) {
+        if (!piece->text)
+            continue;
+        PackText(items, piece->text);
+        ++count;
+    }
+    SetNumber(items, count);
+    return static_cast<size_t>(count);
+}
+
+size_t BibItems_PackAst(BibItems *items, AST *ast)
+{
+    size_t pieces = 0;
+    switch (bt_entry_metatype(ast)) {
+    case BTE_REGULAR:
+        BeginItem(items, BIB_ITEM_ENTRY, ast->line, 0);
+        PackText(items, bt_entry_type(ast));
+        PackText(items, bt_entry_key(ast));
+        pieces = PackFields(items, ast);
+        break;
+    case BTE_MACRODEF:
+        BeginItem(items, BIB_ITEM_STRINGS, ast->line, 0);
+        pieces = PackFields(items, ast);
+        break;
+    case BTE_PREAMBLE:
+        BeginItem(items, BIB_ITEM_PREAMBLE, ast->line, 0);
+        PackText(items, bt_entry_type(ast));
+        pieces = PackPieces(items, ast);
+        break;
+    case BTE_COMMENT:
+        BeginItem(items, BIB_ITEM_COMMENT, ast->line, 0);
+        pieces = PackPieces(items, ast);
+        break;
+    default:
+        BeginItem(items, BIB_ITEM_STRANGE, ast->line, bt_entry_metatype(ast));
+        break;
+    }
+    EndItem(items);
+    return pieces;
+}
+
+void BibItems_Free(BibItems *items)
+{
+    free(items->bytes);
+    *items = {};
+}
+
+// --- The child ---
+
+static BibItems *Sending = nullptr; // what the child has not sent yet; null in the parent
+static int EndWasSent = 0;
+
+static void Send(BibItems *items)
+{
+    if (!Sys_WriteParent(items->bytes, items->whole))
+        Sys_LeaveChild(1); // nobody reads any more
+    items->length = items->whole = 0;
+}
+
+// Also called from the handler of a crash: no allocation, and only whole items.
+static void SendEnd(BibEnd end)
+{
+    BibItemHeader header = {sizeof header, BIB_ITEM_END, zzline, end};
+    EndWasSent = 1;
+    Sys_WriteParent(Sending->bytes, Sending->whole);
+    Sys_WriteParent(&header, sizeof header);
+}
+
+static void OnCrash()
+{
+    if (!EndWasSent)
+        SendEnd(BIB_END_CRASHED);
+}
+
+// The library ends the process by exit() when it gives up.
+static void OnExit()
+{
+    SendEnd(BIB_END_GAVE_UP);
+    Sys_LeaveChild(1);
+}
+
+[[noreturn]] static void Leave(BibEnd end)
+{
+    SendEnd(end);
+    Sys_LeaveChild(0);
+}
+
+static size_t RemoveMark(char *text, size_t length)
+{
+    static const char mark[] = "\xEF\xBB\xBF";
+    if (length < 3 || memcmp(text, mark, 3) != 0)
+        return length;
+    memmove(text, text + 3, length - 3);
+    return length - 3;
+}
+
+// CR LF and lone CR become LF, NUL a blank.
+static size_t PlainLines(char *text, size_t length)
+{
+    if (!memchr(text, '\r', length) && !memchr(text, 0, length))
+        return length;
+    size_t written = 0;
+    for (size_t read = 0; read < length; ++read) {
+        char c = text[read];
+        if (c == '\r' && read + 1 < length && text[read + 1] == '\n')
+            continue;
+        text[written++] = c == '\r' ? '\n' : c ? c : ' ';
+    }
+    return written;
+}
+
+// Prepares the text for the parser, in place: no byte order mark, plain line ends, and an end on
+// the last line too. `text` has a spare byte behind it.
+static size_t Normalise(char *text, size_t length)
+{
+    length = PlainLines(text, RemoveMark(text, length));
+    if (length > 0 && text[length - 1] != '\n')
+        text[length++] = '\n';
+    return length;
+}
+
+static int IsBlank(const char *text, size_t length)
+{
+    for (size_t i = 0; i < length; ++i)
+        if (!memchr(" \t\n\v\f", text[i], 5))
+            return 0;
+    return 1;
+}
+
+// Frees an item's tree, unless the library's recursion would use up the stack.
+static void FreeTree(AST *ast, size_t pieces)
+{
+    if (pieces < LEAVE_TREE_SIZE)
+        bt_free_ast(ast);
+}
+
+static void PrintTree(AST *ast)
+{
+    static char heading[] = "AST for whole entry:\n";
+    dump_ast(heading, ast);
+    fflush(stdout);
+}
+
+static BibEnd ParseAll(FILE *stream, const char *path)
+{
+    boolean status;
+    while (AST *ast = bt_parse_entry(stream, const_cast<char *>(path), BTO_NOSTORE, &status)) {
+        size_t pieces = BibItems_PackAst(Sending, ast);
+        bt_metatype metatype = bt_entry_metatype(ast);
+        if (metatype < BTE_REGULAR || metatype > BTE_MACRODEF)
+            PrintTree(ast);
+        FreeTree(ast, pieces);
+        if (Sending->whole >= FLUSH_SIZE)
+            Send(Sending);
+    }
+    return feof(stream) ? BIB_END_OF_FILE : BIB_END_EARLY;
+}
+
+void BibChild_Parse(void *argument)
+{
+    static BibItems items;
+    const BibParseJob *job = static_cast<const BibParseJob *>(argument);
+    Sending = &items;
+    Sys_OnChildCrash(OnCrash);
+    atexit(OnExit);
+
+    size_t length = 0;
+    char *text = job->text ? Bib_CopyText(job->text, length = strlen(job->text))
+                           : Sys_ReadAll(job->stream, &length);
+    if (!text)
+        Leave(BIB_END_UNREADABLE);
+    length = Normalise(text, length);
+    if (IsBlank(text, length))
+        Leave(BIB_END_OF_FILE);
+    FILE *stream = Sys_OpenText(text, length);
+    if (!stream)
+        Leave(BIB_END_UNREADABLE);
+    Sys_UsePlainLocale();
+    bt_set_stringopts(BTE_MACRODEF, BibStringOptions);
+    bt_set_stringopts(BTE_REGULAR, BibStringOptions);
+    bt_set_stringopts(BTE_COMMENT, BibStringOptions);
+    bt_set_stringopts(BTE_PREAMBLE, BibStringOptions);
+    Leave(ParseAll(stream, job->path));
+}
+
+// --- Functions of the library that are replaced ---
+
+static void Report(const char *className, int errorClass, const char *fileName, int line,
+                   const char *itemDescription, int itemNumber, const char *message)
+{
+    if (!Sending) {
+        Bib_ReportMessage(className, errorClass, fileName, line, itemDescription, itemNumber,
+                          message);
+        return;
+    }
+    // The library reports while an item is still being parsed, never while one is being packed.
+    PackMessage(Sending, errorClass, line, message);
+    if (errorClass >= BTERR_USAGEERR)
+        Send(Sending);
+}
+
+static const char *const ClassNames[] = {"notification", "warning",       "warning",
+                                         "warning",      "error",         "syntax error",
+                                         "fatal error",  "internal error"};
+
+// Syntax errors arrive with text of the file as their format, but for one.
+static void FormatMessage(char *message, size_t size, int errorClass, const char *format,
+                          va_list arguments)
+{
+    static const char fieldName[] = "invalid field name \"%s\"";
+    if (errorClass == BTERR_SYNTAX && strncmp(format, fieldName, sizeof fieldName - 1) != 0)
+        snprintf(message, size, "%s", format);
+    else
+        vsnprintf(message, size, format, arguments);
+}
+
+#define REPLACES_LIBRARY extern "C" __attribute__((visibility("default"), used))
+
+REPLACES_LIBRARY void report_error(bt_errclass errclass, char *filename, int line, char *item_desc,
+                                   int item, char *fmt, va_list arglist)
+{
+    char message[1024];
+    FormatMessage(message, sizeof message, errclass, fmt, arglist);
+    Report(ClassNames[errclass], errclass, filename, line, item_desc, item, message);
+    if (errclass == BTERR_USAGEERR)
+        exit(1);
+    if (errclass == BTERR_INTERNAL)
+        abort();
+}
+
+// A character that begins no token; the library would print a line and drop it.
+REPLACES_LIBRARY void zzerrstd(const char *)
+{
+    char message[1024];
+    snprintf(message, sizeof message, "invalid token (text was \"%s\")", zzlextext);
+    Report("error", BTERR_LEXERR, nullptr, zzline, nullptr, -1, message);
+}
+
+// The library would turn types, field names and names of abbreviations to lower case.
+REPLACES_LIBRARY char *strlwr(char *text)
+{
+    return text;
+}

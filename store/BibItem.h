@@ -1,0 +1,70 @@
+// store/BibItem.h - parsed items as bytes: what the loading child sends to the editor's process.
+//
+// A stream of items, each a BibItemHeader and its texts one after the other. A text is its length
+// (32 bits), its bytes, and a NUL. Private to BibLoad.cpp and BibChild.cpp.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>
+
+#include "store/BibStore.h"
+
+enum BibItemKind {
+    BIB_ITEM_MESSAGE,  // number: the error class; the message
+    BIB_ITEM_ENTRY,    // number: the fields; type, key, then a name and a value for each
+    BIB_ITEM_STRINGS,  // number: the abbreviations; a name and a value for each
+    BIB_ITEM_PREAMBLE, // number: the pieces; the type, then each piece
+    BIB_ITEM_COMMENT,  // number: the pieces; each piece
+    BIB_ITEM_STRANGE,  // number: 0 when the parser did not know the kind; no text
+    BIB_ITEM_END       // number: a BibEnd; no text
+};
+
+enum BibEnd {
+    BIB_END_OF_FILE,
+    BIB_END_EARLY,     // the parser found no further item before the end of the file
+    BIB_END_GAVE_UP,   // the parser ended its process
+    BIB_END_CRASHED,   // by a signal
+    BIB_END_UNREADABLE // the file could not be read
+};
+
+struct BibItemHeader {
+    uint32_t size; // of the whole item
+    int32_t kind;
+    int32_t line; // where the item begins, or the parser's line of a message
+    int32_t number;
+};
+
+// A growing heap buffer of items.
+struct BibItems {
+    char *bytes;
+    size_t length; // all of it
+    size_t whole;  // up to the end of the last finished item
+    size_t room;
+};
+
+// --- BibChild.cpp ---
+
+// One parsed item at the end of `items`. Returns the number of value pieces in it.
+size_t BibItems_PackAst(BibItems *items, struct _ast *ast);
+void BibItems_Free(BibItems *items);
+
+// The body of the loading child. Parses `text`, or the stream when there is none.
+struct BibParseJob {
+    FILE *stream;
+    const char *text;
+    const char *path; // for the parser's own use
+};
+void BibChild_Parse(void *job);
+
+// --- BibLoad.cpp ---
+
+enum BibStored {
+    BIB_STORED,
+    BIB_SKIPPED, // an entry without a key
+    BIB_NO_TYPE, // the table of entry types is full; nothing was stored
+    BIB_NO_FIELD // the table of field names is full; nothing was stored
+};
+
+// Builds the records of one whole item and pushes them at the head of the file's lists.
+BibStored BibItem_Store(BibFile *file, const char *item);

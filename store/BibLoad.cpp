@@ -1,0 +1,440 @@
+// store/BibLoad.cpp - loading a BIB file: records from the items that the child sends.
+
+#include "store/BibItem.h"
+#include "store/BibStore.h"
+
+#include <cstdlib>
+#include <cstring>
+#include <string>
+#include <utility>
+
+#include <btparse.h>
+
+#include "app/Log.h"
+#include "store/Ascii.h"
+#include "store/Sys.h"
+
+int BibLoadSeconds = 10;
+
+// --- Items to records ---
+
+// Reads the texts of one item, one after the other.
+struct ItemReader {
+    BibItemHeader header;
+    const char *next;
+};
+
+static ItemReader OpenItem(const char *item)
+{
+    ItemReader reader;
+    memcpy(&reader.header, item, sizeof reader.header);
+    reader.next = item + sizeof reader.header;
+    return reader;
+}
+
+static const char *NextText(ItemReader *reader, uint32_t *length)
+{
+    memcpy(length, reader->next, sizeof *length);
+    const char *text = reader->next + sizeof *length;
+    reader->next = text + *length + 1;
+    return text;
+}
+
+static const char *NextText(ItemReader *reader)
+{
+    uint32_t length;
+    return NextText(reader, &length);
+}
+
+static char *CopyNextText(ItemReader *reader)
+{
+    uint32_t length;
+    const char *text = NextText(reader, &length);
+    return Bib_CopyText(text, length);
+}
+
+// The last `crossref` moves to the front, so that an editor finds it there.
+static void MoveCrossrefToFront(BibEntry *entry, int crossref)
+{
+    int k = entry->fieldCount - 1;
+    while (k > 0 && entry->fields[k].name != crossref)
+        --k;
+    if (k <= 0)
+        return;
+    BibField moved = entry->fields[k];
+    memmove(entry->fields + 1, entry->fields, static_cast<size_t>(k) * sizeof moved);
+    entry->fields[0] = moved;
+}
+
+static BibStored CheckRoom(ItemReader reader, const char *typeName)
+{
+    if (!Bib_HasFieldRoom("crossref"))
+        return BIB_NO_FIELD;
+    if (!Bib_HasTypeRoom(typeName))
+        return BIB_NO_TYPE;
+    for (int i = 0; i < reader.header.number; ++i) {
+        const char *name = NextText(&reader);
+        NextText(&reader);
+        if (!Bib_HasFieldRoom(name))
+            return BIB_NO_FIELD;
+        Bib_FieldIndex(name);
+    }
+    return BIB_STORED;
+}
+
+static BibStored StoreEntry(BibFile *file, ItemReader reader)
+{
+    const char *typeName = NextText(&reader);
+    uint32_t keyLength;
+    const char *key = NextText(&reader, &keyLength);
+    if (keyLength == 0) {
+        AppLog("ERROR: ", "invalid entry will be just skipped.");
+        return BIB_SKIPPED;
+    }
+    BibStored room = CheckRoom(reader, typeName);
+    if (room != BIB_STORED)
+        return room;
+
+    int crossref = Bib_FieldIndex("crossref");
+    BibEntry *entry = Bib_AllocEntry(reader.header.number);
+    if (!entry)
+        return BIB_SKIPPED;
+    entry->type = Bib_TypeIndex(typeName);
+    entry->key = Bib_CopyText(key, keyLength);
+    for (int i = 0; i < entry->fieldCount; ++i) {
+        entry->fields[i].name = Bib_FieldIndex(NextText(&reader));
+        entry->fields[i].value = CopyNextText(&reader);
+    }
+    MoveCrossrefToFront(entry, crossref);
+    entry->next = file->entries;
+    file->entries = entry;
+    return BIB_STORED;
+}
+
+static void StoreStrings(BibFile *file, ItemReader reader)
+{
+    for (int i = 0; i < reader.header.number; ++i) {
+        BibString *string = static_cast<BibString *>(Bib_Alloc(sizeof *string));
+        if (!string)
+            return;
+        string->name = CopyNextText(&reader);
+        string->value = CopyNextText(&reader);
+        string->next = file->strings;
+        file->strings = string;
+    }
+}
+
+static void StorePreamble(BibFile *file, ItemReader reader)
+{
+    AppLog("Preamble: ", NextText(&reader));
+    for (int i = 0; i < reader.header.number; ++i) {
+        uint32_t length;
+        const char *piece = NextText(&reader, &length);
+        size_t used = strlen(file->preamble);
+        if (used + length + 2 >= BIB_PREAMBLE_SIZE) {
+            AppLog("ERROR: Preamble too long in ", file->path);
+            AppLog("ERROR: call Quarlo Technical support to solve the problem");
+            continue;
+        }
+        memcpy(file->preamble + used, piece, length);
+        memcpy(file->preamble + used + length, "\r\n", 3);
+    }
+}
+
+static void StoreComments(BibFile *file, ItemReader reader)
+{
+    for (int i = 0; i < reader.header.number; ++i) {
+        BibComment *comment = static_cast<BibComment *>(Bib_Alloc(sizeof *comment));
+        if (!comment)
+            return;
+        comment->text = CopyNextText(&reader);
+        AppLog("Comment: ", comment->text);
+        comment->next = file->comments;
+        file->comments = comment;
+    }
+}
+
+BibStored BibItem_Store(BibFile *file, const char *item)
+{
+    ItemReader reader = OpenItem(item);
+    switch (reader.header.kind) {
+    case BIB_ITEM_ENTRY:
+        return StoreEntry(file, reader);
+    case BIB_ITEM_STRINGS:
+        StoreStrings(file, reader);
+        break;
+    case BIB_ITEM_PREAMBLE:
+        StorePreamble(file, reader);
+        break;
+    case BIB_ITEM_COMMENT:
+        StoreComments(file, reader);
+        break;
+    case BIB_ITEM_STRANGE:
+        AppLog("ERROR: ", reader.header.number == BTE_UNKNOWN
+                              ? "There is unknown entry in BIB-file"
+                              : "There is strange entry in BIB-file");
+        break;
+    case BIB_ITEM_MESSAGE:
+        Bib_ReportMessage(nullptr, reader.header.number, file->path, reader.header.line, nullptr,
+                          -1, NextText(&reader));
+        break;
+    }
+    return BIB_STORED;
+}
+
+// --- Items from the child ---
+
+// How far a load has come, and what ended it.
+struct Load {
+    BibFile *file;
+    int line;          // of the last item or message
+    int fatal;         // the parser reported the reason for its end itself
+    int end;           // BibEnd, or -1 as long as the child has said nothing
+    BibStored refused; // a full name table ended the load
+};
+
+static int IsFatalMessage(const BibItemHeader *header)
+{
+    return header->kind == BIB_ITEM_MESSAGE && header->number >= BTERR_USAGEERR;
+}
+
+// 1 to go on, 0 when the load ends here.
+static int TakeItem(Load *load, const char *item)
+{
+    BibItemHeader header;
+    memcpy(&header, item, sizeof header);
+    if (header.line > 0)
+        load->line = header.line;
+    if (header.kind == BIB_ITEM_END) {
+        load->end = header.number;
+        return 0;
+    }
+    load->fatal |= IsFatalMessage(&header);
+    BibCurrentFile = load->file;
+    load->refused = BibItem_Store(load->file, item);
+    return load->refused == BIB_STORED || load->refused == BIB_SKIPPED;
+}
+
+// Takes the whole items in `buffer` and returns how many bytes they were; -1 when the load ends.
+static long TakeItems(Load *load, const char *buffer, size_t length)
+{
+    size_t taken = 0;
+    BibItemHeader header;
+    while (length - taken >= sizeof header) {
+        memcpy(&header, buffer + taken, sizeof header);
+        if (header.size > length - taken)
+            break;
+        if (!TakeItem(load, buffer + taken))
+            return -1;
+        taken += header.size;
+    }
+    return static_cast<long>(taken);
+}
+
+// 1 when all went well up to the child's end, 0 when it went silent.
+static int ReceiveItems(Load *load, SysChild *child, int seconds)
+{
+    std::string buffer(256 * 1024, 0);
+    size_t used = 0;
+    for (;;) {
+        if (used == buffer.size())
+            buffer.resize(2 * used);
+        long got = Sys_ReadChild(child, &buffer[used], buffer.size() - used, seconds);
+        if (got <= 0)
+            return got == 0;
+        used += static_cast<size_t>(got);
+        long taken = TakeItems(load, buffer.data(), used);
+        if (taken < 0)
+            return 1;
+        used -= static_cast<size_t>(taken);
+        memmove(&buffer[0], &buffer[static_cast<size_t>(taken)], used);
+    }
+}
+
+// Why the file did not load to its end, in plain words; null when it did or the parser said so.
+static const char *ReasonOfEnd(const Load *load, SysChildEnd end, int answered)
+{
+    if (load->refused == BIB_NO_TYPE)
+        return "the table of entry types is full (128 types in all open files); this entry and "
+               "what follows it were not loaded";
+    if (load->refused == BIB_NO_FIELD)
+        return "the table of field names is full (512 names in all open files); this entry and "
+               "what follows it were not loaded";
+    if (load->fatal || load->end == BIB_END_OF_FILE)
+        return nullptr;
+    if (end == SYS_CHILD_TIME_LIMIT || !answered)
+        return "reading the file took too long and was stopped; what follows this line was not "
+               "loaded";
+    if (load->end == BIB_END_UNREADABLE)
+        return "the file could not be read";
+    if (load->end == BIB_END_GAVE_UP)
+        return "the parser gave up, most likely because an item has too many fields (98 or more); "
+               "this item and what follows it were not loaded";
+    if (load->end == BIB_END_EARLY && load->file->errorCount > 0)
+        return nullptr;
+    return "the parser failed; this item and what follows it were not loaded";
+}
+
+static int SecondsFor(FILE *stream)
+{
+    fseek(stream, 0, SEEK_END);
+    long size = ftell(stream);
+    rewind(stream);
+    return BibLoadSeconds + static_cast<int>(size / (4 * 1024 * 1024));
+}
+
+static void Report(BibFile *file, int line, const char *message)
+{
+    BibCurrentFile = file;
+    Bib_ReportMessage(nullptr, BTERR_INTERNAL, file->path, line, nullptr, -1, message);
+}
+
+// The child may be silent for longer than it computes, on a slow disk.
+static void LoadItems(BibFile *file)
+{
+    int seconds = SecondsFor(file->stream);
+    BibParseJob job = {file->stream, nullptr, file->path};
+    SysChild child;
+    if (!Sys_StartChild(&child, BibChild_Parse, &job, seconds)) {
+        Report(file, 0, Sys_LastErrorText());
+        return;
+    }
+    Load load = {file, 0, 0, -1, BIB_STORED};
+    int answered = ReceiveItems(&load, &child, 2 * seconds + 30);
+    SysChildEnd end = Sys_EndChild(&child);
+    const char *reason = ReasonOfEnd(&load, end, answered);
+    if (reason)
+        Report(file, load.line, reason);
+}
+
+// --- Files ---
+
+static char *BaseName(const char *path)
+{
+    const char *name = path;
+    for (char separator : {'\\', '/'}) {
+        const char *last = strrchr(name, separator);
+        if (last)
+            name = last + 1;
+    }
+    return Bib_CopyText(name, strcspn(name, "."));
+}
+
+static BibFile *NewFile(const char *path, FILE *stream)
+{
+    BibFile *file = static_cast<BibFile *>(Bib_Alloc(sizeof *file));
+    if (!file)
+        return nullptr;
+    memset(static_cast<void *>(file), 0, sizeof *file);
+    file->stream = stream;
+    file->path = Bib_CopyText(path, strlen(path));
+    file->baseName = BaseName(path);
+    file->readOnly = Sys_WriteAccess(path);
+    return file;
+}
+
+template <class Record> static void Reverse(Record **list)
+{
+    Record *reversed = nullptr;
+    while (Record *record = *list) {
+        *list = record->next;
+        record->next = reversed;
+        reversed = record;
+    }
+    *list = reversed;
+}
+
+BibFile *Bib_LoadFile(const char *path)
+{
+    FILE *stream = Sys_OpenRegular(path);
+    if (!stream) {
+        AppLog("ERROR: Can't open file: ", path);
+        return nullptr;
+    }
+    BibFile *file = NewFile(path, stream);
+    if (!file) {
+        fclose(stream);
+        return nullptr;
+    }
+    BibCurrentFile = file;
+    LoadItems(file);
+    BibCurrentFile = file;
+    fclose(file->stream);
+    file->stream = nullptr;
+    Reverse(&file->strings);
+    Reverse(&file->entries);
+    Reverse(&file->comments);
+    return file;
+}
+
+void Bib_FreeFile(BibFile *file)
+{
+    if (BibCurrentFile == file)
+        BibCurrentFile = nullptr;
+    free(file->messages);
+    while (BibEntry *entry = file->entries) {
+        file->entries = entry->next;
+        Bib_FreeEntry(entry);
+    }
+    while (BibString *string = file->strings) {
+        file->strings = string->next;
+        free(string->value);
+        free(string->name);
+        free(string);
+    }
+    while (BibComment *comment = file->comments) {
+        file->comments = comment->next;
+        free(comment->text);
+        free(comment);
+    }
+    free(file->baseName);
+    free(file->path);
+    free(file);
+}
+
+// --- In this process ---
+
+static int StoreAst(BibFile *file, AST *ast)
+{
+    BibItems items = {};
+    BibItems_PackAst(&items, ast);
+    BibStored stored = BibItem_Store(file, items.bytes);
+    BibItems_Free(&items);
+    if (stored == BIB_NO_TYPE || stored == BIB_NO_FIELD)
+        AppLog("ERROR: ", "no room for the names of an entry, which is skipped.");
+    return stored == BIB_STORED;
+}
+
+int Bib_AddEntryFromAst(BibFile *file, AST *ast)
+{
+    return StoreAst(file, ast);
+}
+
+int Bib_AddStringsFromAst(BibFile *file, AST *ast)
+{
+    return StoreAst(file, ast);
+}
+
+int Bib_AddPreambleFromAst(BibFile *file, AST *ast)
+{
+    return StoreAst(file, ast);
+}
+
+int Bib_AddCommentFromAst(BibFile *file, AST *ast)
+{
+    return StoreAst(file, ast);
+}
+
+// The child parses a text that must give a message, in the way it parses files.
+int Bib_SelfTest()
+{
+    BibParseJob job = {nullptr, "@misc{key, field = }\n", "self-test"};
+    SysChild child;
+    if (!Sys_StartChild(&child, BibChild_Parse, &job, BibLoadSeconds))
+        return 0;
+    BibItemHeader first = {};
+    int found = Sys_ReadChild(&child, &first, sizeof first, BibLoadSeconds) == sizeof first &&
+                first.kind == BIB_ITEM_MESSAGE;
+    Sys_EndChild(&child);
+    return found;
+}

@@ -1,0 +1,178 @@
+// store/SysChild-posix.cpp - child processes that work for this one, for POSIX systems.
+
+#include "store/Sys.h"
+
+#include <cerrno>
+#include <clocale>
+#include <csignal>
+#include <cstdlib>
+
+#include <fcntl.h>
+#include <locale.h>
+#include <poll.h>
+#include <stdio_ext.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+// The child's side; unused in the parent.
+static int ToParent = -1;
+static void (*CrashHandler)() = nullptr;
+static volatile sig_atomic_t Writing = 0;
+static volatile sig_atomic_t TimeIsUp = 0;
+
+static const int CrashSignals[] = {SIGABRT, SIGBUS, SIGFPE, SIGILL, SIGSEGV, SIGSYS, SIGXCPU};
+
+// The hard limit, at which the system ends the child without a word, leaves time for the handler.
+static void LimitResources(int cpuSeconds)
+{
+    struct rlimit cpu = {static_cast<rlim_t>(cpuSeconds), static_cast<rlim_t>(cpuSeconds) + 5};
+    struct rlimit core = {0, 0};
+    setrlimit(RLIMIT_CPU, &cpu);
+    setrlimit(RLIMIT_CORE, &core);
+}
+
+// What the parser prints when it gives up would only confuse: the parent tells the user.
+static void SilenceErrors()
+{
+    int null = open("/dev/null", O_WRONLY | O_CLOEXEC);
+    if (null >= 0)
+        dup2(null, STDERR_FILENO);
+}
+
+int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds)
+{
+    int ends[2];
+    if (pipe2(ends, O_CLOEXEC) != 0)
+        return 0;
+    fflush(nullptr); // else the child would hold, and perhaps write, unwritten lines of ours
+    pid_t pid = fork();
+    if (pid < 0) {
+        int reason = errno;
+        close(ends[0]);
+        close(ends[1]);
+        errno = reason;
+        return 0;
+    }
+    if (pid == 0) {
+        close(ends[0]);
+        ToParent = ends[1];
+        signal(SIGPIPE, SIG_IGN);
+        SilenceErrors();
+        LimitResources(cpuSeconds);
+        body(argument);
+        Sys_LeaveChild(0);
+    }
+    close(ends[1]);
+    child->pid = pid;
+    child->pipe = ends[0];
+    child->ended = 0;
+    return 1;
+}
+
+long Sys_ReadChild(SysChild *child, void *buffer, size_t size, int seconds)
+{
+    struct pollfd wait = {child->pipe, POLLIN, 0};
+    int ready;
+    do {
+        ready = poll(&wait, 1, seconds * 1000);
+    } while (ready < 0 && errno == EINTR);
+    if (ready <= 0)
+        return -1;
+    ssize_t got;
+    do {
+        got = read(child->pipe, buffer, size);
+    } while (got < 0 && errno == EINTR);
+    child->ended = got == 0;
+    return got;
+}
+
+SysChildEnd Sys_EndChild(SysChild *child)
+{
+    int status = 0;
+    close(child->pipe);
+    if (!child->ended)
+        kill(child->pid, SIGKILL);
+    pid_t reaped;
+    do {
+        reaped = waitpid(child->pid, &status, 0);
+    } while (reaped < 0 && errno == EINTR);
+    if (reaped < 0)
+        return SYS_CHILD_CRASHED;
+    if (WIFSIGNALED(status))
+        return WTERMSIG(status) == SIGXCPU ? SYS_CHILD_TIME_LIMIT : SYS_CHILD_CRASHED;
+    return WEXITSTATUS(status) == 0 ? SYS_CHILD_DONE : SYS_CHILD_LEFT;
+}
+
+// The time limit may strike in the middle of a write, when nobody knows what the parent has got
+// already: then the signal waits for the end of that write.
+int Sys_WriteParent(const void *data, size_t size)
+{
+    const char *next = static_cast<const char *>(data);
+    Writing = 1;
+    while (size > 0) {
+        ssize_t written = write(ToParent, next, size);
+        if (written < 0 && errno == EINTR)
+            continue;
+        if (written < 0)
+            break;
+        next += written;
+        size -= static_cast<size_t>(written);
+    }
+    Writing = 0;
+    if (TimeIsUp) {
+        TimeIsUp = 0;
+        raise(SIGXCPU);
+    }
+    return size == 0;
+}
+
+void Sys_LeaveChild(int status)
+{
+    _exit(status);
+}
+
+static void OnCrashSignal(int number)
+{
+    if (number == SIGXCPU && Writing) {
+        TimeIsUp = 1;
+        return;
+    }
+    signal(number, SIG_DFL);
+    CrashHandler();
+    raise(number);
+}
+
+void Sys_OnChildCrash(void (*handler)())
+{
+    static const size_t size = 64 * 1024;
+    CrashHandler = handler;
+    stack_t stack = {};
+    stack.ss_sp = malloc(size); // for the life of the child
+    stack.ss_size = size;
+    if (stack.ss_sp)
+        sigaltstack(&stack, nullptr);
+    for (int number : CrashSignals) {
+        struct sigaction action = {};
+        action.sa_handler = OnCrashSignal;
+        action.sa_flags = SA_ONSTACK | SA_NODEFER;
+        sigaction(number, &action, nullptr);
+    }
+}
+
+FILE *Sys_OpenText(const char *text, size_t length)
+{
+    FILE *stream = fmemopen(const_cast<char *>(text), length, "r");
+    if (!stream)
+        return nullptr;
+    setvbuf(stream, nullptr, _IOFBF, 64 * 1024);
+    __fsetlocking(stream, FSETLOCKING_BYCALLER); // one thread only: halves the time of getc
+    return stream;
+}
+
+void Sys_UsePlainLocale()
+{
+    locale_t plain = newlocale(LC_ALL_MASK, "C", nullptr);
+    if (plain)
+        uselocale(plain);
+}
