@@ -1,0 +1,185 @@
+// ui/EntryIndex.cpp - the rows of the entry list and the search while typing.
+#include "ui/EntryIndex.h"
+
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+
+#include "encoding/Encoding.h"
+#include "store/Ascii.h"
+
+// --- Rows ---
+
+static size_t CountEntries(BibFile *const *files, int fileCount)
+{
+    size_t count = 0;
+    for (int i = 0; i < fileCount; ++i)
+        for (const BibEntry *entry = files[i]->entries; entry != nullptr; entry = entry->next)
+            ++count;
+    return count;
+}
+
+static const char *SortKey(const char *key)
+{
+    return *key == '\\' || *key == '{' ? key + 1 : key;
+}
+
+int EntryIndex_CompareKeys(const char *a, const char *b)
+{
+    return Ascii_Compare(SortKey(a), SortKey(b));
+}
+
+static int CompareItems(const void *a, const void *b)
+{
+    return EntryIndex_CompareKeys(static_cast<const IndexItem *>(a)->entry->key,
+                                  static_cast<const IndexItem *>(b)->entry->key);
+}
+
+static bool Passes(const BibEntry *entry, const char *filter)
+{
+    return filter == nullptr || *filter == 0 || Bib_EntryContains(entry, filter);
+}
+
+int EntryIndex_Build(IndexItem **index, BibFile *const *files, int fileCount, const char *filter)
+{
+    size_t room = CountEntries(files, fileCount);
+    *index = static_cast<IndexItem *>(Bib_Alloc((room > 0 ? room : 1) * sizeof(IndexItem)));
+    if (*index == nullptr)
+        return 0;
+    int count = 0;
+    for (int i = 0; i < fileCount; ++i)
+        for (BibEntry *entry = files[i]->entries; entry != nullptr; entry = entry->next)
+            if (Passes(entry, filter))
+                (*index)[count++] = {entry, i};
+    qsort(*index, count, sizeof(IndexItem), CompareItems);
+    return count;
+}
+
+int EntryIndex_Find(const IndexItem *index, int count, const BibEntry *entry)
+{
+    for (int row = 0; row < count; ++row)
+        if (index[row].entry == entry)
+            return row;
+    return -1;
+}
+
+int EntryIndex_RowToSelect(const IndexItem *index, int count, const BibEntry *select)
+{
+    if (count <= 0)
+        return -1;
+    int row = select == nullptr ? -1 : EntryIndex_Find(index, count, select);
+    return row < 0 ? 0 : row;
+}
+
+// --- Row texts ---
+
+// What stands in the parentheses: the file's name, or its number, which is written to `number`.
+static const char *FileLabel(const IndexItem *item, BibFile *const *files, int fileCount,
+                             char (&number)[16])
+{
+    if (files != nullptr && item->file >= 0 && item->file < fileCount)
+        return files[item->file]->baseName;
+    snprintf(number, sizeof number, "%d", item->file);
+    return number;
+}
+
+std::string EntryIndex_RowText(const IndexItem *item, BibFile *const *files, int fileCount)
+{
+    char number[16];
+    std::string text = item->entry->key;
+    text += " (";
+    text += FileLabel(item, files, fileCount, number);
+    text += ")";
+    return text;
+}
+
+// Steps `*rest` over what it has in common with `piece`. False when they differ before either ends.
+static bool Accept(const char **rest, const char *piece)
+{
+    for (; **rest != 0 && *piece != 0; ++*rest, ++piece)
+        if (Ascii_Lower(**rest) != Ascii_Lower(*piece))
+            return false;
+    return true;
+}
+
+// Whether the row's text begins with `prefix`. Works on the pieces of the text, because one key
+// stroke may ask this of every row.
+static bool RowBeginsWith(const IndexItem *item, BibFile *const *files, int fileCount,
+                          const char *prefix)
+{
+    const char *rest = prefix;
+    if (!Accept(&rest, item->entry->key))
+        return false;
+    if (*rest == 0)
+        return true;
+    char number[16];
+    return Accept(&rest, " (") && Accept(&rest, FileLabel(item, files, fileCount, number)) &&
+           Accept(&rest, ")") && *rest == 0;
+}
+
+// --- Type-ahead ---
+
+static void StartOver(TypeAhead *state)
+{
+    state->prefix[0] = 0;
+    state->lastFound = -1;
+}
+
+// Whether a key carries on the search that the prefix stands for.
+static bool Continues(const TypeAhead *state, uint32_t key, bool modified, int32_t now,
+                      int selection)
+{
+    uint32_t passed = static_cast<uint32_t>(now) - static_cast<uint32_t>(state->lastKeyTime);
+    return key != 0 && !modified && static_cast<int32_t>(passed) <= TYPE_AHEAD_PAUSE &&
+           selection == state->lastFound;
+}
+
+// The character's byte in the selected code page; 0 when it has none.
+static char StoreByte(uint32_t key)
+{
+    if (key < 0x80)
+        return static_cast<char>(key);
+    const wchar_t text[] = {static_cast<wchar_t>(key), 0};
+    char bytes[2];
+    Enc_FromUnicode(bytes, text);
+    // Byte 0xFF also stands for "not in the code page".
+    if (static_cast<unsigned char>(bytes[0]) == 0xFF && Enc_Current()->map[0xFF] != key)
+        return 0;
+    return bytes[0];
+}
+
+static int FindByPrefix(const char *prefix, const IndexItem *index, int count,
+                        BibFile *const *files, int fileCount)
+{
+    for (int row = 0; row < count; ++row)
+        if (RowBeginsWith(&index[row], files, fileCount, prefix))
+            return row;
+    return -1;
+}
+
+TypeAheadVerdict TypeAhead_Key(TypeAhead *state, uint32_t key, bool modified, int32_t now,
+                               int selection, const IndexItem *index, int count,
+                               BibFile *const *files, int fileCount)
+{
+    if (state->prefix[0] != 0 && !Continues(state, key, modified, now, selection))
+        StartOver(state);
+    if (key == 0 || modified)
+        return TYPE_AHEAD_SKIP;
+    if (strlen(state->prefix) >= TYPE_AHEAD_LIMIT)
+        StartOver(state);
+    state->lastKeyTime = now;
+
+    char byte = StoreByte(key);
+    if (byte == 0)
+        return TYPE_AHEAD_NO_ROW;
+    size_t length = strlen(state->prefix);
+    state->prefix[length] = byte;
+    state->prefix[length + 1] = 0;
+    int row = FindByPrefix(state->prefix, index, count, files, fileCount);
+    if (row < 0) {
+        state->prefix[length] = 0;
+        return TYPE_AHEAD_NO_ROW;
+    }
+    state->lastFound = row;
+    return TYPE_AHEAD_ROW;
+}
