@@ -1,0 +1,410 @@
+#include "tests/support/LogCapture.h"
+
+#include <algorithm>
+#include <fstream>
+#include <vector>
+
+#include "encoding/Encoding.h"
+
+namespace
+{
+
+std::wstring ToUnicode(const std::string &text)
+{
+    std::wstring out = L"what was there before";
+    EXPECT_EQ(&out, &Enc_ToUnicode(out, text.c_str()));
+    return out;
+}
+
+// With a buffer of exactly the size that is asked for.
+std::string FromUnicode(const std::wstring &text)
+{
+    std::vector<char> buffer(text.size() + 1, '#');
+    EXPECT_EQ(buffer.data(), Enc_FromUnicode(buffer.data(), text.c_str()));
+    return buffer.data();
+}
+
+const EncodingRecord *Row(const std::string &name)
+{
+    const EncodingRecord *row = EncodingTable;
+    while (row->name && name != row->name)
+        ++row;
+    return row;
+}
+
+bool IsPrivateUse(uint32_t codePoint)
+{
+    return codePoint >= 0xE000 && codePoint <= 0xF8FF;
+}
+
+// See scripts/make_codepage_digests.py.
+std::string CanonicalText(const uint32_t *map)
+{
+    std::string text;
+    for (unsigned byte = 0; byte < 256; ++byte) {
+        char line[32];
+        if (IsPrivateUse(map[byte]))
+            snprintf(line, sizeof line, "%02X private\n", byte);
+        else
+            snprintf(line, sizeof line, "%02X %04X\n", byte, map[byte]);
+        text += line;
+    }
+    return text;
+}
+
+uint64_t Fnv1a64(const std::string &text)
+{
+    uint64_t digest = 0xCBF29CE484222325;
+    for (unsigned char byte : text)
+        digest = (digest ^ byte) * 0x100000001B3;
+    return digest;
+}
+
+// The byte that a code point must be stored as, by the plain search.
+int ByteFor(const uint32_t *map, uint32_t codePoint)
+{
+    if (codePoint == 0xAB)
+        return 0x02;
+    if (codePoint == 0xBB)
+        return 0x05;
+    for (int byte = 0; byte <= 254; ++byte) {
+        if (map[byte] == codePoint)
+            return byte;
+    }
+    return 255;
+}
+
+std::string OneByte(int byte)
+{
+    return std::string(1, static_cast<char>(byte));
+}
+
+const char *const NAMES[][2] = {
+    {"CP1250", "ANSI - Central European"},
+    {"CP1251", "ANSI - Cyrillic"},
+    {"CP1252", "ANSI - Latin I"},
+    {"CP1253", "ANSI - Greek"},
+    {"CP1254", "ANSI - Turkish"},
+    {"CP1255", "ANSI - Hebrew"},
+    {"CP1256", "ANSI - Arabic"},
+    {"CP1257", "ANSI - Baltic"},
+    {"CP1258", "ANSI - Vietnamese"},
+    {"CP437", "OEM - United States"},
+    {"CP737", "OEM - Greek (formerly 437G)"},
+    {"CP775", "OEM - Baltic"},
+    {"CP850", "OEM - Multilingual Latin I"},
+    {"CP852", "OEM - Latin II"},
+    {"CP855", "OEM - Cyrillic (primarily Russian)"},
+    {"CP857", "OEM - Turkish"},
+    {"CP860", "OEM - Portuguese"},
+    {"CP861", "OEM - Icelandic"},
+    {"CP862", "OEM - Hebrew"},
+    {"CP863", "OEM - Canadian-French"},
+    {"CP864", "OEM - Arabic"},
+    {"CP865", "OEM - Nordic"},
+    {"CP866", "OEM - Russian"},
+    {"CP869", "OEM - Modern Greek"},
+    {"CP708", "Arabic - ASMO 708"},
+    {"CP720", "Arabic - Transparent ASMO"},
+    {"CP28591", "ISO 8859-1 Latin I"},
+    {"CP28592", "ISO 8859-2 Central Europe"},
+    {"CP28594", "ISO 8859-4 Baltic"},
+    {"CP28595", "ISO 8859-5 Cyrillic"},
+    {"CP28596", "ISO 8859-6 Arabic"},
+    {"CP28597", "ISO 8859-7 Greek"},
+    {"CP28598", "ISO 8859-8 Hebrew"},
+    {"CP28599", "ISO 8859-9 Latin 5"},
+    {"CP28605", "ISO 8859-15 Latin 9, Thai"},
+    {"CP38598", "ISO 8859-8 Hebrew"},
+    {"CP10000", "MAC - Roman"},
+    {"CP10004", "MAC - Arabic"},
+    {"CP10005", "MAC - Hebrew"},
+    {"CP10006", "MAC - Greek I"},
+    {"CP10007", "MAC - Cyrillic"},
+    {"CP10010", "MAC - Romania"},
+    {"CP10017", "MAC - Ukraine"},
+    {"CP10021", "MAC - Thai"},
+    {"CP10029", "MAC - Latin II"},
+    {"CP10079", "MAC - Icelandic"},
+    {"CP10081", "MAC - Turkish"},
+    {"CP10082", "MAC - Croatia"},
+    {"CP20127", "US-ASCII (7-bit)"},
+    {"CP20866", "Russian - KOI8-R"},
+    {"CP21866", "Ukrainian (KOI8-U)"},
+};
+
+} // namespace
+
+TEST(EncodingTable, ListsTheCodePagesInOrder)
+{
+    const EncodingRecord *row = EncodingTable;
+    for (const auto &names : NAMES) {
+        ASSERT_TRUE(row->name) << "no row for " << names[0];
+        EXPECT_STREQ(names[0], row->name);
+        EXPECT_STREQ(names[1], row->displayName);
+        ++row;
+    }
+    EXPECT_EQ(nullptr, row->name);
+    EXPECT_EQ(51, row - EncodingTable);
+}
+
+TEST(EncodingTable, AgreesWithASecondSource)
+{
+    std::ifstream digests(TEST_DATA "/codepages.fnv1a64");
+    std::string name;
+    uint64_t digest;
+    int count = 0;
+    for (const EncodingRecord *row = EncodingTable; row->name; ++row, ++count) {
+        ASSERT_TRUE(digests >> name >> std::hex >> digest) << "no digest for " << row->name;
+        EXPECT_EQ(name, row->name);
+        EXPECT_EQ(digest, Fnv1a64(CanonicalText(row->map))) << row->name;
+    }
+    EXPECT_EQ(51, count);
+    EXPECT_FALSE(digests >> name) << "no row for " << name;
+}
+
+TEST(EncodingTable, MapsUndefinedBytesToThemselves)
+{
+    for (int byte : {0x81, 0x8D, 0x8F, 0x90, 0x9D})
+        EXPECT_EQ(uint32_t(byte), Row("CP1252")->map[byte]);
+    for (int byte : {0x7F, 0x90, 0x9F, 0xFC, 0xFD, 0xFE, 0xFF})
+        EXPECT_EQ(uint32_t(byte), Row("CP10021")->map[byte]);
+}
+
+TEST(EncodingTable, HasTheVariantsOfTheSystem)
+{
+    for (int byte = 0; byte < 256; ++byte)
+        EXPECT_EQ(uint32_t(byte & 0x7F), Row("CP20127")->map[byte]);
+    EXPECT_EQ(0x2126u, Row("CP10000")->map[0xBD]);
+    EXPECT_EQ(0x045Eu, Row("CP21866")->map[0xAE]);
+    EXPECT_EQ(0x040Eu, Row("CP21866")->map[0xBE]);
+}
+
+TEST(EncodingTable, KnowsWellKnownLetters)
+{
+    EXPECT_EQ(0x20ACu, Row("CP1252")->map[0x80]);
+    EXPECT_EQ(0x0416u, Row("CP1251")->map[0xC6]);
+    EXPECT_EQ(0x00E4u, Row("CP437")->map[0x84]);
+    EXPECT_EQ(0x20ACu, Row("CP28605")->map[0xA4]);
+    EXPECT_EQ(0x0416u, Row("CP20866")->map[0xF6]);
+}
+
+TEST(EncodingTable, HasOneMapForBothHebrewOrders)
+{
+    for (int byte = 0; byte < 256; ++byte)
+        EXPECT_EQ(Row("CP28598")->map[byte], Row("CP38598")->map[byte]);
+}
+
+TEST(EncodingTable, KeepsTheAsciiBytes)
+{
+    for (const EncodingRecord *row = EncodingTable; row->name; ++row) {
+        for (uint32_t byte = 0; byte < 0x80; ++byte)
+            EXPECT_EQ(byte, row->map[byte]) << row->name;
+    }
+}
+
+TEST(EncSelect, IsNotNeededForCP1252)
+{
+    EXPECT_STREQ("CP1252", Enc_Current()->name);
+}
+
+TEST(EncSelect, ComesAfterAConversionToo)
+{
+    EXPECT_EQ("\x80", FromUnicode(L"\u20AC")); // before anything was selected
+    Enc_Select("CP28605");
+    EXPECT_EQ("\xA4", FromUnicode(L"\u20AC"));
+}
+
+TEST(EncSelect, FindsEveryRow)
+{
+    for (const EncodingRecord *row = EncodingTable; row->name; ++row) {
+        Enc_Select(row->name);
+        EXPECT_EQ(row, Enc_Current());
+    }
+}
+
+TEST(EncSelect, IgnoresLetterCase)
+{
+    Enc_Select("cp1251");
+    EXPECT_STREQ("CP1251", Enc_Current()->name);
+    Enc_Select("cP437");
+    EXPECT_STREQ("CP437", Enc_Current()->name);
+}
+
+TEST(EncSelect, KeepsTheCodePageOnAnUnknownName)
+{
+    Enc_Select("CP1251");
+    for (const char *name : {"UTF-8", "", "CP125", "CP12510", "1252", " CP1252"}) {
+        Enc_Select(name);
+        EXPECT_STREQ("CP1251", Enc_Current()->name) << name;
+        EXPECT_EQ(L"\u0416", ToUnicode("\xC6"));
+        EXPECT_EQ("\xC6", FromUnicode(L"\u0416"));
+    }
+}
+
+TEST(EncSelect, LogsTheNameThatWasAskedFor)
+{
+    EXPECT_EQ("Cartulo: INFO: Selecting Encoding: cp1251\n",
+              LogOf("1", [] { Enc_Select("cp1251"); }));
+    EXPECT_EQ("", LogOf("2", [] { Enc_Select("cp1251"); }));
+}
+
+TEST(EncSelect, LogsAnUnknownNameAsAnError)
+{
+    EXPECT_EQ("Cartulo: ERROR: Can't select unknown encoding: UTF-8\n",
+              LogOf("4", [] { Enc_Select("UTF-8"); }));
+}
+
+TEST(EncSelect, ForgetsTheCodePageBefore)
+{
+    Enc_Select("CP1251");
+    EXPECT_EQ("\xC6", FromUnicode(L"\u0416"));
+    Enc_Select("CP1252");
+    EXPECT_EQ("\xFF", FromUnicode(L"\u0416"));
+    EXPECT_EQ(L"\u00C6", ToUnicode("\xC6"));
+}
+
+TEST(EncToUnicode, ShowsAbbreviationMarksAsGuillemets)
+{
+    Enc_Select("CP1252");
+    EXPECT_EQ(L"1\u00ABjan\u00BB\u00E4", ToUnicode("1\x02jan\x05\xE4"));
+}
+
+TEST(EncToUnicode, ShowsMarksInEveryCodePage)
+{
+    for (const EncodingRecord *row = EncodingTable; row->name; ++row) {
+        Enc_Select(row->name);
+        EXPECT_EQ(L"\u00AB\u00BB", ToUnicode("\x02\x05")) << row->name;
+    }
+}
+
+TEST(EncToUnicode, GivesTheCodePointOfEveryByte)
+{
+    for (const EncodingRecord *row = EncodingTable; row->name; ++row) {
+        Enc_Select(row->name);
+        for (int byte = 1; byte < 256; ++byte) {
+            wchar_t expected = byte == 2 ? 0xAB : byte == 5 ? 0xBB : wchar_t(row->map[byte]);
+            EXPECT_EQ(std::wstring(1, expected), ToUnicode(OneByte(byte))) << row->name << byte;
+        }
+    }
+}
+
+TEST(EncToUnicode, KeepsAByteThatMeansU0000)
+{
+    Enc_Select("CP20127");
+    EXPECT_EQ(std::wstring(L"a\0b", 3), ToUnicode("a\x80"
+                                                  "b"));
+}
+
+TEST(EncToUnicode, GivesNothingForAnEmptyText)
+{
+    EXPECT_EQ(L"", ToUnicode(""));
+}
+
+TEST(EncFromUnicode, StoresGuillemetsAsAbbreviationMarks)
+{
+    Enc_Select("CP1252");
+    EXPECT_EQ("1\x02jan\x05\xE4", FromUnicode(L"1\u00ABjan\u00BB\u00E4"));
+}
+
+TEST(EncFromUnicode, TurnsALiteralGuillemetIntoAMark)
+{
+    Enc_Select("CP1252");
+    EXPECT_EQ(L"\u00AB", ToUnicode("\xAB"));
+    EXPECT_EQ("\x02", FromUnicode(ToUnicode("\xAB")));
+    EXPECT_EQ("\x05", FromUnicode(ToUnicode("\xBB")));
+}
+
+TEST(EncFromUnicode, StoresWhatTheCodePageLacksAsByteFF)
+{
+    Enc_Select("CP1252");
+    EXPECT_EQ("a\xFF"
+              "b",
+              FromUnicode(L"a\u0416b"));
+    EXPECT_EQ("\xFF\xFF\xFF", FromUnicode(L"\uFFFD\U0001F600\U0010FFFF"));
+    const wchar_t noCharacters[] = {wchar_t(0xD800), wchar_t(0x110000), wchar_t(-1), 0};
+    EXPECT_EQ("\xFF\xFF\xFF", FromUnicode(noCharacters));
+}
+
+TEST(EncFromUnicode, StoresTheCharacterOfByteFF)
+{
+    Enc_Select("CP1252");
+    EXPECT_EQ("\xFF", FromUnicode(L"\u00FF"));
+}
+
+TEST(EncFromUnicode, TakesTheSmallestOfSeveralBytes)
+{
+    Enc_Select("CP20127");
+    EXPECT_EQ("A\x7F", FromUnicode(L"A\u007F")); // 41 and C1; 7F and FF
+    EXPECT_EQ("\x02", FromUnicode(L"\u0002"));
+}
+
+TEST(EncFromUnicode, DoesNotConfuseACodePointWithItsLowByte)
+{
+    Enc_Select("CP1252");
+    EXPECT_EQ("\xFF\xFF", FromUnicode(L"\u0141\U00010041"));
+}
+
+TEST(EncFromUnicode, FindsTheByteOfThePlainSearch)
+{
+    for (const EncodingRecord *row = EncodingTable; row->name; ++row) {
+        Enc_Select(row->name);
+        std::wstring text;
+        std::string expected;
+        for (const EncodingRecord *other = EncodingTable; other->name; ++other) {
+            for (int byte = 1; byte < 256; ++byte) {
+                if (other->map[byte] == 0)
+                    continue;
+                text += wchar_t(other->map[byte]);
+                expected += OneByte(ByteFor(row->map, other->map[byte]));
+            }
+        }
+        EXPECT_EQ(expected, FromUnicode(text)) << row->name;
+    }
+}
+
+TEST(EncFromUnicode, GivesBackEveryByteThatIsAloneWithItsMeaning)
+{
+    int bytes = 0;
+    for (const EncodingRecord *row = EncodingTable; row->name; ++row) {
+        Enc_Select(row->name);
+        for (int byte = 1; byte < 256; ++byte) {
+            uint32_t codePoint = row->map[byte];
+            bool alone = std::count(row->map, row->map + 256, codePoint) == 1;
+            if (!alone || codePoint == 0xAB || codePoint == 0xBB)
+                continue;
+            ++bytes;
+            EXPECT_EQ(OneByte(byte), FromUnicode(ToUnicode(OneByte(byte)))) << row->name << byte;
+        }
+    }
+    EXPECT_GT(bytes, 50 * 200);
+}
+
+TEST(EncFromUnicode, LogsTheTextAndTheResult)
+{
+    // Display text as UTF-8, store text as it is.
+    EXPECT_EQ("Cartulo: strconv in: a\u00E4\u00AB\u20AC\U0001F600\n"
+              "Cartulo: strconv out: a\xE4\x02\x80\xFF\n",
+              LogOf("1", [] { FromUnicode(L"a\u00E4\u00AB\u20AC\U0001F600"); }));
+    EXPECT_EQ("", LogOf("2", [] { FromUnicode(L"a"); }));
+}
+
+TEST(EncFromUnicode, LogsWhatIsNoCharacterAsTheReplacementCharacter)
+{
+    const wchar_t text[] = {wchar_t(0xD800), wchar_t(0xDFFF), wchar_t(0x110000), 0};
+    EXPECT_EQ("Cartulo: strconv in: \uFFFD\uFFFD\uFFFD\nCartulo: strconv out: \xFF\xFF\xFF\n",
+              LogOf("1", [&] { FromUnicode(text); }));
+}
+
+TEST(EncFromUnicode, LogsTheStartOfALongText)
+{
+    std::wstring text(100000, L'x');
+    EXPECT_EQ("Cartulo: strconv in: " + std::string(499, 'x') +
+                  "\nCartulo: strconv out: " + std::string(498, 'x') + "\n",
+              LogOf("1", [&] { EXPECT_EQ(text.size(), FromUnicode(text).size()); }));
+}
+
+TEST(EncToUnicode, LogsNothing)
+{
+    EXPECT_EQ("", LogOf("1", [] { ToUnicode("a\x81\xFF"); }));
+}
