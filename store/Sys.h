@@ -24,13 +24,13 @@ char *Sys_ReadAll(FILE *stream, size_t *length);
 // Opens `path` (created when missing) and shuts other writers out; readers stay welcome.
 // Returns a handle, never 0; on failure 0, with the reason in Sys_LastErrorText().
 int Sys_LockFile(const char *path);
-void Sys_UnlockFile(int handle); // 0 is ignored
+void Sys_UnlockFile(int handle);        // 0 is ignored
+int Sys_IsLockedHere(const char *path); // 1 when this process holds the lock of that file
 
-// Gives the file at `path` a second name; a symbolic link's target is what gets it. Fails when
-// `copy` exists or the folder cannot be written. On a file system without links the file is moved,
-// which Sys_TakeBackCopy undoes. Returns 1 or 0.
+// Keeps the contents of `path`, which will be replaced, under a second name: by a link, or by a
+// copy where the file system has no links or `copy` is on another one. Of a symbolic link the
+// target is kept. Never replaces anything: fails when `copy` exists. 1 or 0.
 int Sys_KeepCopy(const char *path, const char *copy);
-int Sys_TakeBackCopy(const char *path, const char *copy);
 
 int Sys_RemoveFile(const char *path); // 1 or 0
 
