@@ -1,0 +1,360 @@
+// store/BibSave.cpp - writing a BIB file back, with a backup of what it held before.
+
+#include "store/BibStore.h"
+
+#include <cstdlib>
+#include <cstring>
+#include <ctime>
+
+#include "app/Log.h"
+#include "store/Sys.h"
+
+// --- Values ---
+
+// Gathers small pieces, since a call of the stream for each would take most of a save's time.
+// Write errors stay with the stream.
+struct Output {
+    FILE *stream;
+    size_t used;
+    char block[64 * 1024];
+};
+
+static void Flush(Output *out)
+{
+    fwrite(out->block, 1, out->used, out->stream);
+    out->used = 0;
+}
+
+static void Put(Output *out, const char *text, size_t length)
+{
+    if (length > sizeof out->block - out->used)
+        Flush(out);
+    if (length > sizeof out->block) {
+        fwrite(text, 1, length, out->stream);
+        return;
+    }
+    memcpy(out->block + out->used, text, length);
+    out->used += length;
+}
+
+static void Put(Output *out, const char *text)
+{
+    Put(out, text, strlen(text));
+}
+
+struct ValueState {
+    int inRun;       // between the braces that we put around text
+    long depth;      // braces of the text that are open in the run
+    long macroDepth; // below 0 after a closing mark too many: what follows is written bare
+    int notFirst;
+};
+
+static void CloseRun(Output *out, ValueState *state)
+{
+    if (!state->inRun)
+        return;
+    if (state->depth > 0)
+        AppLog("WARNING: ", "unclosed braces in saved string, close them");
+    for (; state->depth > 0; --state->depth)
+        Put(out, "}", 1);
+    Put(out, "}", 1);
+    state->inRun = 0;
+}
+
+static void JoinPiece(Output *out, ValueState *state)
+{
+    if (state->notFirst)
+        Put(out, " # ", 3);
+    state->notFirst = 1;
+}
+
+static void OpenMacro(Output *out, ValueState *state, const char *value)
+{
+    if (state->macroDepth > 0)
+        AppLog("ERROR: Recursive Abbreviation: ", value);
+    ++state->macroDepth;
+    CloseRun(out, state);
+    JoinPiece(out, state);
+}
+
+static void PutBrace(Output *out, ValueState *state, char brace)
+{
+    if (state->inRun && brace == '{')
+        ++state->depth;
+    else if (state->inRun && state->depth > 0)
+        --state->depth;
+    else if (state->inRun) {
+        AppLog("WARNING: ", "not opened extra braces, prepended by brace.");
+        Put(out, "{", 1);
+    }
+    Put(out, &brace, 1);
+}
+
+// Bytes up to the next brace or mark.
+static size_t PlainLength(const char *text)
+{
+    size_t length = 0;
+    for (;; ++length) {
+        unsigned char c = static_cast<unsigned char>(text[length]);
+        if (c == '{' || c == '}' || c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION ||
+            c == 0)
+            return length;
+    }
+}
+
+// Writes one brace or a stretch of plain text; returns what follows.
+static const char *PutText(Output *out, ValueState *state, const char *text)
+{
+    if (state->macroDepth == 0 && !state->inRun) {
+        JoinPiece(out, state);
+        Put(out, "{", 1);
+        state->inRun = 1;
+    }
+    state->notFirst = 1;
+    size_t length = PlainLength(text);
+    if (length > 0) {
+        Put(out, text, length);
+        return text + length;
+    }
+    PutBrace(out, state, *text);
+    return text + 1;
+}
+
+static void PutValue(Output *out, const char *value)
+{
+    size_t digits = strspn(value, "0123456789");
+    if (value[digits] == 0) {
+        Put(out, digits ? value : "{}");
+        return;
+    }
+    ValueState state = {};
+    for (const char *at = value; *at;) {
+        if (*at == BIB_OPEN_ABBREVIATION) {
+            OpenMacro(out, &state, value);
+            ++at;
+        } else if (*at == BIB_CLOSE_ABBREVIATION) {
+            --state.macroDepth;
+            ++at;
+        } else {
+            at = PutText(out, &state, at);
+        }
+    }
+    CloseRun(out, &state);
+}
+
+void Bib_WriteValue(const char *value, FILE *stream)
+{
+    Output out;
+    out.stream = stream;
+    out.used = 0;
+    PutValue(&out, value);
+    Flush(&out);
+}
+
+// --- The file's text ---
+
+static void PutComments(Output *out, const BibComment *comment)
+{
+    if (!comment)
+        return;
+    for (; comment; comment = comment->next) {
+        Put(out, "@COMMENT{");
+        Put(out, comment->text);
+        Put(out, "}\n");
+    }
+    Put(out, "\n");
+}
+
+// A piece per line. The last one has no line end when it was edited by hand.
+static void PutPreamble(Output *out, const char *preamble)
+{
+    if (!*preamble)
+        return;
+    Put(out, "@PREAMBLE{");
+    for (const char *at = preamble; *at;) {
+        char line[BIB_PREAMBLE_SIZE];
+        size_t length = strcspn(at, "\r");
+        memcpy(line, at, length);
+        line[length] = 0;
+        if (at != preamble)
+            Put(out, "\n\t# ");
+        PutValue(out, line);
+        at += length;
+        if (*at == '\r')
+            at += at[1] == '\n' ? 2 : 1;
+    }
+    Put(out, " }\n\n");
+}
+
+static void PutStrings(Output *out, const BibString *string)
+{
+    if (!string)
+        return;
+    for (; string; string = string->next) {
+        Put(out, "@STRING{");
+        Put(out, string->name);
+        Put(out, " = ");
+        PutValue(out, string->value);
+        Put(out, "}\n");
+    }
+    Put(out, "\n");
+}
+
+static void PutEntry(Output *out, const BibEntry *entry)
+{
+    Put(out, "@");
+    Put(out, BibTypeTable[entry->type]);
+    Put(out, "{");
+    Put(out, entry->key);
+    for (int i = 0; i < entry->fieldCount; ++i) {
+        Put(out, ",\n\t");
+        Put(out, BibFieldTable[entry->fields[i].name]);
+        Put(out, " = ");
+        PutValue(out, entry->fields[i].value);
+    }
+    Put(out, "\n}\n");
+}
+
+static void WriteContents(const BibFile *file, FILE *stream)
+{
+    Output out;
+    out.stream = stream;
+    out.used = 0;
+    PutComments(&out, file->comments);
+    PutPreamble(&out, file->preamble);
+    PutStrings(&out, file->strings);
+    for (const BibEntry *entry = file->entries; entry; entry = entry->next)
+        PutEntry(&out, entry);
+    Flush(&out);
+}
+
+// --- The backup ---
+//
+// It is made before the new contents are written, so that a folder that takes no backup is reported
+// as such, and it is undone when the save fails. It leaves the path as it is: the old contents only
+// get a second name.
+
+// What a save did to keep the old contents.
+struct Backup {
+    char *name;  // heap; null when no backup is wanted
+    int made;    // `name` holds the old contents
+    char *older; // heap: where an earlier file of that name waits until the save is done, or null
+};
+
+const char *Bib_BackupName(const BibFile *file, int n)
+{
+    static char *name = nullptr;
+    const size_t suffixSize = 80; // enough for any numbers in the date
+    size_t size = strlen(file->path) + suffixSize;
+    char *larger = static_cast<char *>(realloc(name, size));
+    if (!larger)
+        return "";
+    name = larger;
+    if (n < 0) {
+        snprintf(name, size, "%s.Backup", file->path);
+        return name;
+    }
+    const char letter[] = {n > 0 ? static_cast<char>('A' + n % 26) : '\0', '\0'};
+    time_t now = time(nullptr);
+    const struct tm *local = localtime(&now);
+    snprintf(name, size, "%s.Backup-%4d%02d%02d-%02d%02d%02d%s", file->path, local->tm_year + 1900,
+             local->tm_mon + 1, local->tm_mday, local->tm_hour, local->tm_min, local->tm_sec,
+             letter);
+    return name;
+}
+
+static char *CopyName(const char *name)
+{
+    return Bib_CopyText(name, strlen(name));
+}
+
+// The first dated name that is free. When none is, the last one: keeping a copy there fails.
+static char *FreeDatedName(const BibFile *file)
+{
+    const char *name = Bib_BackupName(file, 0);
+    for (int n = 1; n < BIB_BACKUP_ATTEMPTS && Sys_FileExists(name); ++n)
+        name = Bib_BackupName(file, n);
+    return CopyName(name);
+}
+
+// Frees the name ".Backup". What it held gets a dated name for the time being, where there is one
+// to have, so that a save that fails later does not cost the user the earlier backup.
+static int MakeRoom(const BibFile *file, Backup *backup)
+{
+    if (!Sys_FileExists(backup->name))
+        return 1;
+    char *older = FreeDatedName(file);
+    if (Sys_KeepCopy(backup->name, older))
+        backup->older = older;
+    else
+        free(older);
+    if (Sys_RemoveFile(backup->name))
+        return 1;
+    AppLog("ERROR: Can't remove backup file: ", backup->name);
+    return 0;
+}
+
+// 1 when the path may be replaced.
+static int MakeBackup(const BibFile *file, Backup *backup)
+{
+    if (file->backupDone || BibBackupMode < 0 || !Sys_FileExists(file->path))
+        return 1;
+    bool dated = BibBackupMode >= 2;
+    backup->name = dated ? FreeDatedName(file) : CopyName(Bib_BackupName(file, -1));
+    if (!dated && !MakeRoom(file, backup))
+        return 0;
+    backup->made = Sys_KeepCopy(file->path, backup->name);
+    if (!backup->made)
+        AppLog("ERROR: Can't rename to BAK-file the Bib-file: ", file->path);
+    return backup->made;
+}
+
+static void UndoBackup(const Backup *backup)
+{
+    if (backup->made)
+        Sys_RemoveFile(backup->name);
+    if (!backup->older)
+        return;
+    if (Sys_FileExists(backup->name) || Sys_KeepCopy(backup->older, backup->name))
+        Sys_RemoveFile(backup->older);
+}
+
+static void SettleBackup(Backup *backup, int saved)
+{
+    if (!saved)
+        UndoBackup(backup);
+    else if (backup->older)
+        Sys_RemoveFile(backup->older);
+    free(backup->name);
+    free(backup->older);
+}
+
+// --- Saving ---
+
+static int ReplaceContents(const BibFile *file)
+{
+    SysReplace replace;
+    if (Sys_StartReplace(&replace, file->path)) {
+        WriteContents(file, replace.stream);
+        if (Sys_CommitReplace(&replace))
+            return 1;
+    }
+    AppLog("ERROR: Can't open file: ", file->path);
+    return 0;
+}
+
+int Bib_SaveFile(BibFile *file)
+{
+    if (file->readOnly) {
+        AppLog("ERROR: ReadOnly Bib-file: ", file->path);
+        return 0;
+    }
+    Backup backup = {};
+    int saved = MakeBackup(file, &backup) && ReplaceContents(file);
+    SettleBackup(&backup, saved);
+    if (!saved)
+        return 0;
+    file->backupDone = 1;
+    file->modified = 0;
+    return 1;
+}
