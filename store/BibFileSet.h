@@ -18,16 +18,17 @@ void FileSet_AppendError(BibFileSet *set, const char *format, ...)
     __attribute__((format(printf, 2, 3))); // to loadErrors
 void FileSet_Free(BibFileSet *set); // unlocks and frees every file; saves nothing
 
-int FileSet_EntryCount(const BibFileSet *set);    // of all files
+int FileSet_EntryCount(const BibFileSet *set);    // as many as the list has rows
 int FileSet_ModifiedCount(const BibFileSet *set); // files with unsaved changes
 
-// The first file, after `after`, that is at `path` ignoring case; -1 for none. Two paths that
-// differ in case and are two files on this system are different.
+// The index of the first file that is at `path` ignoring case; -1 for none. Two paths that differ
+// in case and are two files on this system are different.
 int FileSet_Find(const BibFileSet *set, const char *path);
 
-// Opens the file at `path`, which may be changed by the system's separator rule: takes the lock
-// when the file is writable, loads it, appends it, and makes it read-only when it has errors.
-// Returns the number of errors to count; what went wrong is in loadErrors and in the log.
+// Opens the file at `path`: takes the lock when the file is writable, loads it, appends it, and
+// makes it read-only when it has errors. A file that this process holds locked already is loaded
+// as a read-only second record, without a word. Returns the number of errors to count; what went
+// wrong is in loadErrors, in the file's messages and in the log.
 int FileSet_Open(BibFileSet *set, const char *path);
 
 // Unlocks, writes and locks one file again. 1, or 0 when the write failed. A failed lock is

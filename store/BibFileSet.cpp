@@ -1,0 +1,206 @@
+// store/BibFileSet.cpp - the open files of a run.
+
+#include "store/BibFileSet.h"
+
+#include <cstdarg>
+#include <cstdlib>
+#include <cstring>
+#include <string>
+
+#include "app/Log.h"
+#include "store/Ascii.h"
+#include "store/Sys.h"
+
+// --- The set ---
+
+void FileSet_Append(BibFileSet *set, BibFile *file)
+{
+    size_t size = (static_cast<size_t>(set->count) + 1) * sizeof *set->files;
+    BibFile **files = static_cast<BibFile **>(realloc(set->files, size));
+    if (!files) {
+        fprintf(stderr, "Can't allocate %d bytes\n", static_cast<int>(size));
+        exit(1);
+    }
+    set->files = files;
+    set->files[set->count++] = file;
+}
+
+void FileSet_AppendError(BibFileSet *set, const char *format, ...)
+{
+    va_list arguments;
+    va_start(arguments, format);
+    va_list again;
+    va_copy(again, arguments);
+    size_t length = set->loadErrors ? strlen(set->loadErrors) : 0;
+    int more = vsnprintf(nullptr, 0, format, arguments);
+    char *text = static_cast<char *>(realloc(set->loadErrors, length + more + 1));
+    if (text) {
+        set->loadErrors = text;
+        vsnprintf(text + length, more + 1, format, again);
+    }
+    va_end(again);
+    va_end(arguments);
+}
+
+// 1 when the record at `index` stands further up in the list as well.
+static int IsRepeated(const BibFileSet *set, int index)
+{
+    for (int i = 0; i < index; ++i)
+        if (set->files[i] == set->files[index])
+            return 1;
+    return 0;
+}
+
+void FileSet_Free(BibFileSet *set)
+{
+    for (int i = set->count - 1; i >= 0; --i) {
+        if (IsRepeated(set, i))
+            continue;
+        Sys_UnlockFile(set->files[i]->lockHandle);
+        Bib_FreeFile(set->files[i]);
+    }
+    free(set->files);
+    free(set->loadErrors);
+    set->files = nullptr;
+    set->loadErrors = nullptr;
+    set->count = 0;
+}
+
+int FileSet_EntryCount(const BibFileSet *set)
+{
+    int count = 0;
+    for (int i = 0; i < set->count; ++i)
+        for (const BibEntry *entry = set->files[i]->entries; entry; entry = entry->next)
+            ++count;
+    return count;
+}
+
+static int IsModified(const BibFileSet *set, int index)
+{
+    return set->files[index]->modified != 0 && !IsRepeated(set, index);
+}
+
+int FileSet_ModifiedCount(const BibFileSet *set)
+{
+    int count = 0;
+    for (int i = 0; i < set->count; ++i)
+        count += IsModified(set, i);
+    return count;
+}
+
+// Paths that differ in case name one file when the system says so, or cannot say.
+static int IsSamePath(const char *a, const char *b)
+{
+    if (strcmp(a, b) == 0)
+        return 1;
+    if (Ascii_Compare(a, b) != 0)
+        return 0;
+    return Sys_SameFile(a, b) || (!Sys_FileExists(a) && !Sys_FileExists(b));
+}
+
+int FileSet_Find(const BibFileSet *set, const char *path)
+{
+    for (int i = 0; i < set->count; ++i)
+        if (IsSamePath(set->files[i]->path, path))
+            return i;
+    return -1;
+}
+
+// --- Opening and locking ---
+
+// What the user reads when the lock of `path` was not to be had. Ask right after the failure.
+static std::string LockFailureText(const char *path)
+{
+    std::string reason = Sys_LastErrorText();
+    return std::string("File: `") + path + "'\n" + reason;
+}
+
+static void ReportLockFailure(const BibFileSet *set, const char *caption, const std::string &text)
+{
+    if (set->box)
+        set->box(set->boxOwner, caption, text.c_str());
+    AppLog("ERROR: ", text.c_str());
+}
+
+// A file with errors is never written back: what the parser dropped would be lost.
+static void Protect(BibFile *file)
+{
+    file->readOnlyByErrors = 1;
+    file->readOnly = 1;
+    Sys_UnlockFile(file->lockHandle);
+    file->lockHandle = 0;
+}
+
+// Loads and appends; the lock goes to the record or is released.
+static int Load(BibFileSet *set, const char *path, int lock, int readOnly)
+{
+    AppLog("Loading: ", path);
+    BibFile *file = Bib_LoadFile(path);
+    if (!file) {
+        FileSet_AppendError(set, "ERROR: The file '%s' not found\n", path);
+        Sys_UnlockFile(lock);
+        return 1;
+    }
+    file->lockHandle = lock;
+    if (readOnly)
+        file->readOnly = 1;
+    FileSet_Append(set, file);
+    if (file->errorCount != 0 && !file->readOnly)
+        Protect(file);
+    return file->errorCount;
+}
+
+int FileSet_Open(BibFileSet *set, const char *path)
+{
+    if (Sys_WriteAccess(path) != 0)
+        return Load(set, path, 0, 0);
+    // Named a second time in one run: only the first record may be edited.
+    if (Sys_IsLockedHere(path))
+        return Load(set, path, 0, 1);
+    int lock = Sys_LockFile(path);
+    if (lock != 0)
+        return Load(set, path, lock, 0);
+    std::string text = LockFailureText(path);
+    ReportLockFailure(set, "Openning BIB file", text);
+    FileSet_AppendError(set, "ERROR: %s\n", text.c_str());
+    return 1;
+}
+
+// --- Saving ---
+
+int FileSet_SaveOne(BibFileSet *set, BibFile *file)
+{
+    int wasLocked = file->lockHandle != 0;
+    Sys_UnlockFile(file->lockHandle);
+    file->lockHandle = 0;
+    int saved = Bib_SaveFile(file);
+    if (!wasLocked)
+        return saved;
+    file->lockHandle = Sys_LockFile(file->path);
+    if (file->lockHandle == 0)
+        ReportLockFailure(set, "ReLocking BIB file", LockFailureText(file->path));
+    return saved;
+}
+
+int FileSet_SaveAll(BibFileSet *set)
+{
+    int modified = 0;
+    int failed = 0;
+    for (int i = 0; i < set->count; ++i) {
+        if (!IsModified(set, i))
+            continue;
+        ++modified;
+        failed += !FileSet_SaveOne(set, set->files[i]);
+    }
+    return modified > 0 && failed == 0;
+}
+
+char *FileSet_SaveQuestion(const BibFileSet *set)
+{
+    std::string text = "There are modified Bib-files:\n\n";
+    for (int i = 0; i < set->count; ++i)
+        if (IsModified(set, i))
+            text += std::string(set->files[i]->path) + "\n";
+    text += "\nDo you want to save them ?";
+    return Bib_CopyText(text.c_str(), text.size());
+}
