@@ -66,24 +66,26 @@ static void MoveCrossrefToFront(BibEntry *entry, int crossref)
     entry->fields[0] = moved;
 }
 
-static BibStored CheckRoom(ItemReader reader, const char *typeName)
+// 1 when every field name of the entry, whose type and key are read, fits in the table.
+static int HasFieldRoom(ItemReader reader)
 {
-    if (!Bib_HasFieldRoom("crossref"))
-        return BIB_NO_FIELD;
-    if (!Bib_HasTypeRoom(typeName))
-        return BIB_NO_TYPE;
+    if (BibFieldCount + reader.header.number <= BIB_FIELD_LIMIT)
+        return 1;
     for (int i = 0; i < reader.header.number; ++i) {
         const char *name = NextText(&reader);
         NextText(&reader);
         if (!Bib_HasFieldRoom(name))
-            return BIB_NO_FIELD;
+            return 0;
         Bib_FieldIndex(name);
     }
-    return BIB_STORED;
+    return 1;
 }
 
 static BibStored StoreEntry(BibFile *file, ItemReader reader)
 {
+    if (!Bib_HasFieldRoom("crossref"))
+        return BIB_NO_FIELD;
+    int crossref = Bib_FieldIndex("crossref");
     const char *typeName = NextText(&reader);
     uint32_t keyLength;
     const char *key = NextText(&reader, &keyLength);
@@ -91,11 +93,11 @@ static BibStored StoreEntry(BibFile *file, ItemReader reader)
         AppLog("ERROR: ", "invalid entry will be just skipped.");
         return BIB_SKIPPED;
     }
-    BibStored room = CheckRoom(reader, typeName);
-    if (room != BIB_STORED)
-        return room;
+    if (!Bib_HasTypeRoom(typeName))
+        return BIB_NO_TYPE;
+    if (!HasFieldRoom(reader))
+        return BIB_NO_FIELD;
 
-    int crossref = Bib_FieldIndex("crossref");
     BibEntry *entry = Bib_AllocEntry(reader.header.number);
     if (!entry)
         return BIB_SKIPPED;
@@ -277,10 +279,11 @@ static const char *ReasonOfEnd(const Load *load, SysChildEnd end, int answered)
 
 static int SecondsFor(FILE *stream)
 {
+    static const long step = 64 * 1024 * 1024;
     fseek(stream, 0, SEEK_END);
     long size = ftell(stream);
     rewind(stream);
-    return BibLoadSeconds + static_cast<int>(size / (4 * 1024 * 1024));
+    return BibLoadSeconds * static_cast<int>(1 + size / step);
 }
 
 static void Report(BibFile *file, int line, const char *message)

@@ -88,7 +88,7 @@ extern BibFile *BibCurrentFile; // receives the parser's messages
 extern int BibBackupMode;      // below 0: none; 0, 1: "name.Backup"; 2 and more: dated (default 2)
 extern const int BibLockFiles; // 0: streams are not kept open
 extern const int BibStringOptions; // 0: the parser leaves strings as they are
-extern int BibLoadSeconds; // CPU time for a load, and 1 s more for each 4 MB; then it is stopped
+extern int BibLoadSeconds; // CPU time that a load may take, for each begun 64 MB (default 10)
 
 // --- Tables and records (BibStore.cpp) ---
 

@@ -1,0 +1,26 @@
+#!/bin/sh
+# Installs the Debian packages that are missing: install.sh build [screen] [test]
+set -eu
+
+build="g++ cmake ninja-build ccache libwxgtk3.2-dev libbtparse-dev libgtest-dev libgmock-dev
+       libbenchmark-dev"
+# A private screen with a window manager, and pictures of it.
+screen="xvfb openbox dbus-daemon xdotool imagemagick fonts-dejavu-core adwaita-icon-theme"
+test="python3"
+
+missing=
+for group in "$@"; do
+    eval "packages=\$$group"
+    for package in $packages; do
+        dpkg-query -W -f '${db:Status-Status}\n' "$package" 2>/dev/null | grep -qx installed ||
+            missing="$missing $package"
+    done
+done
+[ -n "$missing" ] || exit 0
+
+echo "Installing:$missing" >&2
+sudo=
+[ "$(id -u)" -eq 0 ] || sudo=sudo
+$sudo apt-get update -q >&2
+# shellcheck disable=SC2086
+$sudo env DEBIAN_FRONTEND=noninteractive apt-get install -y -q --no-install-recommends $missing >&2

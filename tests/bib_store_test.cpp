@@ -1,0 +1,143 @@
+#include "store/BibStore.h"
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+
+#include "tests/support/LoadText.h"
+
+namespace
+{
+
+class BibStore : public testing::Test
+{
+protected:
+    void SetUp() override { Bib_Initialize(); }
+};
+
+class BibNewEntry : public BibStore
+{
+protected:
+    BibFile *file = nullptr;
+
+    void SetUp() override
+    {
+        BibStore::SetUp();
+        file = LoadText("@misc{old, title = {x}}\n");
+    }
+    void TearDown() override { Bib_FreeFile(file); }
+
+    std::string FieldNames(const BibEntry *entry)
+    {
+        std::string names;
+        for (int i = 0; i < entry->fieldCount; ++i)
+            names += FieldName(entry->fields[i]) + " ";
+        return names;
+    }
+};
+
+const char Specs[] = "author=*\0note=\0*x=*\0nonsense\0";
+
+} // namespace
+
+TEST_F(BibStore, StartsWithTheFixedTypes)
+{
+    ASSERT_EQ(4, BibTypeCount);
+    EXPECT_STREQ("** UNKNOWN **", BibTypeTable[0]);
+    EXPECT_STREQ("COMMENT", BibTypeTable[1]);
+    EXPECT_STREQ("PREAMBLE", BibTypeTable[2]);
+    EXPECT_STREQ("STRING", BibTypeTable[3]);
+    EXPECT_EQ(0, BibFieldCount);
+}
+
+TEST_F(BibStore, KeepsTheFirstSpellingOfAType)
+{
+    int index = Bib_TypeIndex("Article");
+    EXPECT_EQ(4, index);
+    EXPECT_EQ(index, Bib_TypeIndex("article"));
+    EXPECT_EQ(index, Bib_TypeIndex("ARTICLE"));
+    EXPECT_STREQ("Article", BibTypeTable[index]);
+}
+
+TEST_F(BibStore, TakesAMissingTypeNameForUnknown)
+{
+    EXPECT_EQ(0, Bib_TypeIndex(""));
+    EXPECT_EQ(0, Bib_TypeIndex(nullptr));
+    EXPECT_EQ(4, BibTypeCount);
+}
+
+TEST_F(BibStore, ComparesNamesByTheirAsciiLettersOnly)
+{
+    EXPECT_NE(Bib_FieldIndex("stra\xC4"), Bib_FieldIndex("stra\xE4"));
+    EXPECT_EQ(Bib_FieldIndex("TITLE"), Bib_FieldIndex("title"));
+}
+
+TEST_F(BibStore, EndsTheProcessAtThe129thType)
+{
+    for (int i = 4; i < 128; ++i)
+        EXPECT_EQ(i, Bib_TypeIndex(("type" + std::to_string(i)).c_str()));
+    EXPECT_EQ(1, Bib_HasTypeRoom("TYPE77"));
+    EXPECT_EQ(0, Bib_HasTypeRoom("another"));
+    EXPECT_EXIT(Bib_TypeIndex("another"), testing::ExitedWithCode(1), "^Type Table full \n$");
+}
+
+TEST_F(BibStore, EndsTheProcessAtThe513thField)
+{
+    for (int i = 0; i < 512; ++i)
+        EXPECT_EQ(i, Bib_FieldIndex(("field" + std::to_string(i)).c_str()));
+    EXPECT_EQ(1, Bib_HasFieldRoom("FIELD400"));
+    EXPECT_EQ(0, Bib_HasFieldRoom("another"));
+    EXPECT_EXIT(Bib_FieldIndex("another"), testing::ExitedWithCode(1),
+                "^Field Table full at adding field: `another'\n$");
+}
+
+TEST_F(BibNewEntry, TakesMandatoryFieldsOnly)
+{
+    BibEntry *entry = Bib_NewEntry(file, "new", "Book", Specs, 0);
+    EXPECT_EQ("author ", FieldNames(entry));
+    EXPECT_STREQ("", entry->fields[0].value);
+}
+
+TEST_F(BibNewEntry, TakesAllFieldsOnRequest)
+{
+    BibEntry *entry = Bib_NewEntry(file, "new", "Book", Specs, 1);
+    EXPECT_EQ("author note ", FieldNames(entry));
+}
+
+TEST_F(BibNewEntry, GoesToTheHeadOfTheList)
+{
+    BibEntry *entry = Bib_NewEntry(file, "new", "Book", Specs, 0);
+    EXPECT_EQ(entry, file->entries);
+    EXPECT_STREQ("old", entry->next->key);
+    EXPECT_STREQ("new", entry->key);
+    EXPECT_STREQ("Book", BibTypeTable[entry->type]);
+}
+
+TEST_F(BibNewEntry, MayHaveNoFields)
+{
+    BibEntry *entry = Bib_NewEntry(file, "new", "Book", "\0", 1);
+    EXPECT_EQ(0, entry->fieldCount);
+    EXPECT_EQ(0, Bib_EntryContains(entry, "x"));
+    EXPECT_EQ(0, Bib_EntryContains(entry, ""));
+}
+
+TEST_F(BibStore, FindsTextInValuesIgnoringCase)
+{
+    BibFile *file =
+        LoadText("@misc{Knuth, title = {The Art of Computer Programming}, year = 1968}");
+    for (const char *text : {"the art", "PROGRAMMING", "1968", "6", "g", "Computer P", ""})
+        EXPECT_EQ(1, Bib_EntryContains(file->entries, text)) << text;
+    for (const char *text : {"knuth", "title", "programmings", "1969", "art  of", "gX"})
+        EXPECT_EQ(0, Bib_EntryContains(file->entries, text)) << text;
+    Bib_FreeFile(file);
+}
+
+TEST_F(BibStore, FindsTextBehindAFalseStart)
+{
+    BibFile *file = LoadText("@misc{k, a = {aAaAab}, b = {\xC4\xE4}}");
+    EXPECT_EQ(1, Bib_EntryContains(file->entries, "AAB"));
+    EXPECT_EQ(1, Bib_EntryContains(file->entries, "\xC4\xE4"));
+    EXPECT_EQ(0, Bib_EntryContains(file->entries, "\xE4\xC4"));
+    Bib_FreeFile(file);
+}
