@@ -12,9 +12,9 @@ enum { COMMAND_LINE_SIZE = 1024, BASE_FOLDER_SIZE = 256, TOKEN_SIZE = 512 };
 
 // What options set, beyond the files. One for the process.
 struct CommandState {
-    char baseFolder[BASE_FOLDER_SIZE]; // relative names are resolved against it
-    uint32_t companionWindow;          // -w
-    uint32_t companionNumber;          // -w; not read
+    char baseFolder[BASE_FOLDER_SIZE];           // relative names are resolved against it
+    uint32_t companionWindow;                    // -w
+    uint32_t companionNumber;                    // -w; not read
     char companionService[BASE_FOLDER_SIZE + 1]; // -w; "" for none
     // Answers TNSearch("bib", ...): malloc'd path or null. Null: nothing more is found.
     char *(*findBib)(const char *name);
@@ -30,17 +30,24 @@ struct CommandResult {
 const char *BuildCommandLine(int argc, const char *const *argv);
 
 // Puts quotes around an argument that holds a byte of 128 or more and no blank, as the tokenizer
-// would cut it there: with ' when it holds ".
+// would cut it there: with ' when it holds ". One that holds both kinds cannot be expressed and
+// stays as it is.
 std::string Command_QuoteArgument(const char *argument);
 
 // Copies the next token to `out` (at most size - 1 bytes) and returns where the following one
 // starts, null when there was none. Blanks separate; a token may stand in quotes of either kind.
 // Bytes compare as signed, so an unquoted token ends at a byte of 128 or more; at such a byte the
-// token is empty and the pointer does not move.
+// token is empty and the pointer does not move. `text` may be null.
 const char *NextToken(const char *text, char *out, size_t size);
 
 // The path that a file name on the command line means. 1 when it exists.
 int Command_ResolveName(const CommandState *state, const char *token, std::string *path);
 
-// Carries out one command line.
+// Carries out one command line. What is wrong with it goes to the set's load errors and is counted.
+//
+// A line that does not fit in COMMAND_LINE_SIZE bytes, or null, as BuildCommandLine gives for one,
+// is refused as a whole. Where the tokenizer gets no further, the rest is refused.
+//
+// No changes are lost: a file that cannot be saved stays open, at the end of the list. Files that
+// the option -i takes off the list stay in memory and locked, and nobody lists them any more.
 CommandResult Command_Process(BibFileSet *set, CommandState *state, const char *commandLine);

@@ -1,0 +1,391 @@
+// app/CommandLine.cpp - carries out command lines: tokens, options, file names.
+#include "app/CommandLine.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <cstring>
+
+#include "app/Companion.h"
+#include "app/Log.h"
+#include "encoding/Encoding.h"
+#include "store/Ascii.h"
+#include "store/Sys.h"
+
+// --- Building a line and taking it apart ---
+
+static std::string JoinArguments(int argc, const char *const *argv)
+{
+    std::string line;
+    for (int i = 1; i < argc; ++i) {
+        const char *quote = strchr(argv[i], ' ') ? "\"" : "";
+        line += i > 1 ? " " : "";
+        line += quote;
+        line += argv[i];
+        line += quote;
+    }
+    return line;
+}
+
+const char *BuildCommandLine(int argc, const char *const *argv)
+{
+    static char buffer[COMMAND_LINE_SIZE];
+    std::string line = JoinArguments(argc, argv);
+    if (line.size() >= sizeof buffer) {
+        AppLog("ERROR: Command line too long: ", line.c_str());
+        return nullptr;
+    }
+    memcpy(buffer, line.c_str(), line.size() + 1);
+    TNSMessage("INFO: Command_Line - ", buffer, TNS_LIFECYCLE);
+    return buffer;
+}
+
+static bool HoldsHighByte(const char *text)
+{
+    for (; *text; ++text)
+        if (static_cast<signed char>(*text) < 0)
+            return true;
+    return false;
+}
+
+std::string Command_QuoteArgument(const char *argument)
+{
+    if (!HoldsHighByte(argument) || strchr(argument, ' '))
+        return argument;
+    const char *quote = strchr(argument, '"') ? "'" : "\"";
+    if (strchr(argument, *quote))
+        return argument;
+    return std::string(quote) + argument + quote;
+}
+
+static const char *SkipBlanks(const char *text)
+{
+    for (; *text; ++text) {
+        int c = static_cast<signed char>(*text);
+        if (c < 1 || c > 32)
+            break;
+    }
+    return text;
+}
+
+static const char *SkipWord(const char *text)
+{
+    while (static_cast<signed char>(*text) > 32)
+        ++text;
+    return text;
+}
+
+static const char *SkipUntil(const char *text, char quote)
+{
+    while (*text && *text != quote)
+        ++text;
+    return text;
+}
+
+static void CopyCut(char *out, size_t size, const char *text, size_t length)
+{
+    if (length >= size)
+        length = size - 1;
+    memcpy(out, text, length);
+    out[length] = 0;
+}
+
+const char *NextToken(const char *text, char *out, size_t size)
+{
+    *out = 0;
+    if (!text)
+        return nullptr;
+    const char *start = SkipBlanks(text);
+    if (!*start)
+        return nullptr;
+    bool quoted = *start == '"' || *start == '\'';
+    const char *end = quoted ? SkipUntil(start + 1, *start) : SkipWord(start);
+    start += quoted;
+    CopyCut(out, size, start, static_cast<size_t>(end - start));
+    if (quoted && *end)
+        ++end;
+    return SkipBlanks(end);
+}
+
+// --- File names ---
+
+static bool IsAbsolute(const char *token)
+{
+    return *token == '/' || (*token && (token[1] == ':' || token[1] == '\\'));
+}
+
+static int ResolveAbsolute(const char *token, std::string *path)
+{
+    *path = token;
+    size_t length = path->size();
+    if (length <= 4 || Ascii_Compare(token + length - 4, ".bib") != 0)
+        *path += ".bib";
+    AppLog("Check: ", path->c_str());
+    return Sys_FileExists(path->c_str());
+}
+
+// The environment's answer for a name that is not in the base folder.
+static int AskEnvironment(const CommandState *state, const char *token, std::string *path)
+{
+    char *answer = state->findBib ? state->findBib(token) : nullptr;
+    if (!answer)
+        return 0;
+    *path = answer;
+    free(answer);
+    return 1;
+}
+
+// The token takes the place of what follows the last separator of the base folder. Unlike an
+// absolute name, one that has any dot gets no ending.
+static int ResolveRelative(const CommandState *state, const char *token, std::string *path)
+{
+    *path = state->baseFolder;
+    path->erase(path->find_last_of("/\\") + 1); // npos + 1 is 0
+    *path += token;
+    if (!strchr(token, '.'))
+        *path += ".bib";
+    AppLog("Check: ", path->c_str());
+    return Sys_FileExists(path->c_str()) || AskEnvironment(state, token, path);
+}
+
+int Command_ResolveName(const CommandState *state, const char *token, std::string *path)
+{
+    return IsAbsolute(token) ? ResolveAbsolute(token, path) : ResolveRelative(state, token, path);
+}
+
+// --- One command line ---
+
+namespace
+{
+
+struct Command {
+    BibFileSet *set; // what is open afterwards
+    CommandState *state;
+    BibFileSet previous; // what was open before; lends its records only
+    CommandResult result;
+};
+
+} // namespace
+
+static void MoveToPrevious(Command *command)
+{
+    BibFileSet *set = command->set;
+    command->previous.files = set->files;
+    command->previous.count = set->count;
+    set->files = nullptr;
+    set->count = 0;
+    for (int i = 0; i < command->previous.count; ++i)
+        command->previous.files[i]->inUse = 0;
+}
+
+static bool IsListed(const BibFileSet *set, const BibFile *file)
+{
+    for (int i = 0; i < set->count; ++i)
+        if (set->files[i] == file)
+            return true;
+    return false;
+}
+
+// Saves a file that leaves the list. When that fails it goes back on, so that the user can act.
+static bool SaveOrKeep(Command *command, BibFile *file)
+{
+    if (!file->modified || FileSet_SaveOne(command->set, file))
+        return true;
+    FileSet_Append(command->set, file);
+    FileSet_AppendError(command->set, "ERROR: The file '%s' could not be saved, it stays open\n",
+                        file->path);
+    ++command->result.errors;
+    return false;
+}
+
+// Option d.
+static void SetBaseFolder(Command *command, const char *folder)
+{
+    CommandState *state = command->state;
+    size_t length = strlen(folder);
+    if (length < sizeof state->baseFolder) {
+        memcpy(state->baseFolder, folder, length + 1);
+        return;
+    }
+    // Cut, it would be another folder, with other files.
+    AppLog("ERROR: Base folder too long: ", folder);
+    FileSet_AppendError(command->set, "ERROR: The folder name '%s' is too long\n", folder);
+    ++command->result.errors;
+}
+
+// Option i. The files that leave the list here are not closed.
+static void EmptyList(Command *command)
+{
+    BibFileSet *set = command->set;
+    BibFile **files = set->files;
+    int count = set->count;
+    set->files = nullptr;
+    set->count = 0;
+    for (int i = 0; i < count; ++i)
+        if (!IsListed(set, files[i])) // else it is here twice and could not be saved
+            SaveOrKeep(command, files[i]);
+    free(files);
+}
+
+// Option w: "window", "window:number", "window/service" or "window:number/service".
+static void SetCompanion(CommandState *state, const char *rest)
+{
+    const char *slash = strchr(rest, '/');
+    const char *colon = strchr(rest, ':');
+    bool hasNumber = colon && (!slash || colon < slash);
+    state->companionWindow = static_cast<uint32_t>(strtoll(rest, nullptr, 10));
+    state->companionNumber = hasNumber ? static_cast<uint32_t>(strtoll(colon + 1, nullptr, 10)) : 0;
+    if (slash)
+        CopyCut(state->companionService, sizeof state->companionService, slash + 1,
+                strlen(slash + 1));
+}
+
+static void TakeOption(Command *command, const char *token)
+{
+    switch (token[1]) {
+    case 'a':
+    case 'b':
+        break;
+    case 'd':
+        SetBaseFolder(command, token + 2);
+        break;
+    case 'e':
+        Enc_Select(token + 2);
+        break;
+    case 'i':
+        EmptyList(command);
+        break;
+    case 'w':
+        SetCompanion(command->state, token + 2);
+        break;
+    default:
+        AppLog("Unknown argument: ", token);
+    }
+}
+
+static void CloseFile(Command *command, BibFile *file)
+{
+    AppLog("Close Unused Bib file: ", file->path);
+    if (!SaveOrKeep(command, file))
+        return;
+    Sys_UnlockFile(file->lockHandle);
+    Bib_FreeFile(file);
+    ++command->result.changes;
+}
+
+// Closes what was open before and has not been named: all of it, or with a `path` the file that is
+// there. One that is listed twice is closed once.
+static void CloseUnused(Command *command, const char *path)
+{
+    BibFileSet *previous = &command->previous;
+    for (int i = 0; i < previous->count;) {
+        BibFile *file = previous->files[i];
+        if (file->inUse || (path && !Sys_SameFile(file->path, path))) {
+            ++i;
+            continue;
+        }
+        BibFile **end = previous->files + previous->count;
+        previous->count =
+            static_cast<int>(std::remove(previous->files, end, file) - previous->files);
+        CloseFile(command, file);
+    }
+}
+
+// Only what was open before this command line counts: a new file that it names twice is loaded
+// twice.
+static bool Reuse(Command *command, const char *path)
+{
+    int found = FileSet_Find(&command->previous, path);
+    if (found < 0)
+        return false;
+    BibFile *file = command->previous.files[found];
+    file->inUse = 1;
+    FileSet_Append(command->set, file);
+    AppLog("Reused Bib file: ", file->path);
+    return true;
+}
+
+static void Load(Command *command, const char *path)
+{
+    // Open under another name, it may have changes to save, and it holds the lock.
+    CloseUnused(command, path);
+    int before = command->set->count;
+    command->result.errors += FileSet_Open(command->set, path);
+    command->result.changes += command->set->count - before;
+}
+
+static void TakeFile(Command *command, const char *token)
+{
+    std::string path;
+    if (!Command_ResolveName(command->state, token, &path)) {
+        AppLog("ERROR: Can't locate Bib-file: ", token);
+        FileSet_AppendError(command->set, "ERROR: The file '%s' not found\n", token);
+        ++command->result.errors;
+        return;
+    }
+    if (!Reuse(command, path.c_str()))
+        Load(command, path.c_str());
+}
+
+static void RefuseRest(Command *command, const char *rest)
+{
+    AppLog("ERROR: Command line not understood from: ", rest);
+    FileSet_AppendError(command->set,
+                        "ERROR: The command line was not understood from '%s' on; names with "
+                        "such characters must stand in quotes\n",
+                        rest);
+    ++command->result.errors;
+}
+
+static void TakeTokens(Command *command, const char *line)
+{
+    char token[TOKEN_SIZE];
+    line = SkipBlanks(line);
+    while (const char *next = NextToken(line, token, sizeof token)) {
+        if (next == line) {
+            RefuseRest(command, line);
+            return;
+        }
+        if (*token == '-')
+            TakeOption(command, token);
+        else
+            TakeFile(command, token);
+        line = next;
+    }
+}
+
+static bool SameList(const BibFileSet *a, const BibFileSet *b)
+{
+    if (a->count != b->count)
+        return false;
+    for (int i = 0; i < a->count; ++i)
+        if (a->files[i] != b->files[i])
+            return false;
+    return true;
+}
+
+static CommandResult RefuseLongLine(BibFileSet *set, const char *line)
+{
+    if (line) // else BuildCommandLine has logged it
+        AppLog("ERROR: Command line too long: ", line);
+    FileSet_AppendError(set,
+                        "ERROR: The command line is longer than %d characters, nothing of it was "
+                        "carried out\n",
+                        COMMAND_LINE_SIZE - 1);
+    return {1, 0};
+}
+
+CommandResult Command_Process(BibFileSet *set, CommandState *state, const char *commandLine)
+{
+    if (!commandLine || strlen(commandLine) >= COMMAND_LINE_SIZE)
+        return RefuseLongLine(set, commandLine);
+    Command command = {set, state, {}, {}};
+    MoveToPrevious(&command);
+    AppLog("Command: ", commandLine);
+    TakeTokens(&command, commandLine);
+    CloseUnused(&command, nullptr);
+    // Rows name their file by its place in the list, which reuse alone can change.
+    if (command.result.changes == 0 && !SameList(set, &command.previous))
+        command.result.changes = 1;
+    free(command.previous.files);
+    return command.result;
+}
