@@ -1,0 +1,53 @@
+#include "ui/PanelRules.h"
+
+#include <algorithm>
+#include <cmath>
+
+static double Linear(unsigned char channel)
+{
+    double c = channel / 255.0;
+    return c <= 0.04045 ? c / 12.92 : std::pow((c + 0.055) / 1.055, 2.4);
+}
+
+// Relative luminance as the accessibility guidelines of the web define it.
+static double Luminance(Colour c)
+{
+    return 0.2126 * Linear(c.red) + 0.7152 * Linear(c.green) + 0.0722 * Linear(c.blue);
+}
+
+double Panel_Contrast(Colour a, Colour b)
+{
+    double la = Luminance(a), lb = Luminance(b);
+    return (std::max(la, lb) + 0.05) / (std::min(la, lb) + 0.05);
+}
+
+// The same hue at full strength.
+static Colour Saturate(Colour c)
+{
+    int top = std::max({c.red, c.green, c.blue});
+    if (top == 0)
+        return c;
+    auto scale = [top](int channel) { return (unsigned char)(channel * 255 / top); };
+    return {scale(c.red), scale(c.green), scale(c.blue)};
+}
+
+static Colour MixWithWhite(Colour c, int percent)
+{
+    auto mix = [percent](int channel) {
+        return (unsigned char)(channel + (255 - channel) * percent / 100);
+    };
+    return {mix(c.red), mix(c.green), mix(c.blue)};
+}
+
+Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme)
+{
+    if (!darkTheme)
+        return chosen;
+    Colour full = Saturate(chosen);
+    for (int percent = 0; percent < 100; percent += 5) {
+        Colour lighter = MixWithWhite(full, percent);
+        if (Panel_Contrast(lighter, background) >= 4.5)
+            return lighter;
+    }
+    return {255, 255, 255};
+}
