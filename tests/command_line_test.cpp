@@ -712,6 +712,13 @@ TEST_F(CommandProcess, RefusesALineThatIsTooLong)
               LoadErrors());
 }
 
+TEST_F(CommandProcess, TakesALineThatJustFits)
+{
+    std::string line(COMMAND_LINE_SIZE - 1, ' ');
+    EXPECT_EQ(0, Run(line).errors);
+    EXPECT_EQ(1, Run(line + " ").errors);
+}
+
 TEST_F(CommandProcess, RefusesWhatCouldNotBeBuilt)
 {
     WriteBib("a.bib");
