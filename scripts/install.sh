@@ -6,7 +6,7 @@ build="g++ cmake ninja-build ccache libwxgtk3.2-dev libbtparse-dev libgtest-dev 
        libbenchmark-dev"
 # A private screen with a window manager, and pictures of it.
 screen="xvfb openbox dbus-daemon xdotool imagemagick fonts-dejavu-core adwaita-icon-theme"
-test="python3"
+test="locales python3"
 
 missing=
 for group in "$@"; do

@@ -200,6 +200,8 @@ static void PutStrings(Output *out, const BibString *string)
     Put(out, "\n");
 }
 
+// A key without the comma after it is a syntax error to the parser: the file would be read-only
+// the next time.
 static void PutEntry(Output *out, const BibEntry *entry)
 {
     Put(out, "@");
@@ -212,7 +214,7 @@ static void PutEntry(Output *out, const BibEntry *entry)
         Put(out, " = ");
         PutValue(out, entry->fields[i].value);
     }
-    Put(out, "\n}\n");
+    Put(out, entry->fieldCount > 0 ? "\n}\n" : ",\n}\n");
 }
 
 static void WriteContents(const BibFile *file, FILE *stream)

@@ -2,9 +2,10 @@
 
 #include <gtest/gtest.h>
 
+#include <clocale>
+#include <cstdlib>
 #include <cstring>
 #include <filesystem>
-#include <fstream>
 #include <string>
 
 #include <btparse.h>
@@ -14,6 +15,7 @@
 
 #include "tests/support/LoadText.h"
 #include "tests/support/LogCapture.h"
+#include "tests/support/TempFolder.h"
 
 namespace
 {
@@ -172,13 +174,21 @@ TEST_F(BibLoad, KeepsNamesAsWritten)
     EXPECT_EQ("AuThor=\x02JACM\x05\x02Jan\x05", Fields());
 }
 
+// In Turkish I and i are two letters, neither of which is the other's other case.
 TEST_F(BibLoad, KnowsTheFourKindsOfItemInAnyCaseAndLocale)
 {
-    setlocale(LC_ALL, "tr_TR.UTF-8"); // where it exists, I and i are two letters
-    Load("@sTrInG{i = {x}}\n@PREAMBLE{{p}}\n@CoMmEnT{c}\n@INBOOK{k, TITLE = {t}}\n@inbook{l}\n");
-    EXPECT_NE(nullptr, file->strings);
+    TempFolder folder;
+    std::string locale = folder.Path("tr_TR.UTF-8");
+    ASSERT_EQ(0, system(("localedef -i tr_TR -f UTF-8 " + locale).c_str()));
+    setenv("LOCPATH", folder.Path().c_str(), 1);
+    ASSERT_NE(nullptr, setlocale(LC_ALL, "tr_TR.UTF-8"));
+    ASSERT_NE('I', toupper('i'));
+
+    Load("@sTrInG{i = {x}}\n@PREAMBLE{{p}}\n@CoMmEnT{c}\n@INBOOK{k, TITLE = {t}}\n@inbook{l,}\n");
+    ASSERT_NE(nullptr, file->strings);
     EXPECT_STREQ("p\r\n", file->preamble);
     EXPECT_NE(nullptr, file->comments);
+    ASSERT_EQ("k l ", Keys());
     EXPECT_EQ(file->entries->type, file->entries->next->type);
 }
 
@@ -370,25 +380,20 @@ TEST_F(BibLoad, RefusesWhatIsNoRegularFile)
 {
     EXPECT_EQ(nullptr, Bib_LoadFile("/tmp"));
     EXPECT_EQ(nullptr, Bib_LoadFile("/dev/zero"));
-    char path[] = "/tmp/cartulo-test-XXXXXX";
-    ASSERT_NE(nullptr, mkdtemp(path));
-    std::string pipe = std::string(path) + "/pipe.bib";
+    TempFolder folder;
+    std::string pipe = folder.Path("pipe.bib");
     ASSERT_EQ(0, mkfifo(pipe.c_str(), 0600));
     EXPECT_EQ(nullptr, Bib_LoadFile(pipe.c_str())); // and does not wait for a writer
-    std::filesystem::remove_all(path);
 }
 
 TEST_F(BibLoad, CutsTheBaseNameAtItsFirstDot)
 {
-    char folder[] = "/tmp/cartulo-test-XXXXXX";
-    ASSERT_NE(nullptr, mkdtemp(folder));
-    std::string path = std::string(folder) + "/b.c\\refs.old.bib";
-    std::ofstream(path) << "@misc{k, x = 1}\n";
+    TempFolder folder;
+    std::string path = folder.Write("b.c\\refs.old.bib", "@misc{k, x = 1}\n");
     file = Bib_LoadFile(path.c_str());
     ASSERT_NE(nullptr, file);
     EXPECT_STREQ("refs", file->baseName);
     EXPECT_EQ(path, file->path);
-    std::filesystem::remove_all(folder);
 }
 
 TEST_F(BibLoad, LeavesNoDescriptorAndNoChildBehind)
