@@ -1,0 +1,12 @@
+// app/Native.h - what only the window system can answer. See Native-gtk.cpp.
+#pragma once
+
+#include <wx/event.h>
+#include <wx/toplevel.h>
+
+// The handle by which other programs know the window; 0 when the window system has none.
+long Native_WindowHandle(wxTopLevelWindow *window);
+
+// The Latin letter, in upper case, that is printed on the key, whatever the keyboard layout makes
+// of it; 0 for other keys.
+int Native_LatinLetter(const wxKeyEvent &event);

@@ -1,0 +1,86 @@
+// ui/Cartulo.h - the editor panel: the entry list at the left, the selected entry at the right.
+#pragma once
+
+#include <wx/scrolwin.h>
+#include <wx/splitter.h>
+
+#include <string>
+
+#include "app/CommandLine.h"
+#include "store/BibFileSet.h"
+
+class QListBox;
+class wxStaticText;
+class wxTextCtrl;
+
+class Cartulo : public wxSplitterWindow
+{
+public:
+    // Loads the files that the command line names. `state` outlives the panel.
+    Cartulo(wxWindow *parent, const char *commandLine, CommandState *state);
+    ~Cartulo() override;
+
+    const BibFileSet *Files() const { return &m_set; }
+    const BibEntry *CurrentEntry() const { return m_entry; } // null for none
+
+    // Carries out a command line: opens and closes files, shows what is open then. `origin` says
+    // where the line came from. Returns 0.
+    int ProcessCommand(const char *commandLine, const char *origin);
+
+    void SetModified(int file); // the file of this index has one change more
+
+    // Saves all modified files; unless `quiet`, asks first. -1 when the user cancelled, 0 when
+    // nothing was saved or a save failed, 1 when every modified file was saved.
+    int SaveAll(bool quiet);
+
+    wxString CountText() const;     // "There are ... entries in ... BIB files."
+    wxString ModifiedPaths() const; // one line for each file with unsaved changes
+
+    void Update_Tools();                         // enables the tools that apply now
+    void ShowEntry(BibEntry *entry, int file);   // fills the entry pane; null changes nothing
+    void OnSearch(wxCommandEvent &event);        // takes the text of a search field
+    void OnIndexChanged(wxCommandEvent &event);  // a row was selected
+    void OnIndexActivate(wxCommandEvent &event); // a row was double-clicked
+
+private:
+    enum { ROW_COUNT = 16 };
+
+    struct FieldRow {
+        wxStaticText *label;
+        wxTextCtrl *value;
+    };
+
+    void CreateEntryPane();
+    void CreateOpenPane();
+    wxStaticText *CreateHeading(wxWindow *parent, const wxString &text);
+    void Arrange();
+    void RefreshFiles(BibEntry *select);
+    void ShowSelection();
+    void ClearEntry();
+    void FillRow(int row, const BibField *field);
+    void LayOutEntry();
+    void UpdateSaveTool();
+    void ShowRow(const char *handler);
+    static void ShowBox(void *owner, const char *caption, const char *text);
+
+    void OnOpen(wxCommandEvent &event);
+    void OnSave(wxCommandEvent &event);
+    void OnShowMessages(wxCommandEvent &event);
+    void OnSashMove(wxSplitterEvent &event);
+
+    BibFileSet m_set = {};
+    CommandState *m_command;
+    BibEntry *m_entry = nullptr; // owned by its file; null whenever that may be freed
+    int m_file = -1;             // index of the file that holds m_entry
+    std::string m_search;        // store text
+    bool m_busy = false;         // saving or carrying out a command line
+
+    QListBox *m_list = nullptr; // child windows, made after the first files are loaded
+    wxScrolledWindow *m_entryPane = nullptr;
+    wxPanel *m_openPane = nullptr;
+    wxStaticText *m_fileName = nullptr;
+    wxStaticText *m_typeName = nullptr;
+    FieldRow m_rows[ROW_COUNT] = {};
+
+    wxDECLARE_EVENT_TABLE();
+};

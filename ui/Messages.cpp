@@ -1,0 +1,60 @@
+#include "ui/Messages.h"
+
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+
+#include "app/Companion.h"
+#include "ui/DisplayText.h"
+#include "ui/MessagesText.h"
+#include "ui/Theme.h"
+
+enum { ID_MESSAGES_TEXT = 6001 };
+
+// clang-format off
+wxBEGIN_EVENT_TABLE(Cartulo_Messages, wxDialog)
+    EVT_BUTTON(wxID_OK, Cartulo_Messages::OnOK)
+wxEND_EVENT_TABLE()
+    // clang-format on
+
+    static Colour HeadingColour(MessagesVerdict verdict)
+{
+    switch (verdict) {
+    case MESSAGES_ERRORS:
+        return {200, 0, 0};
+    case MESSAGES_WARNINGS:
+        return {0, 128, 0};
+    default:
+        return {0, 0, 128};
+    }
+}
+
+Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
+    : wxDialog(parent, wxID_ANY, "Bibliography File Loading Error Messages", wxDefaultPosition,
+               wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER)
+{
+    SetFont(wxFontInfo(10));
+    MessagesVerdict verdict = Messages_Verdict(set);
+    wxStaticText *heading = new wxStaticText(this, wxID_ANY, Messages_Heading(verdict));
+    Theme_SetTextColour(heading, HeadingColour(verdict));
+    wxTextCtrl *text =
+        new wxTextCtrl(this, ID_MESSAGES_TEXT, "There is no messages ...", wxDefaultPosition,
+                       wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY);
+    text->SetMinSize(FromDIP(wxSize(600, 200)));
+    text->ChangeValue(wxString(Messages_Text(set, PathTextWide)));
+
+    const int border = FromDIP(12);
+    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
+    column->Add(heading, wxSizerFlags().Border(wxALL, border));
+    column->Add(text, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
+    column->Add(CreateStdDialogButtonSizer(wxOK), wxSizerFlags().Expand().Border(wxALL, border));
+    SetSizerAndFit(column);
+    CentreOnParent();
+    FindWindow(wxID_OK)->SetFocus();
+}
+
+void Cartulo_Messages::OnOK(wxCommandEvent &event)
+{
+    TNSMessage("INFO: ", "Cartulo_Messages::OnOK", TNS_ACTION);
+    event.Skip(); // closes
+}

@@ -1,0 +1,9 @@
+// ui/Theme.h - texts in colour on light and dark desktops.
+#pragma once
+
+#include <wx/window.h>
+
+#include "ui/PanelRules.h"
+
+// Gives the window's text `colour`, or its readable twin when the desktop is dark.
+void Theme_SetTextColour(wxWindow *window, Colour colour);
