@@ -1,0 +1,306 @@
+#include "tests/gui/GuiTest.h"
+
+#include <chrono>
+#include <cstdlib>
+#include <cstring>
+#include <ostream>
+
+#include <wx/app.h>
+#include <wx/scrolwin.h>
+#include <wx/srchctrl.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+#include <wx/toolbar.h>
+
+#include "app/Ids.h"
+#include "app/LogGui.h"
+#include "ui/Cartulo.h"
+#include "ui/Messages.h"
+#include "ui/QListBox.h"
+
+// --- Dialogs ---
+
+static int dialogsAllowed = 0;
+
+AllowDialogs::AllowDialogs()
+{
+    ++dialogsAllowed;
+}
+
+AllowDialogs::~AllowDialogs()
+{
+    --dialogsAllowed;
+}
+
+int GuiTestHook::Enter(wxDialog *dialog)
+{
+    int answer = wxTestingModalHook::Enter(dialog);
+    return answer == wxID_NONE ? wxID_CANCEL : answer;
+}
+
+void GuiTestHook::ReportFailure(const wxString &message)
+{
+    ADD_FAILURE() << message;
+}
+
+// Outside of wxTEST_DIALOG.
+class NoDialogs : public wxModalDialogHook
+{
+protected:
+    int Enter(wxDialog *dialog) override
+    {
+        if (dialogsAllowed > 0)
+            return wxID_NONE;
+        wxMessageDialog *box = dynamic_cast<wxMessageDialog *>(dialog);
+        ADD_FAILURE() << "unexpected dialog: " << dialog->GetTitle() << ": "
+                      << (box ? box->GetMessage() : wxString());
+        return wxID_CANCEL;
+    }
+};
+
+ExpectBox::ExpectBox(const wxString &caption, const wxString &text, int button)
+    : m_caption(caption), m_text(text), m_button(button)
+{
+}
+
+int ExpectBox::OnInvoked(wxMessageDialog *dialog) const
+{
+    EXPECT_EQ(m_caption, dialog->GetTitle());
+    EXPECT_EQ(m_text, dialog->GetMessage());
+    return m_button;
+}
+
+wxString ExpectBox::GetDefaultDescription() const
+{
+    return "message box \"" + m_caption + "\": " + m_text;
+}
+
+ExpectMessages::ExpectMessages(const wxString &heading, wxString *text)
+    : m_heading(heading), m_text(text)
+{
+}
+
+template <class Control> static Control *FirstChild(wxWindow *window)
+{
+    for (wxWindow *child : window->GetChildren()) {
+        if (Control *control = dynamic_cast<Control *>(child))
+            return control;
+    }
+    return nullptr;
+}
+
+int ExpectMessages::OnInvoked(Cartulo_Messages *dialog) const
+{
+    EXPECT_EQ("Bibliography File Loading Error Messages", dialog->GetTitle());
+    EXPECT_EQ(m_heading, FirstChild<wxStaticText>(dialog)->GetLabelText());
+    if (m_text)
+        *m_text = FirstChild<wxTextCtrl>(dialog)->GetValue();
+    return wxID_OK;
+}
+
+wxString ExpectMessages::GetDefaultDescription() const
+{
+    return "messages window \"" + m_heading + "\"";
+}
+
+// --- The event loop ---
+
+bool WaitFor(const std::function<bool()> &condition, int milliseconds)
+{
+    using Clock = std::chrono::steady_clock;
+    Clock::time_point end = Clock::now() + std::chrono::milliseconds(milliseconds);
+    while (!condition()) {
+        if (Clock::now() > end)
+            return false;
+        wxYield();
+        wxMilliSleep(5);
+    }
+    return true;
+}
+
+void HandleQueuedEvents()
+{
+    wxTheApp->ProcessPendingEvents();
+}
+
+// --- The window ---
+
+void CartuloWindow::Open(const std::string &commandLine)
+{
+    frame = new MyFrame("Quarlo Cartulo", commandLine.c_str(), &state);
+    frame->Show();
+    ASSERT_TRUE(WaitFor([this] { return frame->IsShownOnScreen() && frame->IsActive(); }));
+}
+
+void CartuloWindow::TearDown()
+{
+    if (!frame)
+        return;
+    for (int i = 0; i < Panel()->Files()->count; ++i)
+        Panel()->Files()->files[i]->modified = 0;
+    frame->Destroy();
+    DeleteClosedWindows();
+    EXPECT_FALSE(frame);
+}
+
+QListBox *CartuloWindow::List() const
+{
+    return FirstChild<QListBox>(Panel());
+}
+
+wxScrolledWindow *CartuloWindow::EntryPane() const
+{
+    return FirstChild<wxScrolledWindow>(Panel());
+}
+
+wxSearchCtrl *CartuloWindow::Search() const
+{
+    return FirstChild<wxSearchCtrl>(frame->GetToolBar());
+}
+
+std::vector<wxString> CartuloWindow::Rows() const
+{
+    std::vector<wxString> rows;
+    for (size_t i = 0; i < List()->GetItemCount(); ++i)
+        rows.push_back(List()->GetItemText(i));
+    return rows;
+}
+
+std::vector<CartuloWindow::Field> CartuloWindow::ShownFields() const
+{
+    std::vector<Field> fields;
+    wxString label;
+    for (wxWindow *child : EntryPane()->GetChildren()) {
+        if (wxStaticText *text = dynamic_cast<wxStaticText *>(child))
+            label = text->GetLabelText();
+        wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(child);
+        if (value && value->IsShown())
+            fields.push_back({label, value->GetValue()});
+    }
+    return fields;
+}
+
+wxString CartuloWindow::TextAfter(const wxString &label) const
+{
+    bool found = false;
+    for (wxWindow *child : EntryPane()->GetChildren()) {
+        wxStaticText *text = dynamic_cast<wxStaticText *>(child);
+        if (text && found)
+            return text->GetLabelText();
+        found = text && text->GetLabelText() == label;
+    }
+    ADD_FAILURE() << "no text " << label;
+    return "";
+}
+
+wxString CartuloWindow::Status() const
+{
+    return frame->GetStatusBar()->GetStatusText(0);
+}
+
+bool CartuloWindow::SaveEnabled() const
+{
+    return frame->GetToolBar()->GetToolEnabled(ID_SAVE);
+}
+
+bool CartuloWindow::IsShowing(wxWindowID id) const
+{
+    wxWindow *window = Panel()->FindWindow(id);
+    return window && window->IsShownOnScreen();
+}
+
+void CartuloWindow::SearchFor(const wxString &text)
+{
+    Search()->SetValue(text);
+    HandleQueuedEvents();
+}
+
+void CartuloWindow::TypeIntoList(wxChar key, long time, int modifiers)
+{
+    wxKeyEvent event(wxEVT_CHAR);
+    event.m_keyCode = key;
+    event.m_uniChar = key;
+    event.SetAltDown((modifiers & wxMOD_ALT) != 0);
+    event.SetShiftDown((modifiers & wxMOD_SHIFT) != 0);
+    event.SetTimestamp(time);
+    List()->ProcessWindowEvent(event);
+}
+
+void CartuloWindow::PressShortcut(int key, bool alt, bool ctrl)
+{
+    wxKeyEvent event(wxEVT_CHAR_HOOK);
+    event.m_keyCode = key;
+    event.m_uniChar = key;
+    event.SetAltDown(alt);
+    event.SetControlDown(ctrl);
+    List()->ProcessWindowEvent(event);
+    HandleQueuedEvents();
+}
+
+void CartuloWindow::Press(wxWindowID button)
+{
+    wxWindow *window = Panel()->FindWindow(button);
+    ASSERT_TRUE(window) << "no button " << button;
+    wxCommandEvent event(wxEVT_BUTTON, button);
+    event.SetEventObject(window);
+    window->ProcessWindowEvent(event);
+    HandleQueuedEvents();
+}
+
+void CartuloWindow::Change(int file, const char *value)
+{
+    BibField *field = &Panel()->Files()->files[file]->entries->fields[0];
+    free(field->value);
+    field->value = Bib_CopyText(value, strlen(value));
+    Panel()->SetModified(file);
+}
+
+// --- The program ---
+
+class GuiTestApp : public wxApp
+{
+public:
+    bool OnInit() override
+    {
+        SetExitOnFrameDelete(false);
+        wxInitAllImageHandlers();
+        CallAfter([this] {
+            NoDialogs guard;
+            guard.Register();
+            m_result = RUN_ALL_TESTS();
+            ExitMainLoop();
+        });
+        return true;
+    }
+
+    int OnRun() override
+    {
+        wxApp::OnRun();
+        return m_result;
+    }
+
+    using wxApp::DeletePendingObjects;
+
+protected:
+    wxAppTraits *CreateTraits() override { return new MyAppTraits; }
+
+private:
+    int m_result = 1;
+};
+
+wxIMPLEMENT_APP_NO_MAIN(GuiTestApp);
+wxDECLARE_APP(GuiTestApp);
+
+void DeleteClosedWindows()
+{
+    wxGetApp().DeletePendingObjects();
+}
+
+int main(int argc, char **argv)
+{
+    testing::InitGoogleTest(&argc, argv);
+    if (testing::GTEST_FLAG(list_tests))
+        return RUN_ALL_TESTS();
+    Log_SetUpToolkit();
+    return wxEntry(argc, argv);
+}

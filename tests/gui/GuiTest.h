@@ -1,0 +1,115 @@
+// tests/gui/GuiTest.h - tests of the windows, inside the running event loop.
+//
+// Every dialog that a test opens is answered by what it expects in wxTEST_DIALOG; any other one
+// fails the test and is cancelled, so that none can wait for a user.
+#pragma once
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include <wx/msgdlg.h>
+#include <wx/weakref.h>
+
+#include "app/MyFrame.h"
+#include "tests/support/TempFolder.h"
+
+// Reports through GoogleTest.
+class GuiTestHook;
+#define wxTEST_DIALOG_HOOK_CLASS GuiTestHook
+#include <wx/testing.h>
+
+class GuiTestHook : public wxTestingModalHook
+{
+public:
+    using wxTestingModalHook::wxTestingModalHook;
+
+protected:
+    int Enter(wxDialog *dialog) override;
+    void ReportFailure(const wxString &message) override;
+};
+
+// A message box with this caption and text; `button` closes it.
+class ExpectBox : public wxExpectModalBase<wxMessageDialog, ExpectBox>
+{
+public:
+    ExpectBox(const wxString &caption, const wxString &text, int button);
+
+protected:
+    int OnInvoked(wxMessageDialog *dialog) const override;
+    wxString GetDefaultDescription() const override;
+
+private:
+    wxString m_caption, m_text;
+    int m_button;
+};
+
+// The loading-messages window with this heading; `text` (may be null) receives its text.
+class Cartulo_Messages;
+class ExpectMessages : public wxExpectModalBase<Cartulo_Messages, ExpectMessages>
+{
+public:
+    explicit ExpectMessages(const wxString &heading, wxString *text = nullptr);
+
+protected:
+    int OnInvoked(Cartulo_Messages *dialog) const override;
+    wxString GetDefaultDescription() const override;
+
+private:
+    wxString m_heading;
+    wxString *m_text;
+};
+
+// While one lives, dialogs of the program are really shown.
+class AllowDialogs
+{
+public:
+    AllowDialogs();
+    ~AllowDialogs();
+};
+
+// Lets the program run until the condition holds; false when it does not within the deadline.
+bool WaitFor(const std::function<bool()> &condition, int milliseconds = 5000);
+
+void HandleQueuedEvents();
+void DeleteClosedWindows(); // as the event loop does when it is idle
+
+// A window on files of a temporary folder.
+class CartuloWindow : public testing::Test
+{
+protected:
+    struct Field {
+        wxString label, value;
+        bool operator==(const Field &o) const { return label == o.label && value == o.value; }
+    };
+
+    void TearDown() override; // changes that are left are dropped
+
+    // Opens the window with a command line, and waits until it is active.
+    void Open(const std::string &commandLine);
+
+    Cartulo *Panel() const { return frame->Panel(); }
+    class QListBox *List() const;
+    class wxSearchCtrl *Search() const;
+    wxScrolledWindow *EntryPane() const;
+    std::vector<wxString> Rows() const;              // texts of the list
+    std::vector<Field> ShownFields() const;          // rows of the entry pane
+    wxString TextAfter(const wxString &label) const; // the static text that follows another one
+    wxString Status() const;
+    bool SaveEnabled() const;
+    bool IsShowing(wxWindowID id) const;
+
+    void SearchFor(const wxString &text);
+    void TypeIntoList(wxChar key, long time, int modifiers = 0);
+    void PressShortcut(int key, bool alt, bool ctrl); // as the frame sees it first
+    void Press(wxWindowID button);
+
+    // Changes the first field of the first file's first entry.
+    void Change(int file, const char *value);
+
+    TempFolder folder;
+    CommandState state = {};
+    wxWeakRef<MyFrame> frame;
+};

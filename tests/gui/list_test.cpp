@@ -1,0 +1,199 @@
+// The entry list in the window: rows, search, type-ahead.
+
+#include "tests/gui/GuiTest.h"
+
+#include <cstring>
+
+#include <wx/srchctrl.h>
+#include <wx/scrolwin.h>
+#include <wx/textctrl.h>
+
+#include "app/Ids.h"
+#include "ui/Cartulo.h"
+#include "ui/QListBox.h"
+
+class ListInWindow : public CartuloWindow
+{
+protected:
+    void SetUp() override
+    {
+        std::string animals = folder.Write("animals.bib", "@book{zebra, title = {Stripes}}\n"
+                                                          "@book{Aba, title = {Letters}}\n"
+                                                          "@book{abe, title = {Monkeys}}\n");
+        std::string plants = folder.Write("plants.bib", "@misc{knuth84, note = {Oak}}\n"
+                                                        "@misc{knight, note = {Monkey puzzle}}\n");
+        Open(animals + " " + plants);
+    }
+
+    wxString Selected() const
+    {
+        int row = List()->GetSelection();
+        return row < 0 ? wxString("none") : List()->GetItemText(row);
+    }
+};
+
+TEST_F(ListInWindow, ShowsAllEntriesOfAllFilesSorted)
+{
+    std::vector<wxString> expected = {"Aba (animals)", "abe (animals)", "knight (plants)",
+                                      "knuth84 (plants)", "zebra (animals)"};
+    EXPECT_EQ(expected, Rows());
+    EXPECT_EQ("Aba (animals)", Selected());
+    EXPECT_EQ("There are 5 bibliography entries in 2 BIB files.", Status());
+}
+
+TEST_F(ListInWindow, ShowsTheEntryOfTheSelectedRow)
+{
+    EXPECT_EQ("book", TextAfter("Entry Type:"));
+    EXPECT_EQ(folder.Path("animals.bib"), TextAfter("BIB File:"));
+    EXPECT_EQ((std::vector<Field>{{"title", "Letters"}}), ShownFields());
+    List()->SetSelection(2);
+    wxCommandEvent event(wxEVT_LISTBOX, ID_INDEX);
+    List()->ProcessWindowEvent(event);
+    EXPECT_EQ("misc", TextAfter("Entry Type:"));
+    EXPECT_EQ(folder.Path("plants.bib"), TextAfter("BIB File:"));
+    EXPECT_EQ((std::vector<Field>{{"note", "Monkey puzzle"}}), ShownFields());
+}
+
+TEST_F(ListInWindow, NarrowsToWhatTheSearchFinds)
+{
+    SearchFor("MONKEY");
+    EXPECT_EQ((std::vector<wxString>{"abe (animals)", "knight (plants)"}), Rows());
+    EXPECT_EQ("abe (animals)", Selected());
+    EXPECT_EQ((std::vector<Field>{{"title", "Monkeys"}}), ShownFields());
+}
+
+TEST_F(ListInWindow, SearchesValuesAndNotKeys)
+{
+    SearchFor("knuth");
+    EXPECT_TRUE(Rows().empty());
+}
+
+TEST_F(ListInWindow, ShowsAnEmptyPaneWhenNothingIsFound)
+{
+    SearchFor("nowhere");
+    EXPECT_TRUE(Rows().empty());
+    EXPECT_EQ("none", Selected());
+    EXPECT_TRUE(ShownFields().empty());
+    EXPECT_EQ(nullptr, Panel()->CurrentEntry());
+    EXPECT_TRUE(IsShowing(ID_INDEX));
+    SearchFor("");
+    EXPECT_EQ(5u, Rows().size());
+    EXPECT_EQ(1u, ShownFields().size());
+}
+
+TEST_F(ListInWindow, KeepsTheEntryThatWasFoundWhenTheSearchIsCleared)
+{
+    SearchFor("puzzle");
+    SearchFor("");
+    EXPECT_EQ("knight (plants)", Selected());
+    EXPECT_EQ((std::vector<Field>{{"note", "Monkey puzzle"}}), ShownFields());
+}
+
+TEST_F(ListInWindow, RefusesASearchFromElsewhere)
+{
+    wxCommandEvent event(wxEVT_TEXT, ID_SEARCH);
+    event.SetEventObject(List());
+    event.SetString("Oak");
+    frame->ProcessWindowEvent(event);
+    EXPECT_EQ(5u, Rows().size());
+}
+
+TEST_F(ListInWindow, FindsAKeyByItsFirstLetters)
+{
+    TypeIntoList('k', 1000);
+    EXPECT_EQ("knight (plants)", Selected());
+    TypeIntoList('n', 1500);
+    TypeIntoList('u', 2500); // exactly a second later
+    EXPECT_EQ("knuth84 (plants)", Selected());
+    EXPECT_EQ("knu", Status());
+    EXPECT_EQ((std::vector<Field>{{"note", "Oak"}}), ShownFields());
+}
+
+TEST_F(ListInWindow, StartsAnewAfterMoreThanASecond)
+{
+    TypeIntoList('k', 1000);
+    TypeIntoList('z', 2001);
+    EXPECT_EQ("zebra (animals)", Selected());
+    EXPECT_EQ("z", Status());
+}
+
+TEST_F(ListInWindow, KeepsSelectionAndPrefixWhenALetterMatchesNothing)
+{
+    TypeIntoList('k', 1000);
+    TypeIntoList('q', 1100);
+    EXPECT_EQ("knight (plants)", Selected());
+    EXPECT_EQ("k", Status());
+    TypeIntoList('n', 1200);
+    TypeIntoList('u', 1300);
+    EXPECT_EQ("knuth84 (plants)", Selected());
+}
+
+TEST_F(ListInWindow, StartsAnewAfterAnotherRowWasSelected)
+{
+    TypeIntoList('k', 1000);
+    List()->SetSelection(4);
+    TypeIntoList('a', 1100);
+    EXPECT_EQ("Aba (animals)", Selected()); // not "ka"
+}
+
+TEST_F(ListInWindow, LeavesModifiedKeysAlone)
+{
+    TypeIntoList('z', 1000, wxMOD_ALT);
+    TypeIntoList('z', 1000, wxMOD_SHIFT);
+    TypeIntoList(0, 1000);
+    EXPECT_EQ("Aba (animals)", Selected());
+}
+
+TEST_F(ListInWindow, ReturnsZeroWithoutFilesAndNeverReadsTheOldRows)
+{
+    EXPECT_EQ(1, List()->Update_Index(nullptr, ""));
+    Panel()->ProcessCommand("", "test"); // closes all files
+    EXPECT_EQ(0, List()->Update_Index(nullptr, ""));
+    EXPECT_EQ(-1, List()->GetSelection());
+    EXPECT_EQ(nullptr, List()->Item(0));
+    EXPECT_EQ("", List()->GetItemText(0));
+}
+
+TEST_F(ListInWindow, ShowsSixteenFieldsAtMost)
+{
+    std::string text = "@misc{many";
+    for (int i = 10; i < 30; ++i)
+        text += ", field" + std::to_string(i) + " = {" + std::to_string(i) + "}";
+    Panel()->ProcessCommand(folder.Write("many.bib", text + "}\n").c_str(), "test");
+    std::vector<Field> fields = ShownFields();
+    ASSERT_EQ(16u, fields.size());
+    EXPECT_EQ((Field{"field10", "10"}), fields.front());
+    EXPECT_EQ((Field{"field25", "25"}), fields.back());
+    EXPECT_GT(EntryPane()->GetVirtualSize().y, EntryPane()->GetClientSize().y) << "must scroll";
+}
+
+TEST_F(ListInWindow, ShowsTextsInTheSelectedCodePage)
+{
+    std::string path =
+        folder.Write("o.bib", "@misc{\xFCn, title = {M\xFCnchen \\& 100\x80} # jan}\n");
+    Panel()->ProcessCommand(path.c_str(), "test");
+    EXPECT_EQ((std::vector<wxString>{L"\u00FCn (o)"}), Rows());
+    EXPECT_EQ(L"M\u00FCnchen \\& 100\u20AC\u00ABjan\u00BB", ShownFields().at(0).value);
+}
+
+TEST_F(ListInWindow, ShowsFileNamesInTheSystemsEncoding)
+{
+    std::string path = folder.Write("M\xC3\xBCller.bib", "@misc{a, note = {n}}\n");
+    Panel()->ProcessCommand(("\"" + path + "\"").c_str(), "test");
+    EXPECT_EQ((std::vector<wxString>{L"a (M\u00FCller)"}), Rows());
+    EXPECT_TRUE(TextAfter("BIB File:").EndsWith(L"/M\u00FCller.bib"));
+}
+
+TEST_F(ListInWindow, HintsAtAValueThatIsTooLongForItsControl)
+{
+    std::string path =
+        folder.Write("long.bib", "@misc{a, note = {" + std::string(70000, 'x') + "}, x = {y}}\n");
+    Panel()->ProcessCommand(path.c_str(), "test");
+    std::vector<wxString> hints;
+    for (wxWindow *child : EntryPane()->GetChildren()) {
+        if (child->IsShown() && dynamic_cast<wxTextCtrl *>(child))
+            hints.push_back(child->GetToolTipText());
+    }
+    EXPECT_EQ((std::vector<wxString>{"This value is too long to be shown in full.", ""}), hints);
+    EXPECT_EQ(70000u, strlen(Panel()->CurrentEntry()->fields[0].value));
+}

@@ -1,0 +1,451 @@
+// The window: files, saving, messages, keys, colours.
+
+#include "tests/gui/GuiTest.h"
+
+#include <csignal>
+#include <filesystem>
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <wx/button.h>
+#include <wx/scrolwin.h>
+#include <wx/settings.h>
+#include <wx/srchctrl.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+#include <wx/toolbar.h>
+
+#include "app/Ids.h"
+#include "store/Sys.h"
+#include "ui/Cartulo.h"
+#include "ui/Messages.h"
+#include "ui/PanelRules.h"
+#include "ui/QListBox.h"
+
+using Window = CartuloWindow;
+
+static const char OneEntry[] = "@book{one, title = {First}}\n";
+
+// --- Files ---
+
+TEST_F(Window, OffersToOpenAFileWhenNoneIsNamed)
+{
+    Open("");
+    EXPECT_TRUE(IsShowing(ID_OPEN));
+    EXPECT_FALSE(IsShowing(ID_INDEX));
+    EXPECT_FALSE(EntryPane()->IsShownOnScreen());
+    EXPECT_EQ("There are 0 bibliography entries in 0 BIB files.", Status());
+}
+
+// Lets the file dialog be shown, as it knows its path only then, and answers it.
+class AnswerFileDialog : public wxModalDialogHook
+{
+public:
+    explicit AnswerFileDialog(const wxString &path) : m_path(path) { Register(); }
+
+    wxString title, wildcard;
+
+protected:
+    int Enter(wxDialog *shown) override
+    {
+        wxFileDialog *dialog = dynamic_cast<wxFileDialog *>(shown);
+        if (!dialog)
+            return wxID_NONE;
+        title = dialog->GetMessage();
+        wildcard = dialog->GetWildcard();
+        dialog->CallAfter([this, dialog] {
+            bool ready = WaitFor([&] {
+                dialog->SetPath(m_path);
+                return dialog->GetPath() == m_path;
+            });
+            dialog->EndModal(ready ? wxID_OK : wxID_CANCEL);
+        });
+        return wxID_NONE;
+    }
+
+private:
+    wxString m_path;
+};
+
+TEST_F(Window, OpensTheFileThatTheDialogNames)
+{
+    std::string path = folder.Write("with blank.bib", OneEntry);
+    Open("");
+    AllowDialogs allow;
+    AnswerFileDialog answer(path);
+    Press(ID_OPEN);
+    EXPECT_EQ("Open BIB file", answer.title);
+    EXPECT_EQ("BIB files (*.bib)|*.bib", answer.wildcard);
+    EXPECT_EQ((std::vector<wxString>{"one (with blank)"}), Rows());
+    EXPECT_FALSE(IsShowing(ID_OPEN));
+    EXPECT_TRUE(IsShowing(ID_INDEX));
+    EXPECT_EQ("There are 1 bibliography entries in 1 BIB files.", Status());
+}
+
+TEST_F(Window, GoesBackToTheOpenPaneWhenTheLastFileIsClosed)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    EXPECT_NE(nullptr, Panel()->CurrentEntry());
+    Panel()->ProcessCommand("", "test");
+    EXPECT_EQ(nullptr, Panel()->CurrentEntry());
+    EXPECT_TRUE(IsShowing(ID_OPEN));
+    EXPECT_FALSE(IsShowing(ID_INDEX));
+    frame->Refresh();
+    wxYield(); // draws
+}
+
+TEST_F(Window, ShowsAnEmptyLibraryAsAnEmptyList)
+{
+    Open(folder.Write("new.bib", ""));
+    EXPECT_TRUE(IsShowing(ID_INDEX));
+    EXPECT_FALSE(IsShowing(ID_OPEN));
+    EXPECT_TRUE(ShownFields().empty());
+}
+
+TEST_F(Window, LetsGoOfEntriesOfFilesThatACommandLineDrops)
+{
+    std::string a = folder.Write("a.bib", OneEntry);
+    std::string b = folder.Write("b.bib", "@misc{two, note = {Second}}\n");
+    Open(a);
+    Panel()->ProcessCommand(b.c_str(), "test");
+    EXPECT_EQ((std::vector<wxString>{"two (b)"}), Rows());
+    EXPECT_EQ((std::vector<Field>{{"note", "Second"}}), ShownFields());
+    ASSERT_NE(nullptr, Panel()->CurrentEntry());
+    EXPECT_STREQ("two", Panel()->CurrentEntry()->key);
+}
+
+TEST_F(Window, KeepsTheShownEntryWhenItsFileStaysOpen)
+{
+    std::string a = folder.Write("a.bib", std::string(OneEntry) + "@misc{two, note = {Second}}\n");
+    std::string b = folder.Write("b.bib", "@misc{aaa, note = {Third}}\n");
+    Open(a);
+    TypeIntoList('t', 1000);
+    Panel()->ProcessCommand((b + " " + a).c_str(), "test");
+    EXPECT_EQ(3u, Rows().size());
+    EXPECT_EQ((std::vector<Field>{{"note", "Second"}}), ShownFields());
+    EXPECT_EQ(a, TextAfter("BIB File:"));
+}
+
+// Another process that holds the lock of a file.
+class OtherProgram
+{
+public:
+    explicit OtherProgram(const std::string &path)
+    {
+        int ready[2];
+        EXPECT_EQ(0, pipe(ready));
+        m_process = fork();
+        if (m_process == 0) {
+            char answer = Sys_LockFile(path.c_str()) ? 'y' : 'n';
+            if (write(ready[1], &answer, 1) != 1)
+                _exit(1);
+            for (;;)
+                pause();
+        }
+        char answer = 0;
+        EXPECT_EQ(1, read(ready[0], &answer, 1));
+        EXPECT_EQ('y', answer);
+        close(ready[0]);
+        close(ready[1]);
+    }
+
+    ~OtherProgram()
+    {
+        kill(m_process, SIGKILL);
+        waitpid(m_process, nullptr, 0);
+    }
+
+private:
+    pid_t m_process;
+};
+
+TEST_F(Window, SaysThatAFileIsLockedElsewhere)
+{
+    std::string path = folder.Write("taken.bib", OneEntry);
+    OtherProgram other(path);
+    ASSERT_EQ(0, Sys_LockFile(path.c_str()));
+    wxString text = "File: `" + path + "'\n" + Sys_LastErrorText();
+    wxString messages;
+    wxTEST_DIALOG((Open(path), HandleQueuedEvents()), ExpectBox("Openning BIB file", text, wxID_OK),
+                  ExpectMessages("There are errors in loading BIB files", &messages));
+    EXPECT_EQ("ERROR: " + text + "\n", messages);
+    EXPECT_EQ(0, Panel()->Files()->count);
+    EXPECT_TRUE(IsShowing(ID_OPEN));
+}
+
+// --- Messages ---
+
+TEST_F(Window, ShowsTheMessagesOfABrokenFile)
+{
+    std::string path = folder.Write("broken.bib", "@book{one, title = {First} year = 3}\n");
+    wxString text;
+    wxTEST_DIALOG((Open(path), HandleQueuedEvents()),
+                  ExpectMessages("There are errors in loading BIB files", &text));
+    EXPECT_TRUE(text.StartsWith("The file: '" + path + "' has 1 error:\nSYNTAX ERROR: line 1: "))
+        << text;
+    EXPECT_TRUE(frame->GetToolBar()->FindById(ID_MESSAGES));
+    wxTEST_DIALOG(PressShortcut('M', true, false),
+                  ExpectMessages("There are errors in loading BIB files"));
+}
+
+TEST_F(Window, NamesAFileThatIsMissing)
+{
+    wxString text;
+    wxTEST_DIALOG((Open("/nowhere/gone.bib"), HandleQueuedEvents()),
+                  ExpectMessages("There are errors in loading BIB files", &text));
+    EXPECT_EQ("ERROR: The file '/nowhere/gone.bib' not found\n", text);
+    EXPECT_FALSE(frame->GetToolBar()->FindById(ID_MESSAGES)); // no file has counts
+}
+
+TEST_F(Window, HasMessagesOnRequestOnlyWhenAllIsWell)
+{
+    std::string path = folder.Write("a.bib", OneEntry);
+    Open(path);
+    EXPECT_FALSE(frame->GetToolBar()->FindById(ID_MESSAGES));
+    wxString text;
+    wxTEST_DIALOG(PressShortcut('M', false, true),
+                  ExpectMessages("There is no any messages related with loading BIB-files", &text));
+    EXPECT_EQ("The file: '" + path + "':\n\n", text);
+}
+
+TEST_F(Window, ClosesTheMessagesWithItsButton)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    AllowDialogs allow;
+    Cartulo_Messages dialog(frame, Panel()->Files());
+    dialog.CallAfter([&] {
+        EXPECT_TRUE(WaitFor([&] { return dialog.IsShownOnScreen(); }));
+        wxCommandEvent press(wxEVT_BUTTON, wxID_OK);
+        dialog.FindWindow(wxID_OK)->ProcessWindowEvent(press);
+    });
+    EXPECT_EQ(wxID_OK, dialog.ShowModal());
+}
+
+// --- Saving ---
+
+TEST_F(Window, SavesAModifiedFileThroughItsTool)
+{
+    std::string path = folder.Write("a.bib", OneEntry);
+    Open(path);
+    EXPECT_FALSE(SaveEnabled());
+    Change(0, "Changed");
+    EXPECT_TRUE(SaveEnabled());
+    wxCommandEvent tool(wxEVT_TOOL, ID_SAVE);
+    frame->GetToolBar()->ProcessWindowEvent(tool);
+    EXPECT_FALSE(SaveEnabled());
+    EXPECT_EQ(0, Panel()->Files()->files[0]->modified);
+
+    // The same record, saved elsewhere, gives the same bytes.
+    std::string twin = folder.Write("twin.bib", "@book{one, title = {Changed}}\n");
+    BibFile *file = Bib_LoadFile(twin.c_str());
+    file->modified = 1;
+    ASSERT_EQ(1, Bib_SaveFile(file));
+    Bib_FreeFile(file);
+    EXPECT_EQ(folder.Read("twin.bib"), folder.Read("a.bib"));
+    EXPECT_NE(std::string::npos, folder.Read("a.bib").find("Changed"));
+    EXPECT_NE(0, Panel()->Files()->files[0]->lockHandle) << "must be locked again";
+}
+
+TEST_F(Window, SavesWithItsShortcuts)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    Change(0, "With Alt");
+    PressShortcut('B', true, false);
+    EXPECT_NE(std::string::npos, folder.Read("a.bib").find("With Alt"));
+    Change(0, "With Ctrl");
+    PressShortcut('b', false, true);
+    EXPECT_NE(std::string::npos, folder.Read("a.bib").find("With Ctrl"));
+    EXPECT_FALSE(SaveEnabled());
+}
+
+class SaveQuestion : public CartuloWindow
+{
+protected:
+    void SetUp() override
+    {
+        std::string a = folder.Write("a.bib", OneEntry), b = folder.Write("b.bib", OneEntry),
+                    c = folder.Write("c.bib", OneEntry);
+        Open(a + " " + b + " " + c);
+        Change(0, "Changed");
+        Change(2, "Changed");
+        question =
+            "There are modified Bib-files:\n\n" + a + "\n" + c + "\n\nDo you want to save them ?";
+    }
+
+    bool IsSaved(const char *name) const
+    {
+        return folder.Read(name).find("Changed") != std::string::npos;
+    }
+
+    wxString caption = "Save Bibliography File - Question";
+    wxString question;
+    int result = 2;
+};
+
+TEST_F(SaveQuestion, SavesOnYes)
+{
+    wxTEST_DIALOG(result = Panel()->SaveAll(false), ExpectBox(caption, question, wxID_YES));
+    EXPECT_EQ(1, result);
+    EXPECT_TRUE(IsSaved("a.bib") && IsSaved("c.bib"));
+    EXPECT_FALSE(SaveEnabled());
+}
+
+TEST_F(SaveQuestion, SavesNothingOnNo)
+{
+    wxTEST_DIALOG(result = Panel()->SaveAll(false), ExpectBox(caption, question, wxID_NO));
+    EXPECT_EQ(0, result);
+    EXPECT_FALSE(IsSaved("a.bib") || IsSaved("c.bib"));
+    EXPECT_TRUE(SaveEnabled());
+}
+
+TEST_F(SaveQuestion, ReportsCancel)
+{
+    wxTEST_DIALOG(result = Panel()->SaveAll(false), ExpectBox(caption, question, wxID_CANCEL));
+    EXPECT_EQ(-1, result);
+    EXPECT_FALSE(IsSaved("a.bib") || IsSaved("c.bib"));
+    EXPECT_TRUE(SaveEnabled());
+}
+
+TEST_F(SaveQuestion, IsNotAskedWhenQuiet)
+{
+    EXPECT_EQ(1, Panel()->SaveAll(true));
+    EXPECT_TRUE(IsSaved("a.bib") && IsSaved("c.bib"));
+}
+
+TEST_F(SaveQuestion, IsNotAskedWithoutChanges)
+{
+    EXPECT_EQ(1, Panel()->SaveAll(true));
+    EXPECT_EQ(0, Panel()->SaveAll(false));
+    EXPECT_EQ(0, Panel()->SaveAll(true));
+}
+
+TEST_F(SaveQuestion, IsNotAskedWhenTheProgramLosesTheFocus)
+{
+    frame->OnDeactivation();
+    EXPECT_TRUE(IsSaved("a.bib") && IsSaved("c.bib"));
+}
+
+TEST_F(SaveQuestion, IsNotAskedWhenTheWindowCloses)
+{
+    frame->Close();
+    DeleteClosedWindows();
+    EXPECT_FALSE(frame);
+    EXPECT_TRUE(IsSaved("a.bib") && IsSaved("c.bib"));
+}
+
+TEST_F(Window, ForgetsNoChangeWhenAFileCannotBeSaved)
+{
+    std::filesystem::create_directory(folder.Path("gone"));
+    std::string path = folder.Write("gone/a.bib", OneEntry);
+    Open(path);
+    Change(0, "Changed");
+    std::filesystem::remove_all(folder.Path("gone"));
+    // Neither the file nor its lock can be had again.
+    EXPECT_EQ(0, Sys_LockFile(path.c_str()));
+    wxString reason = Sys_LastErrorText();
+    ExpectBox lock("ReLocking BIB file", "File: `" + path + "'\n" + reason, wxID_OK);
+    int result = 2;
+    wxTEST_DIALOG(result = Panel()->SaveAll(true), lock);
+    EXPECT_EQ(0, result);
+    EXPECT_TRUE(SaveEnabled());
+    EXPECT_EQ("ERROR: Can't save all modified BIB files.", Status());
+
+    wxString caption = "Save Bibliography File - Question";
+    wxString question = "These Bib-files can't be saved:\n\n" + path +
+                        "\n\nDo you want to close and to lose the changes ?";
+    wxTEST_DIALOG(frame->Close(), ExpectBox(caption, question, wxID_NO));
+    ASSERT_TRUE(frame);
+    EXPECT_FALSE(frame->IsBeingDeleted());
+    wxTEST_DIALOG(frame->Close(), ExpectBox(caption, question, wxID_YES));
+    DeleteClosedWindows();
+    EXPECT_FALSE(frame);
+}
+
+TEST_F(Window, IgnoresAModificationOfNoFile)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    Panel()->SetModified(-1);
+    Panel()->SetModified(1);
+    EXPECT_FALSE(SaveEnabled());
+}
+
+// --- Commands and keys ---
+
+TEST_F(Window, PassesNoCommandBackAndForth)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    for (int id : {ID_COMMAND_FIRST + 0, ID_OPEN + 0, 6005, ID_COMMAND_LAST + 0}) {
+        wxCommandEvent event(wxEVT_MENU, id);
+        EXPECT_FALSE(Panel()->ProcessWindowEvent(event));
+        EXPECT_FALSE(frame->ProcessWindowEvent(event));
+    }
+}
+
+TEST_F(Window, PutsTheFocusIntoTheSearchField)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+    PressShortcut('F', false, true);
+    EXPECT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
+}
+
+TEST_F(Window, ClearsTheStatusLineWithEachKey)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    EXPECT_NE("", Status());
+    PressShortcut('X', false, false);
+    EXPECT_EQ("", Status());
+}
+
+TEST_F(Window, ClosesOnTheCommandsForIt)
+{
+    for (int id : {ID_CLOSE + 0, ID_EXIT + 0}) {
+        Open(folder.Write("a.bib", OneEntry));
+        wxCommandEvent event(wxEVT_MENU, id);
+        frame->ProcessWindowEvent(event);
+        DeleteClosedWindows();
+        EXPECT_FALSE(frame);
+    }
+}
+
+TEST_F(Window, IsNotSmallerThanItsMinimum)
+{
+    Open("");
+    EXPECT_EQ(frame->FromDIP(wxSize(512, 512)), frame->GetMinSize());
+    EXPECT_EQ(frame->FromDIP(wxSize(800, 600)), frame->GetSize());
+}
+
+// --- Colours ---
+
+static Colour Of(const wxColour &colour)
+{
+    return {colour.Red(), colour.Green(), colour.Blue()};
+}
+
+static void CheckTexts(wxWindow *window)
+{
+    for (wxWindow *child : window->GetChildren()) {
+        if (wxStaticText *text = dynamic_cast<wxStaticText *>(child)) {
+            EXPECT_GE(
+                Panel_Contrast(Of(text->GetForegroundColour()), Of(text->GetBackgroundColour())),
+                4.5)
+                << text->GetLabelText();
+        }
+        CheckTexts(child);
+    }
+}
+
+// Runs on a light and on a dark desktop.
+TEST_F(Window, HasReadableColours)
+{
+    const char *theme = getenv("GTK_THEME");
+    bool dark = theme && wxString(theme).Contains("dark");
+    ASSERT_EQ(dark, wxSystemSettings::GetAppearance().IsUsingDarkBackground());
+    Open(folder.Write("a.bib", OneEntry));
+    CheckTexts(frame);
+    Cartulo_Messages messages(frame, Panel()->Files());
+    CheckTexts(&messages);
+    auto colour = [](wxSystemColour index) { return Of(wxSystemSettings::GetColour(index)); };
+    EXPECT_GE(Panel_Contrast(colour(wxSYS_COLOUR_LISTBOXTEXT), colour(wxSYS_COLOUR_LISTBOX)), 4.5);
+}
