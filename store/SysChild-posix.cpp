@@ -45,6 +45,7 @@ int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument
     int ends[2];
     if (pipe2(ends, O_CLOEXEC) != 0)
         return 0;
+    fcntl(ends[1], F_SETPIPE_SZ, 1 << 20); // fewer switches between the two; it may be refused
     fflush(nullptr); // else the child would hold, and perhaps write, unwritten lines of ours
     pid_t pid = fork();
     if (pid < 0) {
