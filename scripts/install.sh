@@ -2,10 +2,10 @@
 # Installs the Debian packages that are missing: install.sh build [screen] [test]
 set -eu
 
-build="g++ cmake ninja-build ccache libwxgtk3.2-dev libbtparse-dev libgtest-dev libgmock-dev
-       libbenchmark-dev"
+build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libbtparse-dev
+       libgtest-dev libbenchmark-dev"
 # A private screen with a window manager, and pictures of it.
-screen="xvfb openbox dbus-daemon xdotool imagemagick fonts-dejavu-core adwaita-icon-theme"
+screen="xvfb openbox x11-utils dbus-daemon xdotool imagemagick fonts-dejavu-core adwaita-icon-theme"
 test="locales python3"
 
 missing=

@@ -38,6 +38,6 @@ until_done find_window || { echo "The editor showed no window." >&2; exit 1; }
 until_done is_drawn || { echo "The editor's window was not drawn." >&2; exit 1; }
 rm -f "$picture.before"
 
-xdotool windowquit "$window"
+xdotool windowactivate --sync "$window" key alt+F4
 trap - EXIT
 wait "$program"

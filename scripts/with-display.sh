@@ -42,6 +42,7 @@ read -r -t "$seconds" number <&4 || fail "the screen did not start"
 exec 4<&-
 
 export DISPLAY=:$number GDK_BACKEND=x11
+export NO_AT_BRIDGE=${NO_AT_BRIDGE-1} # the accessibility bus would only add noise
 unset WAYLAND_DISPLAY
 
 openbox --sm-disable >"$work/manager.log" 2>&1 &
