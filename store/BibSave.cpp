@@ -16,8 +16,17 @@
 struct Output {
     FILE *stream;
     size_t used;
-    char block[64 * 1024];
+    char block[1024 * 1024];
 };
+
+// Too large for the stack; one serves all, as nothing here runs twice at a time.
+static Output *StartOutput(FILE *stream)
+{
+    static Output output;
+    output.stream = stream;
+    output.used = 0;
+    return &output;
+}
 
 static void Flush(Output *out)
 {
@@ -77,32 +86,22 @@ static void OpenMacro(Output *out, ValueState *state, const char *value)
     JoinPiece(out, state);
 }
 
-static void PutBrace(Output *out, ValueState *state, char brace)
+// The bytes of a run that can be copied as they are: up to a mark or to a brace that closes
+// nothing. Counts the braces in them.
+static size_t PlainLength(const char *text, long *depth)
 {
-    if (state->inRun && brace == '{')
-        ++state->depth;
-    else if (state->inRun && state->depth > 0)
-        --state->depth;
-    else if (state->inRun) {
-        AppLog("WARNING: ", "not opened extra braces, prepended by brace.");
-        Put(out, "{", 1);
-    }
-    Put(out, &brace, 1);
-}
-
-// Bytes up to the next brace or mark.
-static size_t PlainLength(const char *text)
-{
-    size_t length = 0;
-    for (;; ++length) {
-        unsigned char c = static_cast<unsigned char>(text[length]);
-        if (c == '{' || c == '}' || c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION ||
-            c == 0)
-            return length;
+    for (const char *at = text;; ++at) {
+        at += strcspn(at, "\2\5{}");
+        if (*at == '{')
+            ++*depth;
+        else if (*at == '}' && *depth > 0)
+            --*depth;
+        else
+            return static_cast<size_t>(at - text);
     }
 }
 
-// Writes one brace or a stretch of plain text; returns what follows.
+// Writes what follows up to the next mark, or a part of it; returns what follows that.
 static const char *PutText(Output *out, ValueState *state, const char *text)
 {
     if (state->macroDepth == 0 && !state->inRun) {
@@ -111,20 +110,27 @@ static const char *PutText(Output *out, ValueState *state, const char *text)
         state->inRun = 1;
     }
     state->notFirst = 1;
-    size_t length = PlainLength(text);
-    if (length > 0) {
-        Put(out, text, length);
+    size_t length = state->inRun ? PlainLength(text, &state->depth) : strcspn(text, "\2\5");
+    Put(out, text, length);
+    if (text[length] != '}')
         return text + length;
-    }
-    PutBrace(out, state, *text);
-    return text + 1;
+    AppLog("WARNING: ", "not opened extra braces, prepended by brace.");
+    Put(out, "{}", 2);
+    return text + length + 1;
+}
+
+static int IsNumber(const char *value)
+{
+    const char *at = value;
+    while (*at >= '0' && *at <= '9')
+        ++at;
+    return at != value && *at == 0;
 }
 
 static void PutValue(Output *out, const char *value)
 {
-    size_t digits = strspn(value, "0123456789");
-    if (value[digits] == 0) {
-        Put(out, digits ? value : "{}");
+    if (*value == 0 || IsNumber(value)) {
+        Put(out, *value ? value : "{}");
         return;
     }
     ValueState state = {};
@@ -144,11 +150,9 @@ static void PutValue(Output *out, const char *value)
 
 void Bib_WriteValue(const char *value, FILE *stream)
 {
-    Output out;
-    out.stream = stream;
-    out.used = 0;
-    PutValue(&out, value);
-    Flush(&out);
+    Output *out = StartOutput(stream);
+    PutValue(out, value);
+    Flush(out);
 }
 
 // --- The file's text ---
@@ -219,15 +223,13 @@ static void PutEntry(Output *out, const BibEntry *entry)
 
 static void WriteContents(const BibFile *file, FILE *stream)
 {
-    Output out;
-    out.stream = stream;
-    out.used = 0;
-    PutComments(&out, file->comments);
-    PutPreamble(&out, file->preamble);
-    PutStrings(&out, file->strings);
+    Output *out = StartOutput(stream);
+    PutComments(out, file->comments);
+    PutPreamble(out, file->preamble);
+    PutStrings(out, file->strings);
     for (const BibEntry *entry = file->entries; entry; entry = entry->next)
-        PutEntry(&out, entry);
-    Flush(&out);
+        PutEntry(out, entry);
+    Flush(out);
 }
 
 // --- The backup ---
