@@ -49,7 +49,8 @@ Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
     column->Add(text, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
     column->Add(CreateStdDialogButtonSizer(wxOK), wxSizerFlags().Expand().Border(wxALL, border));
     SetSizerAndFit(column);
-    CentreOnParent();
+    // The window manager centres the dialog on its parent. It alone knows at the start where that
+    // is.
     FindWindow(wxID_OK)->SetFocus();
 }
 

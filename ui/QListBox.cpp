@@ -14,6 +14,7 @@
 
 // clang-format off
 wxBEGIN_EVENT_TABLE(QListBox, wxVListBox)
+    EVT_KEY_DOWN(QListBox::OnKeyDown)
     EVT_CHAR(QListBox::OnChar)
 wxEND_EVENT_TABLE()
     // clang-format on
@@ -135,6 +136,13 @@ void QListBox::Drop_Index()
     m_index = nullptr;
     m_itemCount = 0;
     Refresh();
+}
+
+// The base class would move the focus and then hand the key to the type-ahead search as well.
+void QListBox::OnKeyDown(wxKeyEvent &event)
+{
+    if (!HandleAsNavigationKey(event))
+        event.Skip();
 }
 
 static void LogKey(uint32_t key, int32_t now, int32_t last)

@@ -38,6 +38,7 @@ private:
     void OnDrawItem(wxDC &dc, const wxRect &rect, size_t n) const override;
     wxCoord OnMeasureItem(size_t n) const override;
     void OnDrawBackground(wxDC &dc, const wxRect &rect, size_t n) const override;
+    void OnKeyDown(wxKeyEvent &event);
     void OnChar(wxKeyEvent &event);
     void MeasureLineHeight();
     BibFile *const *Files() const;

@@ -15,6 +15,7 @@
 
 #include "app/MyFrame.h"
 #include "tests/support/TempFolder.h"
+#include "ui/Messages.h"
 
 // Reports through GoogleTest.
 class GuiTestHook;
@@ -47,7 +48,6 @@ private:
 };
 
 // The loading-messages window with this heading; `text` (may be null) receives its text.
-class Cartulo_Messages;
 class ExpectMessages : public wxExpectModalBase<Cartulo_Messages, ExpectMessages>
 {
 public:
