@@ -193,22 +193,27 @@ TEST_F(FileSet, KeepsBrokenSecondRecordsApartFromErrors)
 
 TEST_F(FileSet, OpensAProtectedFileWithoutALock)
 {
-    std::string path = folder.Write("refs.bib", Good);
-    chmod(path.c_str(), 0444);
-    chmod(folder.Path().c_str(), 0755);
-    // Root may write everything.
-    bool root = geteuid() == 0;
-    if (root) {
-        ASSERT_EQ(0, setresuid(65534, 65534, 0));
+    for (const std::string &text : {Good, Broken}) {
+        std::string path = folder.Write("refs.bib", text);
+        chmod(path.c_str(), 0444);
+        chmod(folder.Path().c_str(), 0755);
+        // Root may write everything.
+        bool root = geteuid() == 0;
+        if (root) {
+            ASSERT_EQ(0, setresuid(65534, 65534, 0));
+        }
+        int errors = FileSet_Open(&set, path.c_str());
+        if (root) {
+            ASSERT_EQ(0, setresuid(0, 0, 0));
+        }
+        EXPECT_EQ(text == Broken, errors > 0);
+        BibFile *file = set.files[set.count - 1];
+        EXPECT_EQ(-1, file->readOnly);
+        EXPECT_EQ(0, file->readOnlyByErrors);
+        EXPECT_EQ(0, file->lockHandle);
+        unlink(path.c_str());
     }
-    EXPECT_EQ(0, FileSet_Open(&set, path.c_str()));
-    if (root) {
-        ASSERT_EQ(0, setresuid(0, 0, 0));
-    }
-    ASSERT_EQ(1, set.count);
-    EXPECT_EQ(-1, set.files[0]->readOnly);
-    EXPECT_EQ(0, set.files[0]->readOnlyByErrors);
-    EXPECT_EQ(0, set.files[0]->lockHandle);
+    EXPECT_EQ(2, set.count);
 }
 
 TEST_F(FileSet, TellsThatAFileIsMissing)

@@ -207,6 +207,22 @@ struct BibSave : testing::Test {
         return found;
     }
 
+    // Takes the dated names of the next seconds, without a letter and with B up to `last`. Returns
+    // all names in the folder.
+    Names TakeNames(char last)
+    {
+        time_t now = time(nullptr);
+        for (time_t second = now; second < now + 20; ++second) {
+            char date[64];
+            strftime(date, sizeof date, "%Y%m%d-%H%M%S", localtime(&second));
+            std::string name = std::string("refs.bib.Backup-") + date;
+            folder.Write(name, "taken");
+            for (char letter = 'B'; letter <= last; ++letter)
+                folder.Write(name + letter, "taken");
+        }
+        return folder.Names();
+    }
+
     // A save that failed: nothing has changed, and the user can try again.
     void ExpectFailedSave(const char *line, const std::string &name)
     {
@@ -386,42 +402,30 @@ TEST_F(BibSave, ReportsAPlainBackupThatCannotBeRemoved)
 
 TEST_F(BibSave, TakesTheNextLetterWhenTheDatedNameIsTaken)
 {
-    folder.Write("refs.bib", OldText);
-    Names taken;
-    time_t now = time(nullptr);
-    for (time_t second = now; second < now + 20; ++second) {
-        char date[64];
-        strftime(date, sizeof date, "%Y%m%d-%H%M%S", localtime(&second));
-        for (const char *letter : {"", "B"}) {
-            taken.insert(std::string("refs.bib.Backup-") + date + letter);
-            folder.Write(std::string("refs.bib.Backup-") + date + letter, "taken");
+    for (char last : {'B', 'Y'}) {
+        folder.Write("refs.bib", OldText);
+        Names before = TakeNames(last);
+        file->backupDone = 0;
+        EXPECT_EQ("", Saved());
+        Names added;
+        for (const std::string &name : folder.Names()) {
+            if (before.count(name) == 0)
+                added.insert(name);
         }
+        ASSERT_EQ(1u, added.size());
+        EXPECT_EQ(std::string("refs.bib.Backup-99999999-999999") + ++last,
+                  WithNines(*added.begin()));
+        EXPECT_EQ(OldText, folder.Read(*added.begin()));
+        unlink(folder.Path(*added.begin()).c_str());
+        for (const std::string &name : before)
+            EXPECT_EQ(name == "refs.bib" ? "" : "taken", folder.Read(name));
     }
-    AddNew();
-    EXPECT_EQ(NewText, Saved());
-    std::string backup;
-    for (const std::string &name : folder.Names()) {
-        if (taken.count(name))
-            EXPECT_EQ("taken", folder.Read(name));
-        else if (name != "refs.bib")
-            backup = name;
-    }
-    EXPECT_EQ("refs.bib.Backup-99999999-999999C", WithNines(backup));
-    EXPECT_EQ(OldText, folder.Read(backup));
 }
 
 TEST_F(BibSave, FailsWhenAllDatedNamesAreTaken)
 {
     folder.Write("refs.bib", OldText);
-    time_t now = time(nullptr);
-    for (time_t second = now; second < now + 20; ++second) {
-        char date[64];
-        strftime(date, sizeof date, "%Y%m%d-%H%M%S", localtime(&second));
-        folder.Write(std::string("refs.bib.Backup-") + date, "taken");
-        for (char letter = 'B'; letter <= 'Z'; ++letter)
-            folder.Write(std::string("refs.bib.Backup-") + date + letter, "taken");
-    }
-    Names before = folder.Names();
+    Names before = TakeNames('Z');
     ExpectFailedSave("ERROR: Can't rename to BAK-file the Bib-file: ", file->path);
     EXPECT_EQ(before, folder.Names());
     for (const std::string &name : before)
