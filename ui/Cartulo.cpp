@@ -72,7 +72,9 @@ Cartulo::~Cartulo()
 
 wxStaticText *Cartulo::CreateHeading(wxWindow *parent, const wxString &text)
 {
-    wxStaticText *heading = new wxStaticText(parent, wxID_ANY, text);
+    wxStaticText *heading =
+        new wxStaticText(parent, wxID_ANY, text, wxDefaultPosition, wxDefaultSize,
+                         wxALIGN_CENTRE_HORIZONTAL | wxST_ELLIPSIZE_END);
     heading->SetFont(heading->GetFont().Bold());
     Theme_SetTextColour(heading, HeadingColour);
     return heading;
@@ -102,7 +104,7 @@ void Cartulo::CreateEntryPane()
     }
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
     column->Add(CreateHeading(m_entryPane, "Records of currently selected bibliography entry"),
-                wxSizerFlags().Centre().Border(wxALL, FromDIP(PANE_BORDER)));
+                wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
     column->Add(grid, wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
     m_entryPane->SetSizer(column);
     m_entryPane->SetScrollRate(0, FromDIP(16));
@@ -118,7 +120,7 @@ void Cartulo::CreateOpenPane()
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
     column->AddStretchSpacer();
     column->Add(CreateHeading(m_openPane, "To open TeX Bibliography file (BIB) click the button:"),
-                wxSizerFlags().Centre().Border(wxALL, FromDIP(PANE_BORDER)));
+                wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
     column->Add(button, wxSizerFlags().Centre().Border(wxALL, FromDIP(PANE_BORDER)));
     column->AddStretchSpacer();
     m_openPane->SetSizer(column);
@@ -208,7 +210,7 @@ void Cartulo::OnShowMessages(wxCommandEvent &)
 
 static wxToolBar *ToolBarOf(wxWindow *window)
 {
-    wxFrame *frame = wxDynamicCast(wxGetTopLevelParent(window), wxFrame);
+    wxFrame *frame = dynamic_cast<wxFrame *>(wxGetTopLevelParent(window));
     return frame ? frame->GetToolBar() : nullptr;
 }
 
@@ -275,7 +277,7 @@ void Cartulo::OnSave(wxCommandEvent &)
 
 void Cartulo::OnSearch(wxCommandEvent &event)
 {
-    wxSearchCtrl *field = wxDynamicCast(event.GetEventObject(), wxSearchCtrl);
+    wxSearchCtrl *field = dynamic_cast<wxSearchCtrl *>(event.GetEventObject());
     if (!field) {
         TNSMessage("ERROR: Cartulo::OnSearch ", "Uknown source", TNS_ERROR);
         return;

@@ -175,7 +175,7 @@ void QListBox::OnChar(wxKeyEvent &event)
 
 void ShowStatus(wxWindow *window, const wxString &text, bool bell)
 {
-    wxFrame *frame = wxDynamicCast(wxGetTopLevelParent(window), wxFrame);
+    wxFrame *frame = dynamic_cast<wxFrame *>(wxGetTopLevelParent(window));
     if (!frame || !frame->GetStatusBar())
         return;
     frame->SetStatusText(text, 0);
