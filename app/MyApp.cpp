@@ -75,10 +75,12 @@ const char *MyApp::TakeCommandLine()
                      wxOK | wxICON_WARNING);
         return nullptr;
     }
-    char first[BASE_FOLDER_SIZE];
+    char first[TOKEN_SIZE];
     const char *rest = NextToken(line, first, sizeof first);
     if (!rest || Ascii_CompareN(first, "-d", 2) != 0)
         return line;
+    if (strlen(first + 2) >= sizeof m_command.baseFolder)
+        return line; // the panel says that it is too long
     strcpy(m_command.baseFolder, first + 2);
     return rest;
 }
