@@ -168,7 +168,7 @@ void Cartulo::RefreshFiles(BibEntry *select)
 void Cartulo::Arrange()
 {
     if (m_set.count > 0 && !IsSplit()) {
-        m_list->SetFocus(); // a hidden window must not keep the focus: keys would be lost
+        m_list->SetFocus(); // before the button that has it is hidden
         m_openPane->Hide();
         SplitVertically(m_list, m_entryPane, FromDIP(SASH_POSITION));
     } else if (m_set.count == 0) {
@@ -363,13 +363,9 @@ void Cartulo::ShowEntry(BibEntry *entry, int file)
     m_fileName->SetToolTip(path);
     m_typeName->SetLabelText(StoreText(BibTypeTable[entry->type]));
     int shown = std::min<int>(entry->fieldCount, ROW_COUNT);
-    for (int i = 0; i < ROW_COUNT; ++i) {
-        if (i < shown)
-            FillRow(i, &entry->fields[i]);
-        m_rows[i].label->Show(i < shown);
-        m_rows[i].value->Show(i < shown);
-    }
-    LayOutEntry();
+    for (int i = 0; i < shown; ++i)
+        FillRow(i, &entry->fields[i]);
+    ShowRows(shown);
     m_entryPane->Thaw();
 }
 
@@ -380,15 +376,18 @@ void Cartulo::ClearEntry()
     m_fileName->SetLabelText("");
     m_fileName->UnsetToolTip();
     m_typeName->SetLabelText("");
-    for (FieldRow &row : m_rows) {
-        row.label->Hide();
-        row.value->Hide();
-    }
-    LayOutEntry();
+    ShowRows(0);
 }
 
-void Cartulo::LayOutEntry()
+// Shows the first rows, as many as `count`.
+void Cartulo::ShowRows(int count)
 {
+    for (int i = 0; i < ROW_COUNT; ++i) {
+        if (i >= count && m_rows[i].value->HasFocus())
+            m_list->SetFocus(); // a hidden window must not keep the focus: keys would be lost
+        m_rows[i].label->Show(i < count);
+        m_rows[i].value->Show(i < count);
+    }
     m_entryPane->FitInside(); // the scroll bar follows the rows
     m_entryPane->Layout();
 }

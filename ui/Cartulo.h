@@ -58,7 +58,7 @@ private:
     void ShowSelection();
     void ClearEntry();
     void FillRow(int row, const BibField *field);
-    void LayOutEntry();
+    void ShowRows(int count);
     void UpdateSaveTool();
     void ShowRow(const char *handler);
     static void ShowBox(void *owner, const char *caption, const char *text);

@@ -68,3 +68,12 @@ TEST_F(Keyboard, ShowsTheMessagesFromEveryControl)
                   ExpectMessages("There is no any messages related with loading BIB-files", &text));
     EXPECT_FALSE(text.empty());
 }
+
+TEST_F(Keyboard, KeepsWorkingWhenTheRowWithTheFocusIsHidden)
+{
+    keys.Char(WXK_TAB);
+    ASSERT_TRUE(WaitFor([this] { return FocusIsInEntryPane(); }));
+    Panel()->ProcessCommand(folder.Write("new.bib", "").c_str(), "test");
+    EXPECT_TRUE(ShownFields().empty());
+    EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+}

@@ -1,9 +1,11 @@
 #!/bin/sh
 # Starts the program on a display as a user does and closes its window with the keyboard:
-# start_and_close.sh PROGRAM. Fails unless the file is listed, the configuration folder made, and
+# start_and_close.sh PROGRAM. Fails unless the file is loaded, the configuration folder made, and
 # the program ends well.
 set -eu
 program=$1
+env -u DISPLAY -u WAYLAND_DISPLAY "$program" --help >/dev/null
+env -u DISPLAY -u WAYLAND_DISPLAY "$program" --version >/dev/null
 folder=$(mktemp -d)
 editor=
 trap '[ -z "$editor" ] || kill "$editor" 2>/dev/null || true; rm -rf "$folder"' EXIT
