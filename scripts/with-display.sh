@@ -32,14 +32,18 @@ fail() {
     exit 125
 }
 
-# The server picks a free display and writes its number once it listens.
+# The server picks a free display and writes its number once it listens. Two that start at the same
+# moment may pick the same one, so one starts after the other.
+exec 9>"${TMPDIR:-/tmp}/with-display-$(id -u).lock"
+flock -w "$seconds" 9 || fail "another screen takes too long to start"
 mkfifo "$work/number"
 Xvfb -displayfd 3 -screen 0 1280x1024x24 -nolisten tcp 3>"$work/number" \
-    >"$work/screen.log" 2>&1 &
+    >"$work/screen.log" 2>&1 9>&- &
 screen=$!
 exec 4<>"$work/number"
 read -r -t "$seconds" number <&4 || fail "the screen did not start"
 exec 4<&-
+exec 9>&- # the next may start
 
 export DISPLAY=:$number GDK_BACKEND=x11
 export NO_AT_BRIDGE=${NO_AT_BRIDGE-1} # the accessibility bus would only add noise
