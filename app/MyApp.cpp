@@ -19,26 +19,24 @@
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
 
-// clang-format off
 wxBEGIN_EVENT_TABLE(MyApp, wxApp)
     EVT_ACTIVATE_APP(MyApp::OnActivateApp)
 wxEND_EVENT_TABLE()
-    // clang-format on
 
-    static const char Usage[] =
-        "Usage: cartulo [options] [BIB files]\n"
-        "\n"
-        "Shows the entries of all named BibTeX databases in one searchable list.\n"
-        "The extension .bib may be left out.\n"
-        "\n"
-        "  -dFOLDER/    folder that relative file names start from (first, with the slash)\n"
-        "  -eNAME       code page of the files, like -eCP1251; without it CP1252\n"
-        "  -i           forget the files named so far\n"
-        "  --help       show this text\n"
-        "  --version    show the version\n"
-        "\n"
-        "CARTULO_LOG=LEVEL[:FILE] in the environment shows what the program does: from LEVEL 1\n"
-        "(everything) to 5 (errors only), by default 4, on standard error or at the end of FILE.\n";
+static const char Usage[] =
+    "Usage: cartulo [options] [BIB files]\n"
+    "\n"
+    "Shows the entries of all named BibTeX databases in one searchable list.\n"
+    "The extension .bib may be left out.\n"
+    "\n"
+    "  -dFOLDER/    folder that relative file names start from (first, with the slash)\n"
+    "  -eNAME       code page of the files, like -eCP1251; without it CP1252\n"
+    "  -i           forget the files named so far\n"
+    "  --help       show this text\n"
+    "  --version    show the version\n"
+    "\n"
+    "CARTULO_LOG=LEVEL[:FILE] in the environment shows what the program does: from LEVEL 1\n"
+    "(everything) to 5 (errors only), by default 4, on standard error or at the end of FILE.\n";
 
 MyApp::MyApp(int argc, char **argv) : m_argumentCount(argc), m_arguments(argv) {}
 

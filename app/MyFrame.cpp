@@ -16,7 +16,6 @@
 enum { ICON_SIZE = 16, TOOL_MARGIN = 4, SEARCH_WIDTH = 240 };
 
 // The first row that matches handles the event.
-// clang-format off
 wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
     EVT_MENU(ID_CLOSE, MyFrame::OnQuit)
     EVT_MENU(ID_EXIT, MyFrame::OnQuit)
@@ -27,9 +26,8 @@ wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
     EVT_CHAR_HOOK(MyFrame::OnCharHook)
     EVT_CLOSE(MyFrame::OnClose)
 wxEND_EVENT_TABLE()
-    // clang-format on
 
-    MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *state)
+MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *state)
     : wxFrame(nullptr, wxID_ANY, title)
 {
     SetMinSize(FromDIP(wxSize(512, 512)));

@@ -27,7 +27,6 @@
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, COLUMN_GAP = 8, PANE_BORDER = 8 };
 static const Colour HeadingColour = {0, 0, 100};
 
-// clang-format off
 wxBEGIN_EVENT_TABLE(Cartulo, wxSplitterWindow)
     EVT_BUTTON(ID_OPEN, Cartulo::OnOpen)
     EVT_BUTTON(ID_SAVE, Cartulo::OnSave)
@@ -40,11 +39,10 @@ wxBEGIN_EVENT_TABLE(Cartulo, wxSplitterWindow)
     EVT_LISTBOX_DCLICK(ID_INDEX, Cartulo::OnIndexActivate)
     EVT_SPLITTER_SASH_POS_CHANGED(ID_SPLITTER, Cartulo::OnSashMove)
 wxEND_EVENT_TABLE()
-    // clang-format on
 
-    // --- Construction ---
+// --- Construction ---
 
-    Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
+Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     : wxSplitterWindow(parent, ID_SPLITTER, wxDefaultPosition, parent->GetClientSize(),
                        wxSP_3D | wxSP_LIVE_UPDATE, "splitter"),
       m_command(state)

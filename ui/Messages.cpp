@@ -11,13 +11,11 @@
 
 enum { ID_MESSAGES_TEXT = 6001 };
 
-// clang-format off
 wxBEGIN_EVENT_TABLE(Cartulo_Messages, wxDialog)
     EVT_BUTTON(wxID_OK, Cartulo_Messages::OnOK)
 wxEND_EVENT_TABLE()
-    // clang-format on
 
-    static Colour HeadingColour(MessagesVerdict verdict)
+static Colour HeadingColour(MessagesVerdict verdict)
 {
     switch (verdict) {
     case MESSAGES_ERRORS:

@@ -12,14 +12,12 @@
 #include "ui/Cartulo.h"
 #include "ui/DisplayText.h"
 
-// clang-format off
 wxBEGIN_EVENT_TABLE(QListBox, wxVListBox)
     EVT_KEY_DOWN(QListBox::OnKeyDown)
     EVT_CHAR(QListBox::OnChar)
 wxEND_EVENT_TABLE()
-    // clang-format on
 
-    QListBox::QListBox()
+QListBox::QListBox()
 {
     SetMargins(8, 0);
 }
