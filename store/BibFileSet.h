@@ -16,7 +16,7 @@ struct BibFileSet {
 void FileSet_Append(BibFileSet *set, BibFile *file);
 void FileSet_AppendError(BibFileSet *set, const char *format, ...)
     __attribute__((format(printf, 2, 3))); // to loadErrors
-void FileSet_Free(BibFileSet *set); // unlocks and frees every file; saves nothing
+void FileSet_Free(BibFileSet *set);        // unlocks and frees every file; saves nothing
 
 int FileSet_EntryCount(const BibFileSet *set);    // as many as the list has rows
 int FileSet_ModifiedCount(const BibFileSet *set); // files with unsaved changes
