@@ -104,6 +104,8 @@ void Cartulo::CreateEntryPane()
     column->Add(CreateHeading(m_entryPane, "Records of currently selected bibliography entry"),
                 wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
     column->Add(grid, wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
+    m_moreFields = new wxStaticText(m_entryPane, wxID_ANY, "");
+    column->Add(m_moreFields, wxSizerFlags().Border(wxALL, FromDIP(PANE_BORDER)));
     m_entryPane->SetSizer(column);
     m_entryPane->SetScrollRate(0, FromDIP(16));
     m_entryPane->Hide();
@@ -363,6 +365,7 @@ void Cartulo::ShowEntry(BibEntry *entry, int file)
     int shown = std::min<int>(entry->fieldCount, ROW_COUNT);
     for (int i = 0; i < shown; ++i)
         FillRow(i, &entry->fields[i]);
+    ShowMoreFields(entry->fieldCount - shown);
     ShowRows(shown);
     m_entryPane->Thaw();
 }
@@ -374,7 +377,17 @@ void Cartulo::ClearEntry()
     m_fileName->SetLabelText("");
     m_fileName->UnsetToolTip();
     m_typeName->SetLabelText("");
+    ShowMoreFields(0);
     ShowRows(0);
+}
+
+// Nobody shall take an entry with more fields than rows for one with that many fields.
+void Cartulo::ShowMoreFields(int count)
+{
+    m_moreFields->SetLabelText(count == 1
+                                   ? wxString("1 more field is not shown.")
+                                   : wxString::Format("%d more fields are not shown.", count));
+    m_moreFields->Show(count > 0);
 }
 
 // Shows the first rows, as many as `count`.

@@ -58,6 +58,7 @@ private:
     void ShowSelection();
     void ClearEntry();
     void FillRow(int row, const BibField *field);
+    void ShowMoreFields(int count);
     void ShowRows(int count);
     void UpdateSaveTool();
     void ShowRow(const char *handler);
@@ -81,6 +82,7 @@ private:
     wxStaticText *m_fileName = nullptr;
     wxStaticText *m_typeName = nullptr;
     FieldRow m_rows[ROW_COUNT] = {};
+    wxStaticText *m_moreFields = nullptr; // how many fields found no row
 
     wxDECLARE_EVENT_TABLE();
 };

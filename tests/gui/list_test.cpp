@@ -6,6 +6,7 @@
 
 #include <wx/srchctrl.h>
 #include <wx/scrolwin.h>
+#include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "app/Ids.h"
@@ -165,6 +166,33 @@ TEST_F(ListInWindow, ShowsSixteenFieldsAtMost)
     EXPECT_EQ((Field{"field10", "10"}), fields.front());
     EXPECT_EQ((Field{"field25", "25"}), fields.back());
     EXPECT_GT(EntryPane()->GetVirtualSize().y, EntryPane()->GetClientSize().y) << "must scroll";
+}
+
+TEST_F(ListInWindow, TellsOfTheFieldsThatItDoesNotShow)
+{
+    auto open = [&](int fields) {
+        std::string text = "@misc{many";
+        for (int i = 0; i < fields; ++i)
+            text += ", f" + std::to_string(i) + " = 1";
+        Panel()->ProcessCommand(folder.Write(std::to_string(fields) + ".bib", text + "}\n").c_str(),
+                                "test");
+    };
+    auto note = [&] {
+        for (wxWindow *child : EntryPane()->GetChildren()) {
+            wxStaticText *text = dynamic_cast<wxStaticText *>(child);
+            if (text && text->IsShown() && text->GetLabelText().EndsWith("not shown."))
+                return text->GetLabelText();
+        }
+        return wxString();
+    };
+    open(16);
+    EXPECT_EQ("", note());
+    open(17);
+    EXPECT_EQ("1 more field is not shown.", note());
+    open(40);
+    EXPECT_EQ("24 more fields are not shown.", note());
+    SearchFor("nothing has this");
+    EXPECT_EQ("", note());
 }
 
 TEST_F(ListInWindow, ShowsTextsInTheSelectedCodePage)
