@@ -71,6 +71,8 @@ static void SetNumber(BibItems *items, int number)
 
 static void EndItem(BibItems *items)
 {
+    if (items->length - items->whole > UINT32_MAX)
+        abort(); // as for lack of memory
     uint32_t size = static_cast<uint32_t>(items->length - items->whole);
     memcpy(items->bytes + items->whole, &size, sizeof size);
     items->whole = items->length;

@@ -61,10 +61,15 @@ void BibChild_Parse(void *job);
 
 enum BibStored {
     BIB_STORED,
-    BIB_SKIPPED, // an entry without a key
-    BIB_NO_TYPE, // the table of entry types is full; nothing was stored
-    BIB_NO_FIELD // the table of field names is full; nothing was stored
+    BIB_SKIPPED,  // an entry without a key
+    BIB_NO_TYPE,  // the table of entry types is full; nothing was stored
+    BIB_NO_FIELD, // the table of field names is full; nothing was stored
+    BIB_NO_MEMORY // the rest of the item was not stored
 };
+
+// The size of the item at the start of `bytes`, 0 when the bytes end before it does, -1 when it is
+// none: a child whose memory a broken file has damaged may send anything.
+long BibItem_Size(const char *bytes, size_t length);
 
 // Builds the records of one whole item and pushes them at the head of the file's lists.
 BibStored BibItem_Store(BibFile *file, const char *item);

@@ -5,8 +5,7 @@
 
 #include <cstdlib>
 #include <cstring>
-#include <string>
-#include <utility>
+#include <initializer_list>
 
 #include <btparse.h>
 
@@ -51,6 +50,66 @@ static char *CopyNextText(ItemReader *reader)
     uint32_t length;
     const char *text = NextText(reader, &length);
     return Bib_CopyText(text, length);
+}
+
+// How many texts an item of this kind consists of; -1 when there is no such item.
+static int64_t TextCount(const BibItemHeader *header)
+{
+    int64_t number = header->number;
+    switch (header->kind) {
+    case BIB_ITEM_MESSAGE:
+        return 1;
+    case BIB_ITEM_ENTRY:
+        return number < 0 ? -1 : 2 + 2 * number;
+    case BIB_ITEM_STRINGS:
+        return number < 0 ? -1 : 2 * number;
+    case BIB_ITEM_PREAMBLE:
+        return number < 0 ? -1 : 1 + number;
+    case BIB_ITEM_COMMENT:
+        return number < 0 ? -1 : number;
+    case BIB_ITEM_STRANGE:
+    case BIB_ITEM_END:
+        return 0;
+    }
+    return -1;
+}
+
+// Steps over a text with its length and its NUL. 0 when no whole one is there.
+static int SkipText(const char **at, const char *end)
+{
+    uint32_t length;
+    if (static_cast<size_t>(end - *at) < sizeof length + 1)
+        return 0;
+    memcpy(&length, *at, sizeof length);
+    *at += sizeof length;
+    if (length >= static_cast<size_t>(end - *at) || (*at)[length] != 0)
+        return 0;
+    *at += length + 1;
+    return 1;
+}
+
+// 1 when the item consists of just the texts that it should.
+static int IsSound(const char *item, const BibItemHeader *header)
+{
+    const char *at = item + sizeof *header;
+    const char *end = item + header->size;
+    int64_t left = TextCount(header);
+    while (left > 0 && SkipText(&at, end))
+        --left;
+    return left == 0 && at == end;
+}
+
+long BibItem_Size(const char *bytes, size_t length)
+{
+    BibItemHeader header;
+    if (length < sizeof header)
+        return 0;
+    memcpy(&header, bytes, sizeof header);
+    if (header.size < sizeof header)
+        return -1;
+    if (header.size > length)
+        return 0;
+    return IsSound(bytes, &header) ? static_cast<long>(header.size) : -1;
 }
 
 // The last `crossref` moves to the front, so that an editor finds it there.
@@ -100,12 +159,18 @@ static BibStored StoreEntry(BibFile *file, ItemReader reader)
 
     BibEntry *entry = Bib_AllocEntry(reader.header.number);
     if (!entry)
-        return BIB_SKIPPED;
+        return BIB_NO_MEMORY;
     entry->type = Bib_TypeIndex(typeName);
     entry->key = Bib_CopyText(key, keyLength);
+    int complete = entry->key != nullptr;
     for (int i = 0; i < entry->fieldCount; ++i) {
         entry->fields[i].name = Bib_FieldIndex(NextText(&reader));
         entry->fields[i].value = CopyNextText(&reader);
+        complete = complete && entry->fields[i].value;
+    }
+    if (!complete) {
+        Bib_FreeEntry(entry);
+        return BIB_NO_MEMORY;
     }
     MoveCrossrefToFront(entry, crossref);
     entry->next = file->entries;
@@ -113,17 +178,29 @@ static BibStored StoreEntry(BibFile *file, ItemReader reader)
     return BIB_STORED;
 }
 
-static void StoreStrings(BibFile *file, ItemReader reader)
+static void FreeString(BibString *string)
+{
+    free(string->value);
+    free(string->name);
+    free(string);
+}
+
+static BibStored StoreStrings(BibFile *file, ItemReader reader)
 {
     for (int i = 0; i < reader.header.number; ++i) {
         BibString *string = static_cast<BibString *>(Bib_Alloc(sizeof *string));
         if (!string)
-            return;
+            return BIB_NO_MEMORY;
         string->name = CopyNextText(&reader);
         string->value = CopyNextText(&reader);
+        if (!string->name || !string->value) {
+            FreeString(string);
+            return BIB_NO_MEMORY;
+        }
         string->next = file->strings;
         file->strings = string;
     }
+    return BIB_STORED;
 }
 
 static void StorePreamble(BibFile *file, ItemReader reader)
@@ -143,17 +220,28 @@ static void StorePreamble(BibFile *file, ItemReader reader)
     }
 }
 
-static void StoreComments(BibFile *file, ItemReader reader)
+static void FreeComment(BibComment *comment)
+{
+    free(comment->text);
+    free(comment);
+}
+
+static BibStored StoreComments(BibFile *file, ItemReader reader)
 {
     for (int i = 0; i < reader.header.number; ++i) {
         BibComment *comment = static_cast<BibComment *>(Bib_Alloc(sizeof *comment));
         if (!comment)
-            return;
+            return BIB_NO_MEMORY;
         comment->text = CopyNextText(&reader);
+        if (!comment->text) {
+            FreeComment(comment);
+            return BIB_NO_MEMORY;
+        }
         AppLog("Comment: ", comment->text);
         comment->next = file->comments;
         file->comments = comment;
     }
+    return BIB_STORED;
 }
 
 BibStored BibItem_Store(BibFile *file, const char *item)
@@ -163,14 +251,12 @@ BibStored BibItem_Store(BibFile *file, const char *item)
     case BIB_ITEM_ENTRY:
         return StoreEntry(file, reader);
     case BIB_ITEM_STRINGS:
-        StoreStrings(file, reader);
-        break;
+        return StoreStrings(file, reader);
     case BIB_ITEM_PREAMBLE:
         StorePreamble(file, reader);
         break;
     case BIB_ITEM_COMMENT:
-        StoreComments(file, reader);
-        break;
+        return StoreComments(file, reader);
     case BIB_ITEM_STRANGE:
         AppLog("ERROR: ", reader.header.number == BTE_UNKNOWN
                               ? "There is unknown entry in BIB-file"
@@ -192,7 +278,7 @@ struct Load {
     int line;          // of the last item or message
     int fatal;         // the parser reported the reason for its end itself
     int end;           // BibEnd, or -1 as long as the child has said nothing
-    BibStored refused; // a full name table ended the load
+    BibStored refused; // a full name table, or lack of memory, ended the load
 };
 
 static int IsFatalMessage(const BibItemHeader *header)
@@ -221,36 +307,56 @@ static int TakeItem(Load *load, const char *item)
 static long TakeItems(Load *load, const char *buffer, size_t length)
 {
     size_t taken = 0;
-    BibItemHeader header;
-    while (length - taken >= sizeof header) {
-        memcpy(&header, buffer + taken, sizeof header);
-        if (header.size > length - taken)
-            break;
-        if (!TakeItem(load, buffer + taken))
+    while (long size = BibItem_Size(buffer + taken, length - taken)) {
+        if (size < 0 || !TakeItem(load, buffer + taken))
             return -1;
-        taken += header.size;
+        taken += static_cast<size_t>(size);
     }
     return static_cast<long>(taken);
+}
+
+static int MakeRoom(BibItems *buffer)
+{
+    if (buffer->length < buffer->room)
+        return 1;
+    size_t room = buffer->room > 0 ? 2 * buffer->room : 256 * 1024;
+    char *bytes = static_cast<char *>(realloc(buffer->bytes, room));
+    if (!bytes)
+        return 0;
+    buffer->bytes = bytes;
+    buffer->room = room;
+    return 1;
+}
+
+// 1 to go on, 0 when the load ends here.
+static int TakeBuffer(Load *load, BibItems *buffer)
+{
+    long taken = TakeItems(load, buffer->bytes, buffer->length);
+    if (taken < 0)
+        return 0;
+    buffer->length -= static_cast<size_t>(taken);
+    memmove(buffer->bytes, buffer->bytes + taken, buffer->length);
+    return 1;
 }
 
 // 1 when all went well up to the child's end, 0 when it went silent.
 static int ReceiveItems(Load *load, SysChild *child, int seconds)
 {
-    std::string buffer(256 * 1024, 0);
-    size_t used = 0;
-    for (;;) {
-        if (used == buffer.size())
-            buffer.resize(2 * used);
-        long got = Sys_ReadChild(child, &buffer[used], buffer.size() - used, seconds);
-        if (got <= 0)
-            return got == 0;
-        used += static_cast<size_t>(got);
-        long taken = TakeItems(load, buffer.data(), used);
-        if (taken < 0)
-            return 1;
-        used -= static_cast<size_t>(taken);
-        memmove(&buffer[0], &buffer[static_cast<size_t>(taken)], used);
+    BibItems buffer = {};
+    long got = 1;
+    while (got > 0) {
+        if (!MakeRoom(&buffer)) {
+            load->refused = BIB_NO_MEMORY;
+            break;
+        }
+        got = Sys_ReadChild(child, buffer.bytes + buffer.length, buffer.room - buffer.length,
+                            seconds);
+        buffer.length += got > 0 ? static_cast<size_t>(got) : 0;
+        if (got > 0 && !TakeBuffer(load, &buffer))
+            break;
     }
+    BibItems_Free(&buffer);
+    return got >= 0;
 }
 
 // Why the file did not load to its end, in plain words; null when it did or the parser said so.
@@ -262,6 +368,8 @@ static const char *ReasonOfEnd(const Load *load, SysChildEnd end, int answered)
     if (load->refused == BIB_NO_FIELD)
         return "the table of field names is full (512 names in all open files); this entry and "
                "what follows it were not loaded";
+    if (load->refused == BIB_NO_MEMORY)
+        return "there is not enough memory; this item and what follows it were not loaded";
     if (load->fatal || load->end == BIB_END_OF_FILE)
         return nullptr;
     if (end == SYS_CHILD_TIME_LIMIT || !answered)
@@ -277,13 +385,15 @@ static const char *ReasonOfEnd(const Load *load, SysChildEnd end, int answered)
     return "the parser failed; this item and what follows it were not loaded";
 }
 
+// A file with a hole may claim any size.
 static int SecondsFor(FILE *stream)
 {
     static const long step = 64 * 1024 * 1024;
+    static const long most = 1000;
     fseek(stream, 0, SEEK_END);
-    long size = ftell(stream);
+    long steps = 1 + ftell(stream) / step;
     rewind(stream);
-    return BibLoadSeconds * static_cast<int>(1 + size / step);
+    return BibLoadSeconds * static_cast<int>(steps < most ? steps : most);
 }
 
 static void Report(BibFile *file, int line, const char *message)
@@ -381,14 +491,11 @@ void Bib_FreeFile(BibFile *file)
     }
     while (BibString *string = file->strings) {
         file->strings = string->next;
-        free(string->value);
-        free(string->name);
-        free(string);
+        FreeString(string);
     }
     while (BibComment *comment = file->comments) {
         file->comments = comment->next;
-        free(comment->text);
-        free(comment);
+        FreeComment(comment);
     }
     free(file->baseName);
     free(file->path);
