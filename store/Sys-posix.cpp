@@ -1,5 +1,6 @@
 // store/Sys-posix.cpp - files, locks, time and places, for POSIX systems.
 
+#include "store/Sys-posix.h"
 #include "store/Sys.h"
 
 #include <algorithm>
@@ -32,6 +33,15 @@ static void CloseQuietly(int fd)
     int reason = errno;
     close(fd);
     errno = reason;
+}
+
+int Sys_MoveOffStandard(int fd)
+{
+    if (fd < 0 || fd > STDERR_FILENO)
+        return fd;
+    int other = fcntl(fd, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
+    CloseQuietly(fd);
+    return other;
 }
 
 static void RemoveQuietly(const char *path)
@@ -132,7 +142,7 @@ static int IsRegular(mode_t mode)
 // the program; it means nothing for regular files.
 static int OpenRegular(const char *path, int flags)
 {
-    int fd = open(path, flags | O_CLOEXEC | O_NOCTTY | O_NONBLOCK, 0666);
+    int fd = Sys_MoveOffStandard(open(path, flags | O_CLOEXEC | O_NOCTTY | O_NONBLOCK, 0666));
     if (fd < 0)
         return -1;
     struct stat status;
@@ -191,16 +201,6 @@ char *Sys_ReadAll(FILE *stream, size_t *length)
 // flock, because its lock belongs to the open descriptor. The classic record lock of fcntl would
 // be dropped as soon as any descriptor of the file is closed, as after loading it.
 
-// 0 stands for "no lock" in a BibFile.
-static int MoveOffZero(int fd)
-{
-    if (fd != 0)
-        return fd;
-    int other = fcntl(fd, F_DUPFD_CLOEXEC, 1);
-    CloseQuietly(fd);
-    return other;
-}
-
 static int OpenForLock(const char *path)
 {
     // O_CREAT only where it is needed: in a folder like /tmp the system refuses it for files of
@@ -208,7 +208,7 @@ static int OpenForLock(const char *path)
     int fd = OpenRegular(path, O_RDWR);
     if (fd < 0 && errno == ENOENT)
         fd = OpenRegular(path, O_RDWR | O_CREAT);
-    return MoveOffZero(fd);
+    return fd;
 }
 
 // A file system without locks is not a reason to keep the user from the file: 1 then, too.
@@ -344,7 +344,7 @@ static int CopyFile(const char *path, const char *copy)
     int from = OpenRegular(path, O_RDONLY);
     if (from < 0)
         return 0;
-    int to = open(copy, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600);
+    int to = Sys_MoveOffStandard(open(copy, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
     if (to < 0) {
         CloseQuietly(from);
         return 0;
@@ -421,7 +421,7 @@ static int OpenTemporary(const char *target, mode_t mode, std::string *name)
         *name = start + std::to_string(n);
         int fd = open(name->c_str(), O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, mode);
         if (fd >= 0 || errno != EEXIST)
-            return fd;
+            return Sys_MoveOffStandard(fd);
     }
     return -1;
 }

@@ -1,5 +1,6 @@
 // store/SysChild-posix.cpp - child processes that work for this one, for POSIX systems.
 
+#include "store/Sys-posix.h"
 #include "store/Sys.h"
 
 #include <cerrno>
@@ -40,10 +41,36 @@ static void SilenceErrors()
         dup2(null, STDERR_FILENO);
 }
 
+// When memory runs out, the system shall end the child and not the editor with its unsaved work.
+static void VolunteerForLackOfMemory()
+{
+    int score = open("/proc/self/oom_score_adj", O_WRONLY | O_CLOEXEC);
+    if (score < 0)
+        return;
+    ssize_t written = write(score, "1000", 4);
+    static_cast<void>(written); // refused: then all is as it was
+    close(score);
+}
+
+static int OpenPipe(int ends[2])
+{
+    if (pipe2(ends, O_CLOEXEC) != 0)
+        return 0;
+    ends[0] = Sys_MoveOffStandard(ends[0]);
+    ends[1] = Sys_MoveOffStandard(ends[1]);
+    if (ends[0] >= 0 && ends[1] >= 0)
+        return 1;
+    int reason = errno;
+    close(ends[0]); // one may be -1
+    close(ends[1]);
+    errno = reason;
+    return 0;
+}
+
 int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds)
 {
     int ends[2];
-    if (pipe2(ends, O_CLOEXEC) != 0)
+    if (!OpenPipe(ends))
         return 0;
     fcntl(ends[1], F_SETPIPE_SZ, 1 << 20); // fewer switches between the two; it may be refused
     fflush(nullptr); // else the child would hold, and perhaps write, unwritten lines of ours
@@ -61,6 +88,7 @@ int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument
         signal(SIGPIPE, SIG_IGN);
         SilenceErrors();
         LimitResources(cpuSeconds);
+        VolunteerForLackOfMemory();
         body(argument);
         Sys_LeaveChild(0);
     }

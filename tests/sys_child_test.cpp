@@ -132,6 +132,28 @@ TEST(SysChild, SeesThatNobodyReads)
     EXPECT_EQ(SYS_CHILD_CRASHED, Sys_EndChild(&child)); // killed: it was in mid-write
 }
 
+// The child turns its standard error away, which must not be the pipe.
+TEST(SysChild, SendsWhereTheProgramHasNoStandardStreams)
+{
+    for (int stream : {2, 1, 0}) {
+        close(stream);
+        Outcome outcome = RunChild([](void *) { Sys_WriteParent("hello", 5); });
+        EXPECT_EQ("hello", outcome.written);
+        EXPECT_EQ(SYS_CHILD_DONE, outcome.end);
+    }
+}
+
+TEST(SysChild, IsTheFirstToGoWhenMemoryRunsOut)
+{
+    Outcome outcome = RunChild([](void *) {
+        char score[10] = "";
+        FILE *stream = fopen("/proc/self/oom_score_adj", "r");
+        if (stream && fgets(score, sizeof score, stream))
+            Sys_WriteParent(score, strlen(score));
+    });
+    EXPECT_EQ("1000\n", outcome.written);
+}
+
 TEST(SysChild, DoesNotRepeatUnwrittenLinesOfTheParent)
 {
     FILE *file = tmpfile();

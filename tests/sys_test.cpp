@@ -294,6 +294,16 @@ TEST_F(SysLockFile, IsNeverDescriptorZero)
     }));
 }
 
+// A line of the log would land in the user's file.
+TEST_F(SysLockFile, IsNeverAStandardStream)
+{
+    for (int closed : {1, 2})
+        EXPECT_TRUE(InAnotherProcess([&] {
+            close(closed);
+            return Sys_LockFile(path.c_str()) > 2 && fcntl(closed, F_GETFD) == -1;
+        }));
+}
+
 TEST_F(SysLockFile, RefusesEverythingButRegularFilesWithoutWaiting)
 {
     std::string pipe = folder.Path("pipe");
@@ -436,6 +446,14 @@ TEST_F(SysReplaceFile, IsNotCommittedWhenTheTargetBecameAFolder)
     ASSERT_EQ(0, mkdir(path.c_str(), 0700));
     EXPECT_EQ(0, Sys_CommitReplace(&replace));
     EXPECT_EQ(Names{"file"}, folder.Names());
+}
+
+TEST_F(SysReplaceFile, DoesNotWriteToAStandardStream)
+{
+    EXPECT_TRUE(InAnotherProcess([&] {
+        close(2);
+        return Sys_StartReplace(&replace, path.c_str()) && fileno(replace.stream) > 2;
+    }));
 }
 
 TEST_F(SysReplaceFile, DoesNotReuseATemporaryName)

@@ -1,0 +1,9 @@
+// store/Sys-posix.h - shared by the files that implement Sys.h on POSIX systems.
+#pragma once
+
+// Moves a descriptor off 0 to 2 and returns the new one; others, and -1, come back as they are. -1
+// on failure, with the reason in errno and the old one closed.
+//
+// A program may be started without its standard streams. A file of the user's that is opened then
+// must not take their place: it would get the lines of the log. And 0 stands for "no lock".
+int Sys_MoveOffStandard(int fd);
