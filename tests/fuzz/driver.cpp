@@ -201,6 +201,18 @@ static int RunAll(const std::vector<std::string> &inputs, const std::string &nam
     return failures;
 }
 
+static int RunSeeds(const std::vector<std::string> &seeds)
+{
+    int failures = 0;
+    for (size_t done = 0; done < seeds.size(); done += BATCH) {
+        size_t end = std::min(done + BATCH, seeds.size());
+        failures += RunAll(
+            {seeds.begin() + static_cast<long>(done), seeds.begin() + static_cast<long>(end)},
+            "crash-seed-" + std::to_string(done) + "-");
+    }
+    return failures;
+}
+
 static int RunMutations(const std::vector<std::string> &seeds, unsigned seed, size_t count)
 {
     Mutator mutator(seeds, seed);
@@ -254,7 +266,7 @@ int main(int argc, char **argv)
     Current = static_cast<size_t *>(
         mmap(nullptr, sizeof *Current, PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0));
     LLVMFuzzerInitialize(&argc, &argv);
-    int failures = RunAll(seeds, "crash-seed-");
+    int failures = RunSeeds(seeds);
     seeds.erase(std::remove_if(seeds.begin(), seeds.end(),
                                [](const std::string &text) { return text.size() > LARGEST; }),
                 seeds.end());
