@@ -67,11 +67,21 @@ static int OpenPipe(int ends[2])
     return 0;
 }
 
+// Whoever started this program may have left it a setting by which children vanish when they end:
+// then nobody can tell how, and their numbers may be somebody else's.
+static void KeepEndedChildren()
+{
+    struct sigaction action;
+    if (sigaction(SIGCHLD, nullptr, &action) == 0 && action.sa_handler == SIG_IGN)
+        signal(SIGCHLD, SIG_DFL);
+}
+
 int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds)
 {
     int ends[2];
     if (!OpenPipe(ends))
         return 0;
+    KeepEndedChildren();
     fcntl(ends[1], F_SETPIPE_SZ, 1 << 20); // fewer switches between the two; it may be refused
     fflush(nullptr); // else the child would hold, and perhaps write, unwritten lines of ours
     pid_t pid = fork();
@@ -181,12 +191,16 @@ void Sys_OnChildCrash(void (*handler)())
     stack.ss_size = size;
     if (stack.ss_sp)
         sigaltstack(&stack, nullptr);
+    sigset_t handled;
+    sigemptyset(&handled);
     for (int number : CrashSignals) {
+        sigaddset(&handled, number);
         struct sigaction action = {};
         action.sa_handler = OnCrashSignal;
         action.sa_flags = SA_ONSTACK | SA_NODEFER;
         sigaction(number, &action, nullptr);
     }
+    sigprocmask(SIG_UNBLOCK, &handled, nullptr); // the parent may have blocked them
 }
 
 FILE *Sys_OpenText(const char *text, size_t length)

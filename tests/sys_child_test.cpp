@@ -108,6 +108,25 @@ TEST(SysChild, IsStoppedAtItsTimeLimit)
     EXPECT_EQ(SYS_CHILD_TIME_LIMIT, outcome.end);
 }
 
+TEST(SysChild, TellsHowItEndedWhereEndedChildrenWereIgnored)
+{
+    signal(SIGCHLD, SIG_IGN);
+    EXPECT_EQ(SYS_CHILD_LEFT, RunChild([](void *) { Sys_LeaveChild(3); }).end);
+}
+
+TEST(SysChild, SaysItsLastWordsWhereSignalsWereBlocked)
+{
+    sigset_t all;
+    sigfillset(&all);
+    sigprocmask(SIG_BLOCK, &all, nullptr);
+    Outcome outcome = RunChild([](void *) {
+        Sys_OnChildCrash(SayLastWords);
+        raise(SIGSEGV);
+    });
+    EXPECT_EQ("crash", outcome.written);
+    EXPECT_EQ(SYS_CHILD_CRASHED, outcome.end);
+}
+
 TEST(SysChild, IsGivenUpWhenItIsSilent)
 {
     SysChild child;
