@@ -18,6 +18,7 @@
 #include "app/Native.h"
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
+#include "store/Sys.h"
 
 wxBEGIN_EVENT_TABLE(MyApp, wxApp)
     EVT_ACTIVATE_APP(MyApp::OnActivateApp)
@@ -146,6 +147,7 @@ int main(int argc, char **argv)
 {
     if (AnswerWithoutDisplay(argc, argv))
         return fflush(stdout) == 0 ? 0 : 1;
+    Sys_SurviveFailedWrites();
     if (!wxGetEnv("GDK_BACKEND", nullptr))
         wxSetEnv("GDK_BACKEND", "x11,*"); // other programs can name and raise our window there
     Log_SetUpToolkit();

@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <climits>
+#include <csignal>
 #include <cstdlib>
 #include <cstring>
 #include <ctime>
@@ -121,6 +122,12 @@ static int IsOpenAt(int fd, const char *path)
 {
     struct stat opened, named;
     return fstat(fd, &opened) == 0 && stat(path, &named) == 0 && IsSame(&opened, &named);
+}
+
+void Sys_SurviveFailedWrites()
+{
+    signal(SIGPIPE, SIG_IGN);
+    signal(SIGXFSZ, SIG_IGN);
 }
 
 int Sys_RemoveFile(const char *path)

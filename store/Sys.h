@@ -34,6 +34,10 @@ int Sys_KeepCopy(const char *path, const char *copy);
 
 int Sys_RemoveFile(const char *path); // 1 or 0
 
+// Writing to a closed pipe or beyond a size limit fails like any other write from now on, instead
+// of ending the process with all that is not saved. Call once, at the start.
+void Sys_SurviveFailedWrites();
+
 // Replacing a file in one step: new contents go to a temporary file in the same folder, and
 // Sys_CommitReplace puts it in place of the path (of its target, when it is a symbolic link)
 // after it reached the disk, with the old file's mode and, where allowed, owner. Until then, and

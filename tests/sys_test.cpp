@@ -497,3 +497,14 @@ TEST_F(SysReplaceFile, LetsGoOfTheGroupsRightsWithTheGroup)
 }
 
 } // namespace
+
+TEST(SysSurviveFailedWrites, TurnsSignalsIntoFailures)
+{
+    Sys_SurviveFailedWrites();
+    int ends[2];
+    ASSERT_EQ(0, pipe(ends));
+    close(ends[0]);
+    EXPECT_EQ(-1, write(ends[1], "x", 1));
+    EXPECT_EQ(EPIPE, errno);
+    close(ends[1]);
+}
