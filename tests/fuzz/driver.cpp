@@ -1,11 +1,11 @@
 // tests/fuzz/driver.cpp - runs a fuzz entry point without libFuzzer: over seeds and their
 // mutations.
 //
-//     fuzz_load [-n COUNT] [-s SEED] FILE_OR_FOLDER...
+//     fuzz_load [-l] [-n COUNT] [-s SEED] FILE_OR_FOLDER...
 //
-// First every file as it is, then COUNT mutations (default 200). The same seed (default 1) gives
-// the same mutations. An input that ends or hangs its process is kept as "crash-SEED-NUMBER" in
-// the current folder, and the driver goes on and fails at the end.
+// First every file, or with -l every line of them, as it is, then COUNT mutations (default 200).
+// The same seed (default 1) gives the same mutations. An input that ends or hangs its process is
+// kept as "crash-SEED-NUMBER" in the current folder, and the driver goes on and fails at the end.
 //
 // Inputs run in a process of their own, a few at a time, because name tables only grow.
 #include <algorithm>
@@ -235,6 +235,18 @@ static void AddFile(std::vector<std::string> *seeds, const std::filesystem::path
     seeds->emplace_back(std::istreambuf_iterator<char>(stream), std::istreambuf_iterator<char>());
 }
 
+// In place of the files their lines.
+static std::vector<std::string> Lines(const std::vector<std::string> &files)
+{
+    std::vector<std::string> lines;
+    for (const std::string &text : files)
+        for (size_t start = 0, end; start < text.size(); start = end + 1) {
+            end = std::min(text.find('\n', start), text.size());
+            lines.push_back(text.substr(start, end - start));
+        }
+    return lines;
+}
+
 static void AddSeeds(std::vector<std::string> *seeds, const std::filesystem::path &path)
 {
     if (!std::filesystem::is_directory(path)) {
@@ -252,13 +264,18 @@ int main(int argc, char **argv)
     size_t count = 200;
     unsigned seed = 1;
     std::vector<std::string> seeds;
-    for (int option; (option = getopt(argc, argv, "n:s:")) != -1;)
-        if (option == 'n')
+    bool byLine = false;
+    for (int option; (option = getopt(argc, argv, "ln:s:")) != -1;)
+        if (option == 'l')
+            byLine = true;
+        else if (option == 'n')
             count = strtoul(optarg, nullptr, 10);
         else
             seed = static_cast<unsigned>(strtoul(optarg, nullptr, 10));
     for (int i = optind; i < argc; ++i)
         AddSeeds(&seeds, argv[i]);
+    if (byLine)
+        seeds = Lines(seeds);
     if (seeds.empty()) {
         fprintf(stderr, "%s: no seed files\n", argv[0]);
         return 1;
