@@ -47,14 +47,20 @@ static bool HoldsHighByte(const char *text)
     return false;
 }
 
+std::string Command_Quote(const char *text)
+{
+    for (const char *quote : {"\"", "'"})
+        if (!strchr(text, *quote))
+            return std::string(quote) + text + quote;
+    return "";
+}
+
 std::string Command_QuoteArgument(const char *argument)
 {
     if (!HoldsHighByte(argument) || strchr(argument, ' '))
         return argument;
-    const char *quote = strchr(argument, '"') ? "'" : "\"";
-    if (strchr(argument, *quote))
-        return argument;
-    return std::string(quote) + argument + quote;
+    std::string quoted = Command_Quote(argument);
+    return quoted.empty() ? argument : quoted;
 }
 
 static const char *SkipBlanks(const char *text)
@@ -191,8 +197,9 @@ static bool SaveOrKeep(Command *command, BibFile *file)
     if (!file->modified || FileSet_SaveOne(command->set, file))
         return true;
     FileSet_Append(command->set, file);
-    FileSet_AppendError(command->set, "ERROR: The file '%s' could not be saved, it stays open\n",
-                        file->path);
+    FileSet_AppendError(command->set,
+                        "ERROR: The file '%s' could not be saved (%s), it stays open\n", file->path,
+                        Bib_SaveReason());
     ++command->result.errors;
     return false;
 }
@@ -239,6 +246,17 @@ static void SetCompanion(CommandState *state, const char *rest)
                 strlen(slash + 1));
 }
 
+// Option e. A name that is not known leaves the code page as it is, and letters may look wrong.
+static void SelectEncoding(Command *command, const char *name)
+{
+    Enc_Select(name);
+    if (Ascii_Compare(Enc_Current()->name, name) == 0)
+        return;
+    FileSet_AppendError(command->set, "ERROR: There is no code page '%s', %s stays selected\n",
+                        name, Enc_Current()->name);
+    ++command->result.errors;
+}
+
 static void TakeOption(Command *command, const char *token)
 {
     switch (token[1]) {
@@ -249,7 +267,7 @@ static void TakeOption(Command *command, const char *token)
         SetBaseFolder(command, token + 2);
         break;
     case 'e':
-        Enc_Select(token + 2);
+        SelectEncoding(command, token + 2);
         break;
     case 'i':
         EmptyList(command);

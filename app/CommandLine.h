@@ -29,6 +29,9 @@ struct CommandResult {
 // quotes. Null, logged, when the line does not fit in COMMAND_LINE_SIZE bytes. Static buffer.
 const char *BuildCommandLine(int argc, const char *const *argv);
 
+// The text in quotes of a kind that it does not hold; "" when it holds both kinds.
+std::string Command_Quote(const char *text);
+
 // Puts quotes around an argument that holds a byte of 128 or more and no blank, as the tokenizer
 // would cut it there: with ' when it holds ". One that holds both kinds cannot be expressed and
 // stays as it is.

@@ -135,6 +135,14 @@ TEST_F(BuildCommandLineTest, RefusesALineThatDoesNotFit)
 
 // --- Command_QuoteArgument ---
 
+TEST(CommandQuote, TakesTheKindThatTheTextDoesNotHold)
+{
+    EXPECT_EQ("\"a b\"", Command_Quote("a b"));
+    EXPECT_EQ("\"it's\"", Command_Quote("it's"));
+    EXPECT_EQ("'a \"b\"'", Command_Quote("a \"b\""));
+    EXPECT_EQ("", Command_Quote("it's \"b\""));
+}
+
 TEST(CommandQuoteArgument, LeavesPlainArguments)
 {
     EXPECT_EQ("refs.bib", Command_QuoteArgument("refs.bib"));
@@ -656,7 +664,9 @@ TEST_F(CommandProcess, KeepsAFileOpenThatCannotBeSaved)
     EXPECT_EQ((Tokens{"b.bib", "a.bib"}), Names());
     EXPECT_EQ(file, set.files[1]);
     EXPECT_EQ(1, file->modified);
-    EXPECT_EQ("ERROR: The file '" + path + "' could not be saved, it stays open\n", LoadErrors());
+    EXPECT_EQ("ERROR: The file '" + path +
+                  "' could not be saved (No such file or directory), it stays open\n",
+              LoadErrors());
 
     MendFolder("sub");
     EXPECT_EQ(0, Run("b").errors);
@@ -775,8 +785,9 @@ TEST_F(CommandProcess, SelectsTheEncodingOfOptionE)
 {
     Run("-ecp1251");
     EXPECT_STREQ("CP1251", Enc_Current()->name);
-    EXPECT_EQ(0, Run("-eUTF-8").errors);
+    EXPECT_EQ(1, Run("-eUTF-8").errors);
     EXPECT_STREQ("CP1251", Enc_Current()->name);
+    EXPECT_EQ("ERROR: There is no code page 'UTF-8', CP1251 stays selected\n", LoadErrors());
     EXPECT_EQ(1, Logged("Cartulo: ERROR: Can't select unknown encoding: UTF-8"));
 }
 
@@ -857,7 +868,8 @@ TEST_F(CommandProcess, KeepsAFileListedThatCannotBeSavedAtOptionI)
     ASSERT_EQ(1, set.count);
     EXPECT_EQ(file, set.files[0]);
     EXPECT_EQ(1, file->modified);
-    EXPECT_EQ("ERROR: The file '" + path + "' could not be saved, it stays open\n", LoadErrors());
+    EXPECT_EQ("ERROR: The file '" + path + "' could not be saved (Is a directory), it stays open\n",
+              LoadErrors());
     MendFolder("sub");
 }
 
