@@ -25,20 +25,33 @@ void FileSet_Append(BibFileSet *set, BibFile *file)
     set->files[set->count++] = file;
 }
 
+static void AppendText(char **heapText, const std::string &more)
+{
+    size_t length = *heapText ? strlen(*heapText) : 0;
+    char *text = static_cast<char *>(realloc(*heapText, length + more.size() + 1));
+    if (!text)
+        return;
+    *heapText = text;
+    memcpy(text + length, more.c_str(), more.size() + 1);
+}
+
+static std::string Format(const char *format, va_list arguments)
+{
+    va_list again;
+    va_copy(again, arguments);
+    int length = vsnprintf(nullptr, 0, format, arguments);
+    std::string text(static_cast<size_t>(length) + 1, '\0');
+    vsnprintf(text.data(), text.size(), format, again);
+    va_end(again);
+    text.pop_back();
+    return text;
+}
+
 void FileSet_AppendError(BibFileSet *set, const char *format, ...)
 {
     va_list arguments;
     va_start(arguments, format);
-    va_list again;
-    va_copy(again, arguments);
-    size_t length = set->loadErrors ? strlen(set->loadErrors) : 0;
-    int more = vsnprintf(nullptr, 0, format, arguments);
-    char *text = static_cast<char *>(realloc(set->loadErrors, length + more + 1));
-    if (text) {
-        set->loadErrors = text;
-        vsnprintf(text + length, more + 1, format, again);
-    }
-    va_end(again);
+    AppendText(&set->loadErrors, Format(format, arguments));
     va_end(arguments);
 }
 
@@ -51,6 +64,12 @@ static int IsRepeated(const BibFileSet *set, int index)
     return 0;
 }
 
+static void ClearSaveErrors(BibFileSet *set)
+{
+    free(set->saveErrors);
+    set->saveErrors = nullptr;
+}
+
 void FileSet_Free(BibFileSet *set)
 {
     for (int i = set->count - 1; i >= 0; --i) {
@@ -61,6 +80,7 @@ void FileSet_Free(BibFileSet *set)
     }
     free(set->files);
     free(set->loadErrors);
+    ClearSaveErrors(set);
     set->files = nullptr;
     set->loadErrors = nullptr;
     set->count = 0;
@@ -168,12 +188,15 @@ int FileSet_Open(BibFileSet *set, const char *path)
 
 // --- Saving ---
 
-int FileSet_SaveOne(BibFileSet *set, BibFile *file)
+static int SaveRecord(BibFileSet *set, BibFile *file)
 {
     int wasLocked = file->lockHandle != 0;
     Sys_UnlockFile(file->lockHandle);
     file->lockHandle = 0;
     int saved = Bib_SaveFile(file);
+    if (!saved)
+        AppendText(&set->saveErrors,
+                   "File: `" + std::string(file->path) + "'\n" + Bib_SaveReason() + "\n");
     if (!wasLocked)
         return saved;
     file->lockHandle = Sys_LockFile(file->path);
@@ -182,25 +205,44 @@ int FileSet_SaveOne(BibFileSet *set, BibFile *file)
     return saved;
 }
 
+int FileSet_SaveOne(BibFileSet *set, BibFile *file)
+{
+    ClearSaveErrors(set);
+    return SaveRecord(set, file);
+}
+
 int FileSet_SaveAll(BibFileSet *set)
 {
+    ClearSaveErrors(set);
     int modified = 0;
     int failed = 0;
     for (int i = 0; i < set->count; ++i) {
         if (!IsModified(set, i))
             continue;
         ++modified;
-        failed += !FileSet_SaveOne(set, set->files[i]);
+        failed += !SaveRecord(set, set->files[i]);
     }
     return modified > 0 && failed == 0;
 }
 
-char *FileSet_SaveQuestion(const BibFileSet *set)
+static std::string ModifiedPaths(const BibFileSet *set)
 {
-    std::string text = "There are modified Bib-files:\n\n";
+    std::string text;
     for (int i = 0; i < set->count; ++i)
         if (IsModified(set, i))
             text += std::string(set->files[i]->path) + "\n";
-    text += "\nDo you want to save them ?";
+    return text;
+}
+
+char *FileSet_ModifiedPaths(const BibFileSet *set)
+{
+    std::string text = ModifiedPaths(set);
+    return Bib_CopyText(text.c_str(), text.size());
+}
+
+char *FileSet_SaveQuestion(const BibFileSet *set)
+{
+    std::string text =
+        "There are modified Bib-files:\n\n" + ModifiedPaths(set) + "\nDo you want to save them ?";
     return Bib_CopyText(text.c_str(), text.size());
 }

@@ -8,6 +8,8 @@ struct BibFileSet {
     BibFile **files; // heap, `count` pointers, in the order of the command line
     int count;
     char *loadErrors; // heap: what could not be opened, for the messages window; null when nothing
+    char *saveErrors; // heap: what the last FileSet_SaveAll or FileSet_SaveOne could not write, one
+                      // "File: `path'\nreason\n" each; null when it wrote everything
     // Shows a warning with an OK button and returns when it is closed. Null: only the log.
     void (*box)(void *owner, const char *caption, const char *text);
     void *boxOwner;
@@ -38,6 +40,9 @@ int FileSet_SaveOne(BibFileSet *set, BibFile *file);
 // Saves every modified file. -1 is never returned here: the question is the panel's.
 // 0 when nothing was modified or a write failed, 1 when all were saved.
 int FileSet_SaveAll(BibFileSet *set);
+
+// The paths of the files with unsaved changes, one a line; malloc'd.
+char *FileSet_ModifiedPaths(const BibFileSet *set);
 
 // "There are modified Bib-files: ..." for the question before saving; malloc'd.
 char *FileSet_SaveQuestion(const BibFileSet *set);

@@ -232,6 +232,22 @@ static void WriteContents(const BibFile *file, FILE *stream)
     Flush(out);
 }
 
+// --- Refusals ---
+
+static char Reason[256];
+
+const char *Bib_SaveReason()
+{
+    return Reason;
+}
+
+// Called right after what failed: the system still knows why.
+static void Refuse(const char *message, const char *path)
+{
+    snprintf(Reason, sizeof Reason, "%s", Sys_LastErrorText());
+    AppLog(message, path);
+}
+
 // --- The backup ---
 //
 // It is made before the new contents are written, so that a folder that takes no backup is reported
@@ -294,14 +310,32 @@ static int MakeRoom(const BibFile *file, Backup *backup)
         free(older);
     if (Sys_RemoveFile(backup->name))
         return 1;
-    AppLog("ERROR: Can't remove backup file: ", backup->name);
+    Refuse("ERROR: Can't remove backup file: ", backup->name);
     return 0;
+}
+
+// Another program has written the file since this one loaded or saved it. Such contents exist
+// nowhere else, so they are kept like those that were there at the start.
+static int ChangedOutside(const BibFile *file)
+{
+    uint64_t stamp = Sys_FileStamp(file->path);
+    if (stamp == 0 || stamp == file->stamp)
+        return 0;
+    AppLog("WARNING: Another program has changed the Bib-file: ", file->path);
+    return 1;
+}
+
+static int WantsBackup(const BibFile *file)
+{
+    if (BibBackupMode < 0 || !Sys_FileExists(file->path))
+        return 0;
+    return !file->backupDone || ChangedOutside(file);
 }
 
 // 1 when the path may be replaced.
 static int MakeBackup(const BibFile *file, Backup *backup)
 {
-    if (file->backupDone || BibBackupMode < 0 || !Sys_FileExists(file->path))
+    if (!WantsBackup(file))
         return 1;
     bool dated = BibBackupMode >= 2;
     backup->name = dated ? FreeDatedName(file) : CopyName(Bib_BackupName(file, -1));
@@ -309,7 +343,7 @@ static int MakeBackup(const BibFile *file, Backup *backup)
         return 0;
     backup->made = Sys_KeepCopy(file->path, backup->name);
     if (!backup->made)
-        AppLog("ERROR: Can't rename to BAK-file the Bib-file: ", file->path);
+        Refuse("ERROR: Can't rename to BAK-file the Bib-file: ", file->path);
     return backup->made;
 }
 
@@ -343,7 +377,7 @@ static int ReplaceContents(const BibFile *file)
         if (Sys_CommitReplace(&replace))
             return 1;
     }
-    AppLog("ERROR: Can't open file: ", file->path);
+    Refuse("ERROR: Can't open file: ", file->path);
     return 0;
 }
 
@@ -351,6 +385,7 @@ int Bib_SaveFile(BibFile *file)
 {
     if (file->readOnly) {
         AppLog("ERROR: ReadOnly Bib-file: ", file->path);
+        snprintf(Reason, sizeof Reason, "The file is read-only");
         return 0;
     }
     Backup backup = {};
@@ -360,5 +395,6 @@ int Bib_SaveFile(BibFile *file)
         return 0;
     file->backupDone = 1;
     file->modified = 0;
+    file->stamp = Sys_FileStamp(file->path);
     return 1;
 }

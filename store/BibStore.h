@@ -74,6 +74,7 @@ struct BibFile {
     int32_t warningCount;
     char *messages;                   // heap, BIB_MESSAGES_SIZE bytes; null without a message
     char preamble[BIB_PREAMBLE_SIZE]; // each piece is followed by CR LF
+    uint64_t stamp;                   // Sys_FileStamp of what was loaded or saved last
 };
 
 // Process-wide name tables: shared by all files, they only grow.
@@ -152,11 +153,15 @@ void Bib_ReportMessage(const char *className, int errorClass, const char *fileNa
 
 // --- Saving (BibSave.cpp) ---
 
-// Writes the file back; the first save of a run keeps the old contents under a backup name.
+// Writes the file back; the first save of a run keeps the old contents under a backup name, and so
+// does a later one that finds contents which another program has written.
 // The path holds the complete old or the complete new contents at any time. Returns 1 and clears
 // `modified`, or logs the reason and returns 0 with the records unchanged. Release the lock
 // before, take it again after: the path is another file then.
 int Bib_SaveFile(BibFile *file);
+
+// Why the last Bib_SaveFile returned 0, in the system's words. Static text.
+const char *Bib_SaveReason();
 
 // Writes one value in BibTeX syntax; repairs unbalanced braces, with a warning in the log.
 void Bib_WriteValue(const char *value, FILE *stream);

@@ -135,6 +135,30 @@ int Sys_RemoveFile(const char *path)
     return unlink(path) == 0;
 }
 
+static uint64_t Stamp(const struct stat *status)
+{
+    if (!S_ISREG(status->st_mode))
+        return 0;
+    uint64_t stamp = 14695981039346656037u; // FNV-1a over the words
+    for (uint64_t word :
+         {uint64_t(status->st_dev), uint64_t(status->st_ino), uint64_t(status->st_size),
+          uint64_t(status->st_mtim.tv_sec), uint64_t(status->st_mtim.tv_nsec)})
+        stamp = (stamp ^ word) * 1099511628211u;
+    return stamp ? stamp : 1;
+}
+
+uint64_t Sys_FileStamp(const char *path)
+{
+    struct stat status;
+    return stat(path, &status) == 0 ? Stamp(&status) : 0;
+}
+
+uint64_t Sys_StreamStamp(FILE *stream)
+{
+    struct stat status;
+    return fstat(fileno(stream), &status) == 0 ? Stamp(&status) : 0;
+}
+
 // --- Reading ---
 
 // 1 when the mode is that of a regular file, else 0 with the reason in errno.

@@ -13,6 +13,11 @@ int Sys_FileExists(const char *path);  // 1 also for folders and devices
 int Sys_WriteAccess(const char *path); // 0 when writable, else -1, as BibFile::readOnly wants it
 int Sys_SameFile(const char *a, const char *b); // 1 when both exist and are one file
 
+// A number that changes when the file is written or replaced; 0 when there is no such file, or
+// when it is not a regular one.
+uint64_t Sys_FileStamp(const char *path);
+uint64_t Sys_StreamStamp(FILE *stream);
+
 // Opens a regular file for reading; anything else (folder, device, pipe) fails without waiting.
 // Null on failure, with the reason in Sys_LastErrorText().
 FILE *Sys_OpenRegular(const char *path);

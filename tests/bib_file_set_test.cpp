@@ -428,6 +428,33 @@ TEST_F(FileSet, TellsThatTheLockIsLost)
     EXPECT_THAT(boxes, ElementsAre("ReLocking BIB file|File: `" + path + "'\nIs a directory"));
     EXPECT_THAT(log.Lines(), ElementsAre("ERROR: Can't open file: " + path,
                                          "ERROR: File: `" + path + "' Is a directory"));
+    EXPECT_EQ("File: `" + path + "'\nIs a directory\n", std::string(set.saveErrors));
+}
+
+TEST_F(FileSet, TellsWhyFilesWereNotSaved)
+{
+    BibFile *a = Open("a.bib", Good);
+    BibFile *b = Open("b.bib", Good);
+    a->modified = b->modified = 1;
+    b->readOnly = 1;
+    EXPECT_EQ(0, FileSet_SaveAll(&set));
+    EXPECT_EQ("File: `" + std::string(b->path) + "'\nThe file is read-only\n",
+              std::string(set.saveErrors));
+    b->readOnly = 0;
+    EXPECT_EQ(1, FileSet_SaveAll(&set));
+    EXPECT_EQ(nullptr, set.saveErrors);
+}
+
+TEST_F(FileSet, ListsEachModifiedFileOnce)
+{
+    BibFile *a = Open("a.bib", Good);
+    BibFile *b = Open("b.bib", Good);
+    Open("c.bib", Good);
+    FileSet_Append(&set, a);
+    a->modified = b->modified = 1;
+    char *paths = FileSet_ModifiedPaths(&set);
+    EXPECT_EQ(std::string(a->path) + "\n" + b->path + "\n", paths);
+    free(paths);
 }
 
 } // namespace

@@ -348,6 +348,25 @@ TEST_F(BibSave, MakesOneBackupInARun)
     EXPECT_EQ(OldText, folder.Read(BackupName()));
 }
 
+TEST_F(BibSave, KeepsWhatAnotherProgramWroteInBetween)
+{
+    folder.Write("refs.bib", OldText);
+    EXPECT_EQ("", Saved());
+    std::set<std::string> before = folder.Names();
+    folder.Write("refs.bib", "written by another program");
+    AddNew();
+    EXPECT_EQ(NewText, Saved());
+    int kept = 0;
+    for (const std::string &name : folder.Names())
+        kept += before.count(name) == 0 && folder.Read(name) == "written by another program";
+    EXPECT_EQ(1, kept);
+    EXPECT_EQ(3u, folder.Names().size());
+    EXPECT_THAT(log.Lines(), ElementsAre("WARNING: Another program has changed the Bib-file: " +
+                                         std::string(file->path)));
+    EXPECT_EQ(NewText, Saved()); // and that was all
+    EXPECT_EQ(3u, folder.Names().size());
+}
+
 TEST_F(BibSave, DealsWithTheBackupOnceEvenWithoutAnOldFile)
 {
     EXPECT_EQ("", Saved());
@@ -664,6 +683,7 @@ TEST_F(BibSave, FailsInAMissingFolder)
 {
     Make(folder.Path("missing/refs.bib"));
     ExpectFailedSave("ERROR: Can't open file: ", file->path);
+    EXPECT_STREQ("No such file or directory", Bib_SaveReason());
     EXPECT_THAT(folder.Names(), IsEmpty());
 }
 
