@@ -286,6 +286,22 @@ static void FreeTree(AST *ast, size_t pieces)
         bt_free_ast(ast);
 }
 
+// Such bytes in a file can't be told from our own marks: a save would turn text into names of
+// abbreviations. An error keeps the file from being written.
+static void ReportMarks(const char *text, size_t length)
+{
+    const void *mark = memchr(text, BIB_OPEN_ABBREVIATION, length);
+    if (!mark)
+        mark = memchr(text, BIB_CLOSE_ABBREVIATION, length);
+    if (!mark)
+        return;
+    int line = 1;
+    for (const char *at = text; at < mark; ++at)
+        line += *at == '\n';
+    PackMessage(Sending, BTERR_LEXERR, line,
+                "control character 0x02 or 0x05, which marks abbreviations in this program");
+}
+
 static void PrintTree(AST *ast)
 {
     static char heading[] = "AST for whole entry:\n";
@@ -327,6 +343,7 @@ void BibChild_Parse(void *argument)
     FILE *stream = Sys_OpenText(text, length);
     if (!stream)
         Leave(BIB_END_UNREADABLE);
+    ReportMarks(text, length);
     Sys_UsePlainLocale();
     bt_set_stringopts(BTE_MACRODEF, BibStringOptions);
     bt_set_stringopts(BTE_REGULAR, BibStringOptions);

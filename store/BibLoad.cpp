@@ -203,6 +203,13 @@ static BibStored StoreStrings(BibFile *file, ItemReader reader)
     return BIB_STORED;
 }
 
+// An error, so that the file becomes read-only: a save would lose the piece.
+static void ReportLostPiece(const BibFile *file, int line)
+{
+    Bib_ReportMessage(nullptr, BTERR_LEXERR, file->path, line, nullptr, -1,
+                      "the preamble is too long, a piece of it was not loaded");
+}
+
 static void StorePreamble(BibFile *file, ItemReader reader)
 {
     AppLog("Preamble: ", NextText(&reader));
@@ -213,6 +220,7 @@ static void StorePreamble(BibFile *file, ItemReader reader)
         if (used + length + 2 >= BIB_PREAMBLE_SIZE) {
             AppLog("ERROR: Preamble too long in ", file->path);
             AppLog("ERROR: call Quarlo Technical support to solve the problem");
+            ReportLostPiece(file, reader.header.line);
             continue;
         }
         memcpy(file->preamble + used, piece, length);
@@ -443,6 +451,7 @@ static BibFile *NewFile(const char *path, FILE *stream)
     file->path = Bib_CopyText(path, strlen(path));
     file->baseName = BaseName(path);
     file->readOnly = Sys_WriteAccess(path);
+    file->stamp = Sys_StreamStamp(stream);
     return file;
 }
 

@@ -211,6 +211,20 @@ TEST_F(BibLoad, DropsOnlyThePreamblePieceThatDoesNotFit)
     Load("@preamble{{" + big + "} # {" + std::string(188, 'y') + "} # {" + std::string(187, 'z') +
          "}}\n");
     EXPECT_EQ(big + "\r\n" + std::string(187, 'z') + "\r\n", file->preamble);
+    EXPECT_EQ("ERROR: line 1: the preamble is too long, a piece of it was not loaded\r\n",
+              Messages(file));
+    EXPECT_EQ(1, file->errorCount);
+}
+
+// A save would make abbreviations of what follows them.
+TEST_F(BibLoad, CountsMarksOfAbbreviationsInAFile)
+{
+    for (const char *mark : {"\2", "\5"}) {
+        Load("@misc{k, a = {x}}\n\n@misc{l, b = {y" + std::string(mark) + "z}}\n");
+        EXPECT_EQ("k l ", Keys());
+        EXPECT_EQ(1, file->errorCount);
+        EXPECT_EQ(0u, Messages(file).find("ERROR: line 3: control character")) << Messages(file);
+    }
 }
 
 TEST(BibLoadLog, TellsOfAPreambleThatIsTooLong)
