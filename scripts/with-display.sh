@@ -13,8 +13,9 @@ seconds=30 # how long the screen and the window manager may take to come up
 work=$(mktemp -d) || exit 125
 screen= manager= command=
 
-# Ends what was started here, and nothing else.
+# Ends what was started here, and nothing else. The command has a process group of its own.
 clean_up() {
+    [ -z "$command" ] || kill -- "-$command" 2>/dev/null
     for process in $command $manager $screen; do
         kill "$process" 2>/dev/null
         wait "$process" 2>/dev/null
@@ -59,7 +60,7 @@ until xprop -root _NET_SUPPORTING_WM_CHECK 2>/dev/null | grep -q 'window id'; do
     sleep 0.05
 done
 
-dbus-run-session -- "$@" &
+setsid dbus-run-session -- "$@" &
 command=$!
 wait "$command"
 status=$?
