@@ -26,7 +26,10 @@ for argument in "$@"; do
     esac
 done
 picture=$here/build/window.png
+rm -f "$picture"
 echo "No display: the editor runs on a virtual screen." >&2
+status=0
 "$here/scripts/with-display.sh" "$here/scripts/picture.sh" "$picture" \
-    "$here/build/release/cartulo" "$@"
-echo "A picture of its window: $picture"
+    "$here/build/release/cartulo" "$@" || status=$?
+[ ! -e "$picture" ] || echo "A picture of its window: $picture"
+exit "$status"
