@@ -16,7 +16,7 @@ XDG_CONFIG_HOME=$folder/config/new CARTULO_LOG=1:$folder/log "$program" "Müller
 editor=$!
 
 tries=0
-until window=$(xdotool search --onlyvisible --pid "$editor" --name '^Quarlo Cartulo$'); do
+until window=$(xdotool search --all --onlyvisible --pid "$editor" --name '^Quarlo Cartulo$'); do
     tries=$((tries + 1))
     [ "$tries" -lt 200 ] && kill -0 "$editor" || { echo "no window" >&2; exit 1; }
     sleep 0.1
