@@ -1,9 +1,9 @@
 #include "tests/gui/GuiTest.h"
 
 #include <chrono>
+#include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <ostream>
 
 #include <wx/app.h>
 #include <wx/scrolwin.h>
@@ -12,6 +12,7 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
+#include "app/Companion.h"
 #include "app/Ids.h"
 #include "app/LogGui.h"
 #include "ui/Cartulo.h"
@@ -101,6 +102,39 @@ int ExpectMessages::OnInvoked(Cartulo_Messages *dialog) const
 wxString ExpectMessages::GetDefaultDescription() const
 {
     return "messages window \"" + m_heading + "\"";
+}
+
+// --- The log ---
+
+static std::vector<LogLine> logged;
+
+// Takes the place of the program's own.
+void TNSMessage(const char *prefix, const char *text, int level)
+{
+    logged.push_back({std::string(prefix) + text, level});
+    if (level >= TNS_WARNING)
+        fprintf(stderr, "%s%s\n", prefix, text);
+}
+
+void PrintTo(const LogLine &line, std::ostream *out)
+{
+    *out << line.level << " \"" << line.text << '"';
+}
+
+std::vector<LogLine> TakeLog(const std::string &start)
+{
+    std::vector<LogLine> lines;
+    for (const LogLine &line : logged) {
+        if (line.text.compare(0, start.size(), start) == 0)
+            lines.push_back(line);
+    }
+    logged.clear();
+    return lines;
+}
+
+void ForgetLog()
+{
+    logged.clear();
 }
 
 // --- The event loop ---

@@ -7,6 +7,7 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <ostream>
 #include <string>
 #include <vector>
 
@@ -72,6 +73,19 @@ public:
 
 // Lets the program run until the condition holds; false when it does not within the deadline.
 bool WaitFor(const std::function<bool()> &condition, int milliseconds = 5000);
+
+// One message of the program, as it would be written.
+struct LogLine {
+    std::string text;
+    int level;
+
+    bool operator==(const LogLine &o) const { return text == o.text && level == o.level; }
+};
+void PrintTo(const LogLine &line, std::ostream *out);
+
+// The messages since the last call or the last ForgetLog that begin with `start`.
+std::vector<LogLine> TakeLog(const std::string &start);
+void ForgetLog();
 
 void HandleQueuedEvents();
 void DeleteClosedWindows(); // as the event loop does when it is idle
