@@ -78,9 +78,9 @@ const char *MyApp::TakeCommandLine()
     const char *rest = NextToken(line, first, sizeof first);
     if (!rest || Ascii_CompareN(first, "-d", 2) != 0)
         return line;
-    if (strlen(first + 2) >= sizeof m_command.baseFolder)
+    if (strlen(first + 2) >= sizeof m_state.baseFolder)
         return line; // the panel says that it is too long
-    strcpy(m_command.baseFolder, first + 2);
+    strcpy(m_state.baseFolder, first + 2);
     return rest;
 }
 
@@ -107,7 +107,7 @@ bool MyApp::OnInit()
     AppLog("Cartulo::OnInit --- ", "pConfig");
     OpenConfig();
     AppLog("Cartulo::OnInit --- ", "Frame ...");
-    m_frame = new MyFrame("Quarlo Cartulo", commandLine, &m_command);
+    m_frame = new MyFrame("Quarlo Cartulo", commandLine, &m_state);
     // Programs that this one starts find its window so.
     wxSetEnv("QUARLOSTERWINDOW", wxString::Format("%ld", Native_WindowHandle(m_frame)));
     m_frame->Show();

@@ -27,7 +27,7 @@ private:
 
     int m_argumentCount;
     char **m_arguments;
-    CommandState m_command = {};
+    CommandState m_state = {};
     wxWeakRef<MyFrame> m_frame;
 
     wxDECLARE_EVENT_TABLE();

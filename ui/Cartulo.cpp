@@ -45,7 +45,7 @@ wxEND_EVENT_TABLE()
 Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     : wxSplitterWindow(parent, ID_SPLITTER, wxDefaultPosition, parent->GetClientSize(),
                        wxSP_3D | wxSP_LIVE_UPDATE, "splitter"),
-      m_command(state)
+      m_state(state)
 {
     m_set.box = ShowBox;
     m_set.boxOwner = this;
@@ -57,7 +57,8 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     m_list = new QListBox(this, this, ID_INDEX, wxDefaultPosition, wxDefaultSize, wxBORDER_STATIC);
     CreateEntryPane();
     CreateOpenPane();
-    RefreshFiles(nullptr);
+    Arrange();
+    RefreshList(nullptr);
 }
 
 Cartulo::~Cartulo()
@@ -135,19 +136,33 @@ void Cartulo::ShowBox(void *owner, const char *caption, const char *text)
     wxMessageBox(PathText(text), caption, wxOK | wxICON_WARNING, wxGetTopLevelParent(panel));
 }
 
-int Cartulo::ProcessCommand(const char *commandLine, const char *origin)
+// 1 when the record, which was at `path`, is still in the set; it may have been freed.
+static int IsOpen(const BibFileSet *set, const BibFile *file, const std::string &path)
 {
-    TNSMessage("INFO: ProcessCommand ", origin, TNS_LIFECYCLE);
-    BibEntry *select = m_entry; // may be freed below: from there on only compared
+    for (int i = 0; i < set->count; ++i)
+        if (set->files[i] == file && path == set->files[i]->path)
+            return 1;
+    return 0;
+}
+
+int Cartulo::ProcessCommand(const char *commandLine, const char *)
+{
+    // No row and no entry may be read while files are closed: boxes let the window draw.
+    BibEntry *entry = m_entry;
+    const BibFile *file = entry ? m_set.files[m_file] : nullptr;
+    std::string path = file ? file->path : "";
     m_entry = nullptr;
     m_file = -1;
     if (m_list)
         m_list->Drop_Index();
     m_busy = true;
-    CommandResult result = Command_Process(&m_set, m_command, commandLine);
+    CommandResult result = Command_Process(&m_set, m_state, commandLine);
     m_busy = false;
-    if (m_list)
-        RefreshFiles(select);
+    if (m_list) {
+        if (result.changes != 0)
+            Arrange();
+        RefreshList(IsOpen(&m_set, file, path) ? entry : nullptr);
+    }
     if (result.errors != 0) {
         TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
         GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, ID_MESSAGES));
@@ -155,13 +170,15 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *origin)
     return 0;
 }
 
-// Shows what is open now, with the entry `select` if it is still there.
-void Cartulo::RefreshFiles(BibEntry *select)
+// Shows the rows of what is open now, and the entry `select` or the first.
+void Cartulo::RefreshList(BibEntry *select)
 {
     m_list->Update_Index(select, m_search.c_str());
-    Arrange();
     Update_Tools();
-    ShowSelection();
+    if (m_list->GetItemCount() > 0)
+        ShowRow("OnIndexChanged");
+    else
+        ClearEntry();
 }
 
 // The panes that fit the number of files.

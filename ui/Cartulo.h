@@ -24,7 +24,7 @@ public:
     const BibEntry *CurrentEntry() const { return m_entry; } // null for none
 
     // Carries out a command line: opens and closes files, shows what is open then. `origin` says
-    // where the line came from. Returns 0.
+    // where the line came from; it changes nothing. Returns 0.
     int ProcessCommand(const char *commandLine, const char *origin);
 
     void SetModified(int file); // the file of this index has one change more
@@ -54,7 +54,7 @@ private:
     void CreateOpenPane();
     wxStaticText *CreateHeading(wxWindow *parent, const wxString &text);
     void Arrange();
-    void RefreshFiles(BibEntry *select);
+    void RefreshList(BibEntry *select);
     void ShowSelection();
     void ClearEntry();
     void FillRow(int row, const BibField *field);
@@ -70,7 +70,7 @@ private:
     void OnSashMove(wxSplitterEvent &event);
 
     BibFileSet m_set = {};
-    CommandState *m_command;
+    CommandState *m_state;
     BibEntry *m_entry = nullptr; // owned by its file; null whenever that may be freed
     int m_file = -1;             // index of the file that holds m_entry
     std::string m_search;        // store text

@@ -161,6 +161,7 @@ void HandleQueuedEvents()
 
 void CartuloWindow::Open(const std::string &commandLine)
 {
+    ForgetLog();
     frame = new MyFrame("Quarlo Cartulo", commandLine.c_str(), &state);
     frame->Show();
     ASSERT_TRUE(WaitFor([this] { return frame->IsShownOnScreen() && frame->IsActive(); }));

@@ -16,6 +16,7 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
+#include "app/Companion.h"
 #include "app/Ids.h"
 #include "store/Sys.h"
 #include "ui/Cartulo.h"
@@ -26,6 +27,9 @@
 using Window = CartuloWindow;
 
 static const char OneEntry[] = "@book{one, title = {First}}\n";
+
+static const char Shown[] = "INFO: Cartulo::OnIndexChanged to ";
+using Lines = std::vector<LogLine>;
 
 // --- Files ---
 
@@ -81,6 +85,21 @@ TEST_F(Window, OpensTheFileThatTheDialogNames)
     EXPECT_FALSE(IsShowing(ID_OPEN));
     EXPECT_TRUE(IsShowing(ID_INDEX));
     EXPECT_EQ("There are 1 bibliography entries in 1 BIB files.", Status());
+    EXPECT_EQ((Lines{{std::string(Shown) + "one (with blank)", TNS_ACTION}}), TakeLog(Shown));
+}
+
+TEST_F(Window, LogsTheEntryThatItShowsFirst)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    EXPECT_EQ((Lines{{std::string(Shown) + "one (a)", TNS_ACTION}}), TakeLog(Shown));
+}
+
+TEST_F(Window, LogsNothingAboutASelectionWhenThereIsNone)
+{
+    Open(folder.Write("new.bib", ""));
+    Panel()->ProcessCommand("", "test");
+    for (const LogLine &line : TakeLog(""))
+        EXPECT_EQ(std::string::npos, line.text.find("OnIndex")) << line.text;
 }
 
 TEST_F(Window, GoesBackToTheOpenPaneWhenTheLastFileIsClosed)
@@ -125,6 +144,18 @@ TEST_F(Window, KeepsTheShownEntryWhenItsFileStaysOpen)
     EXPECT_EQ(3u, Rows().size());
     EXPECT_EQ((std::vector<Field>{{"note", "Second"}}), ShownFields());
     EXPECT_EQ(a, TextAfter("BIB File:"));
+}
+
+TEST_F(Window, KeepsTheShownEntryWhenTheSameFilesAreNamedAgain)
+{
+    std::string a = folder.Write("a.bib", std::string(OneEntry) + "@misc{two, note = {Second}}\n");
+    Open(a);
+    TypeIntoList('t', 1000);
+    const BibEntry *entry = Panel()->CurrentEntry();
+    Panel()->ProcessCommand(a.c_str(), "test");
+    EXPECT_EQ(entry, Panel()->CurrentEntry());
+    EXPECT_EQ(1, List()->GetSelection());
+    EXPECT_EQ((std::vector<Field>{{"note", "Second"}}), ShownFields());
 }
 
 // Another process that holds the lock of a file.
