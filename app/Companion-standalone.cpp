@@ -46,12 +46,14 @@ static Sink OpenSink()
     return {OpenStream(colon ? colon + 1 : ""), ParseLevel(setting)};
 }
 
-// What would end the line becomes a blank, and so does ESC: text of a file must not steer the
+// Control characters become blanks: a message is one line, and text of a file must not steer the
 // terminal that shows the log.
 static char *PutText(char *out, const char *text)
 {
-    for (; *text; ++text)
-        *out++ = *text == '\r' || *text == '\n' || *text == '\x1B' ? ' ' : *text;
+    for (; *text; ++text) {
+        unsigned char c = static_cast<unsigned char>(*text);
+        *out++ = c < ' ' || c == 127 ? ' ' : *text;
+    }
     return out;
 }
 

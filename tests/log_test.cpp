@@ -170,16 +170,23 @@ TEST(TNSMessage, UsesStandardErrorWhenTheFileCannotBeOpened)
     EXPECT_EQ("5\n", LevelsShown("5:/no such folder/log"));
 }
 
-TEST(TNSMessage, ShowsLineEndsAndEscapesAsBlanks)
+TEST(TNSMessage, ShowsControlCharactersAsBlanks)
 {
     std::string log = LogOf(nullptr, [] { TNSMessage("a\nb: ", "one\r\ntwo\x1B[2Jend\n", 5); });
     EXPECT_EQ("a b: one  two [2Jend \n", log);
+    std::string controls = "\x7F";
+    for (char c = 1; c < ' '; ++c)
+        controls += c;
+    EXPECT_EQ(std::string(32, ' ') + "\n",
+              LogOf(nullptr, [&] { TNSMessage("", controls.c_str(), 5); }));
 }
 
 TEST(TNSMessage, KeepsEveryOtherByte)
 {
-    EXPECT_EQ("\x02jan\x05\t\xE4\xFF\n",
-              LogOf(nullptr, [] { TNSMessage("", "\x02jan\x05\t\xE4\xFF", 5); }));
+    std::string bytes;
+    for (int c = ' '; c < 256; ++c)
+        bytes += c == 127 ? "" : std::string(1, static_cast<char>(c));
+    EXPECT_EQ(bytes + "\n", LogOf(nullptr, [&] { TNSMessage("", bytes.c_str(), 5); }));
 }
 
 TEST(TNSMessage, WritesEveryLineAtOnceAndInOnePiece)
