@@ -8,6 +8,14 @@ static const Shortcut Shortcuts[] = {
     {'M', 1, ID_MESSAGES, "Show Messages ..."},
 };
 
+int Frame_ShortcutKey(int key, int typed, int latin, bool alt, bool ctrl)
+{
+    bool altGr = alt && ctrl; // so it shows
+    if (altGr && typed > ' ' && typed != key)
+        return 0; // a character that is to be typed
+    return key == 0 && !altGr ? latin : key;
+}
+
 const Shortcut *Frame_FindShortcut(int key, bool alt, bool ctrl)
 {
     if (key <= 0 || key > 127)
@@ -18,4 +26,11 @@ const Shortcut *Frame_FindShortcut(int key, bool alt, bool ctrl)
             return &row;
     }
     return nullptr;
+}
+
+uint32_t Frame_LogCharacter(uint32_t character)
+{
+    bool isControl = character < ' ' || (character >= 0x7F && character < 0xA0);
+    bool isSurrogate = character >= 0xD800 && character <= 0xDFFF;
+    return isControl || isSurrogate ? ' ' : character;
 }

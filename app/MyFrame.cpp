@@ -86,28 +86,24 @@ void MyFrame::OnSearch(wxCommandEvent &event)
     OnCommand(event);
 }
 
-// The key to look up; 0 for one that is for the control with the focus.
-static int ShortcutKey(const wxKeyEvent &event)
+static void LogKey(const wxKeyEvent &event)
 {
     int key = event.GetKeyCode();
-    int typed = event.GetUnicodeKey();
-    bool altGr = event.AltDown() && event.ControlDown();
-    if (altGr && typed > ' ' && typed != key)
-        return 0;
-    return key == 0 && !altGr ? Native_LatinLetter(event) : key;
+    uint32_t character = key < WXK_START ? uint32_t(key) : 0; // the others are no characters
+    wxString text = wxString::Format(
+        "Key=%d(%c),Mod=%x", key, wxUniChar(Frame_LogCharacter(character)), event.GetModifiers());
+    TNSMessage("INFO: MyFrame::OnCharHook ", text.utf8_str(), TNS_LIFECYCLE);
 }
 
 void MyFrame::OnCharHook(wxKeyEvent &event)
 {
     if (GetStatusBar())
         SetStatusText("", 0);
-    int key = event.GetKeyCode();
-    TNSMessage(
-        "INFO: MyFrame::OnCharHook ",
-        wxString::Format("Key=%d(%c),Mod=%x", key, wxUniChar(key), event.GetModifiers()).utf8_str(),
-        TNS_LIFECYCLE);
-    const Shortcut *row =
-        Frame_FindShortcut(ShortcutKey(event), event.AltDown(), event.ControlDown());
+    LogKey(event);
+    bool alt = event.AltDown(), ctrl = event.ControlDown();
+    int key = Frame_ShortcutKey(event.GetKeyCode(), event.GetUnicodeKey(),
+                                Native_LatinLetter(event), alt, ctrl);
+    const Shortcut *row = Frame_FindShortcut(key, alt, ctrl);
     if (!row || !m_panel) {
         event.Skip();
         return;

@@ -8,6 +8,7 @@
 #include <wx/utils.h>
 
 #include "app/Companion.h"
+#include "app/FrameRules.h"
 #include "store/Sys.h"
 #include "ui/Cartulo.h"
 #include "ui/DisplayText.h"
@@ -47,13 +48,6 @@ void QListBox::MeasureLineHeight()
         return;
     m_lineHeight = 32;
     TNSMessage("WARNING: QListBox: ", "adjust base unit to some defaults", TNS_WARNING);
-}
-
-bool QListBox::SetFont(const wxFont &font)
-{
-    bool changed = wxVListBox::SetFont(font);
-    MeasureLineHeight();
-    return changed;
 }
 
 BibFile *const *QListBox::Files() const
@@ -145,8 +139,9 @@ void QListBox::OnKeyDown(wxKeyEvent &event)
 
 static void LogKey(uint32_t key, int32_t now, int32_t last)
 {
-    wxString text = wxString::Format("Key=%d(%c), Time=%d-%d=%d ms", int(key), wxUniChar(key),
-                                     int(now), int(last), int(uint32_t(now) - uint32_t(last)));
+    wxString text = wxString::Format("Key=%d(%c), Time=%d-%d=%d ms", int(key),
+                                     wxUniChar(Frame_LogCharacter(key)), int(now), int(last),
+                                     int(uint32_t(now) - uint32_t(last)));
     TNSMessage("INFO: QListBox:OnChar ", text.utf8_str(), TNS_LIFECYCLE);
 }
 

@@ -32,8 +32,6 @@ public:
 
     virtual wxString GetItemText(size_t n) const; // "griske84 (refs)"
 
-    bool SetFont(const wxFont &font) override;
-
 private:
     void OnDrawItem(wxDC &dc, const wxRect &rect, size_t n) const override;
     wxCoord OnMeasureItem(size_t n) const override;

@@ -261,11 +261,12 @@ void CartuloWindow::TypeIntoList(wxChar key, long time, int modifiers)
     List()->ProcessWindowEvent(event);
 }
 
-void CartuloWindow::PressShortcut(int key, bool alt, bool ctrl)
+void CartuloWindow::PressShortcut(int key, bool alt, bool ctrl, int typed, unsigned hardware)
 {
     wxKeyEvent event(wxEVT_CHAR_HOOK);
     event.m_keyCode = key;
-    event.m_uniChar = key;
+    event.m_uniChar = typed ? typed : key;
+    event.m_rawFlags = hardware;
     event.SetAltDown(alt);
     event.SetControlDown(ctrl);
     List()->ProcessWindowEvent(event);

@@ -117,7 +117,9 @@ protected:
 
     void SearchFor(const wxString &text);
     void TypeIntoList(wxChar key, long time, int modifiers = 0);
-    void PressShortcut(int key, bool alt, bool ctrl); // as the frame sees it first
+    // A key as the frame sees it first. `typed` is the character that it types, where that is not
+    // `key`; `hardware` is the number of the key on the keyboard.
+    void PressShortcut(int key, bool alt, bool ctrl, int typed = 0, unsigned hardware = 0);
     void Press(wxWindowID button);
 
     // Changes the first field of the first file's first entry.

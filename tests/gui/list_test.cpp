@@ -145,6 +145,24 @@ TEST_F(ListInWindow, LeavesModifiedKeysAlone)
     EXPECT_EQ("Aba (animals)", Selected());
 }
 
+TEST_F(ListInWindow, LogsEachKeyInAWholeLine)
+{
+    const char prefix[] = "INFO: QListBox:OnChar ";
+    const struct {
+        wxChar key;
+        const char *character;
+    } keys[] = {{0, "0( )"}, {8, "8( )"}, {'q', "113(q)"}, {0xFC, "252(\xC3\xBC)"}};
+    for (const auto &row : keys) {
+        ForgetLog();
+        TypeIntoList(row.key, 2000);
+        std::vector<LogLine> lines = TakeLog(prefix);
+        ASSERT_EQ(1u, lines.size());
+        std::string start = std::string(prefix) + "Key=" + row.character + ", Time=2000-";
+        EXPECT_EQ(start, lines[0].text.substr(0, start.size()));
+        EXPECT_EQ(" ms", lines[0].text.substr(lines[0].text.size() - 3));
+    }
+}
+
 TEST_F(ListInWindow, ReturnsZeroWithoutFilesAndNeverReadsTheOldRows)
 {
     EXPECT_EQ(1, List()->Update_Index(nullptr, ""));

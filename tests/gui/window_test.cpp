@@ -421,6 +421,47 @@ TEST_F(Window, PutsTheFocusIntoTheSearchField)
     EXPECT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
 }
 
+TEST_F(Window, KnowsItsShortcutsOnAnotherKeyboard)
+{
+    const unsigned hardwareF = 41;
+    Open(folder.Write("a.bib", OneEntry));
+    ASSERT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+    PressShortcut(0, true, true, 0x430, hardwareF); // AltGr types a character here
+    EXPECT_FALSE(Search()->HasFocus());
+    PressShortcut(0, false, true, 0x430, hardwareF);
+    EXPECT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
+}
+
+TEST_F(Window, LeavesWhatAltGrTypesToTheControl)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    Change(0, "Changed");
+    PressShortcut('B', true, true, 0x201D);
+    EXPECT_TRUE(SaveEnabled());
+    PressShortcut('B', true, true);
+    EXPECT_FALSE(SaveEnabled());
+}
+
+TEST_F(Window, LogsEachKeyInAWholeLine)
+{
+    const struct {
+        int key;
+        const char *line;
+    } keys[] = {{0, "Key=0( ),Mod=1"},
+                {'x', "Key=120(x),Mod=1"},
+                {WXK_TAB, "Key=9( ),Mod=1"},
+                {WXK_DELETE, "Key=127( ),Mod=1"},
+                {0xFC, "Key=252(\xC3\xBC),Mod=1"},
+                {WXK_F2, "Key=341( ),Mod=1"}};
+    Open("");
+    for (const auto &row : keys) {
+        ForgetLog();
+        PressShortcut(row.key, true, false);
+        std::string line = std::string("INFO: MyFrame::OnCharHook ") + row.line;
+        EXPECT_EQ((Lines{{line, TNS_LIFECYCLE}}), TakeLog("INFO: MyFrame::OnCharHook "));
+    }
+}
+
 TEST_F(Window, ClearsTheStatusLineWithEachKey)
 {
     Open(folder.Write("a.bib", OneEntry));
