@@ -203,16 +203,17 @@ static BibStored StoreStrings(BibFile *file, ItemReader reader)
     return BIB_STORED;
 }
 
-// An error, so that the file becomes read-only: a save would lose the piece.
-static void ReportLostPiece(const BibFile *file, int line)
+// An error, so that the file becomes read-only: a save would lose the pieces.
+static void ReportLostPieces(const BibFile *file, int line)
 {
     Bib_ReportMessage(nullptr, BTERR_LEXERR, file->path, line, nullptr, -1,
-                      "the preamble is too long, a piece of it was not loaded");
+                      "the preamble is too long, a part of it was not loaded");
 }
 
 static void StorePreamble(BibFile *file, ItemReader reader)
 {
     AppLog("Preamble: ", NextText(&reader));
+    int lost = 0;
     for (int i = 0; i < reader.header.number; ++i) {
         uint32_t length;
         const char *piece = NextText(&reader, &length);
@@ -220,12 +221,14 @@ static void StorePreamble(BibFile *file, ItemReader reader)
         if (used + length + 2 >= BIB_PREAMBLE_SIZE) {
             AppLog("ERROR: Preamble too long in ", file->path);
             AppLog("ERROR: call Quarlo Technical support to solve the problem");
-            ReportLostPiece(file, reader.header.line);
+            ++lost;
             continue;
         }
         memcpy(file->preamble + used, piece, length);
         memcpy(file->preamble + used + length, "\r\n", 3);
     }
+    if (lost > 0)
+        ReportLostPieces(file, reader.header.line);
 }
 
 static void FreeComment(BibComment *comment)
@@ -284,14 +287,22 @@ BibStored BibItem_Store(BibFile *file, const char *item)
 struct Load {
     BibFile *file;
     int line;          // of the last item or message
+    int messages;      // of the parser
     int fatal;         // the parser reported the reason for its end itself
     int end;           // BibEnd, or -1 as long as the child has said nothing
     BibStored refused; // a full name table, or lack of memory, ended the load
 };
 
-static int IsFatalMessage(const BibItemHeader *header)
+// A file that is no BIB file at all may give a message for every byte. They must not fill the disk
+// that takes the log.
+enum { MESSAGE_LIMIT = 100000 };
+
+static void CountMessage(Load *load, const BibItemHeader *header)
 {
-    return header->kind == BIB_ITEM_MESSAGE && header->number >= BTERR_USAGEERR;
+    if (header->kind != BIB_ITEM_MESSAGE)
+        return;
+    ++load->messages;
+    load->fatal |= header->number >= BTERR_USAGEERR;
 }
 
 // 1 to go on, 0 when the load ends here.
@@ -305,10 +316,11 @@ static int TakeItem(Load *load, const char *item)
         load->end = header.number;
         return 0;
     }
-    load->fatal |= IsFatalMessage(&header);
+    CountMessage(load, &header);
     BibCurrentFile = load->file;
     load->refused = BibItem_Store(load->file, item);
-    return load->refused == BIB_STORED || load->refused == BIB_SKIPPED;
+    int stored = load->refused == BIB_STORED || load->refused == BIB_SKIPPED;
+    return stored && load->messages < MESSAGE_LIMIT;
 }
 
 // Takes the whole items in `buffer` and returns how many bytes they were; -1 when the load ends.
@@ -378,6 +390,8 @@ static const char *ReasonOfEnd(const Load *load, SysChildEnd end, int answered)
                "what follows it were not loaded";
     if (load->refused == BIB_NO_MEMORY)
         return "there is not enough memory; this item and what follows it were not loaded";
+    if (load->messages >= MESSAGE_LIMIT)
+        return "too many errors and warnings; what follows this line was not loaded";
     if (load->fatal || load->end == BIB_END_OF_FILE)
         return nullptr;
     if (end == SYS_CHILD_TIME_LIMIT || !answered)
@@ -420,7 +434,9 @@ static void LoadItems(BibFile *file)
         Report(file, 0, Sys_LastErrorText());
         return;
     }
-    Load load = {file, 0, 0, -1, BIB_STORED};
+    Load load = {};
+    load.file = file;
+    load.end = -1;
     int answered = ReceiveItems(&load, &child, 2 * seconds + 30);
     SysChildEnd end = Sys_EndChild(&child);
     const char *reason = ReasonOfEnd(&load, end, answered);
