@@ -6,6 +6,7 @@ static const Shortcut Shortcuts[] = {
     {'B', 1, ID_SAVE, "Save BIB Files ..."},
     {'F', 1, ID_SEARCH, "Find ..."},
     {'M', 1, ID_MESSAGES, "Show Messages ..."},
+    {'O', 1, ID_OPEN, "Open BIB file ..."},
 };
 
 int Frame_ShortcutKey(int key, int typed, int latin, bool alt, bool ctrl)

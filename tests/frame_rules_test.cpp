@@ -16,6 +16,8 @@ TEST(FrameFindShortcut, TakesAltAndCtrlAlike)
     EXPECT_EQ(ID_SAVE, IdOf('B', true, false));
     EXPECT_EQ(ID_SAVE, IdOf('B', false, true));
     EXPECT_EQ(ID_SEARCH, IdOf('F', false, true));
+    EXPECT_EQ(ID_OPEN, IdOf('O', true, false));
+    EXPECT_EQ(ID_OPEN, IdOf('O', false, true));
 }
 
 TEST(FrameFindShortcut, FoldsLetters)

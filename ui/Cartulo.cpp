@@ -29,6 +29,7 @@ static const Colour HeadingColour = {0, 0, 100};
 
 wxBEGIN_EVENT_TABLE(Cartulo, wxSplitterWindow)
     EVT_BUTTON(ID_OPEN, Cartulo::OnOpen)
+    EVT_MENU(ID_OPEN, Cartulo::OnOpen)
     EVT_BUTTON(ID_SAVE, Cartulo::OnSave)
     EVT_MENU(ID_SAVE, Cartulo::OnSave)
     EVT_BUTTON(ID_MESSAGES, Cartulo::OnShowMessages)
@@ -201,12 +202,20 @@ void Cartulo::Arrange()
 void Cartulo::OnOpen(wxCommandEvent &)
 {
     wxFileDialog dialog(wxGetTopLevelParent(this), "Open BIB file", "", "",
-                        "BIB files (*.bib)|*.bib", wxFD_OPEN | wxFD_FILE_MUST_EXIST);
-    if (dialog.ShowModal() != wxID_OK)
+                        "BIB files (*.bib)|*.bib;*.BIB", wxFD_OPEN | wxFD_FILE_MUST_EXIST);
+    if (dialog.ShowModal() == wxID_OK)
+        OpenFile(PathBytes(dialog.GetPath()));
+}
+
+void Cartulo::OpenFile(const std::string &path)
+{
+    std::string commandLine = Command_Quote(path.c_str());
+    if (commandLine.empty()) {
+        ShowBox(this, "Open BIB file",
+                ("A file whose path holds both ' and \" can't be opened:\n\n" + path).c_str());
         return;
-    std::string path = PathBytes(dialog.GetPath());
-    const char *quote = path.find('"') == std::string::npos ? "\"" : "'";
-    ProcessCommand((quote + path + quote).c_str(), "OnOpen");
+    }
+    ProcessCommand(commandLine.c_str(), "OnOpen");
     ShowStatus(this, CountText());
 }
 

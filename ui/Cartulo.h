@@ -55,6 +55,7 @@ private:
     wxStaticText *CreateHeading(wxWindow *parent, const wxString &text);
     void Arrange();
     void RefreshList(BibEntry *select);
+    void OpenFile(const std::string &path);
     void ShowSelection();
     void ClearEntry();
     void FillRow(int row, const BibField *field);

@@ -42,17 +42,23 @@ TEST_F(Window, OffersToOpenAFileWhenNoneIsNamed)
     EXPECT_EQ("There are 0 bibliography entries in 0 BIB files.", Status());
 }
 
-// Lets the file dialog be shown, as it knows its path only then, and answers it.
+// Lets the file dialog be shown, as it knows its path only then, and answers it. Answers a message
+// box that follows, too.
 class AnswerFileDialog : public wxModalDialogHook
 {
 public:
     explicit AnswerFileDialog(const wxString &path) : m_path(path) { Register(); }
 
     wxString title, wildcard;
+    wxString box; // caption and text
 
 protected:
     int Enter(wxDialog *shown) override
     {
+        if (wxMessageDialog *message = dynamic_cast<wxMessageDialog *>(shown)) {
+            box += message->GetTitle() + ": " + message->GetMessage();
+            return wxID_OK;
+        }
         wxFileDialog *dialog = dynamic_cast<wxFileDialog *>(shown);
         if (!dialog)
             return wxID_NONE;
@@ -80,12 +86,41 @@ TEST_F(Window, OpensTheFileThatTheDialogNames)
     AnswerFileDialog answer(path);
     Press(ID_OPEN);
     EXPECT_EQ("Open BIB file", answer.title);
-    EXPECT_EQ("BIB files (*.bib)|*.bib", answer.wildcard);
+    EXPECT_EQ("BIB files (*.bib)|*.bib;*.BIB", answer.wildcard);
     EXPECT_EQ((std::vector<wxString>{"one (with blank)"}), Rows());
     EXPECT_FALSE(IsShowing(ID_OPEN));
     EXPECT_TRUE(IsShowing(ID_INDEX));
     EXPECT_EQ("There are 1 bibliography entries in 1 BIB files.", Status());
     EXPECT_EQ((Lines{{std::string(Shown) + "one (with blank)", TNS_ACTION}}), TakeLog(Shown));
+}
+
+TEST_F(Window, OpensAnotherFileThroughItsShortcuts)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    std::string b = folder.Write("b's.bib", "@misc{two, note = {Second}}\n");
+    std::string c = folder.Write("C.BIB", "@misc{three, note = {Third}}\n");
+    AllowDialogs allow;
+    {
+        AnswerFileDialog answer(b);
+        PressShortcut('O', true, false);
+        EXPECT_EQ((std::vector<wxString>{"two (b's)"}), Rows());
+    }
+    AnswerFileDialog answer(c);
+    PressShortcut('o', false, true);
+    EXPECT_EQ((std::vector<wxString>{"three (C)"}), Rows());
+    EXPECT_EQ((std::vector<Field>{{"note", "Third"}}), ShownFields());
+}
+
+TEST_F(Window, SaysThatAPathWithBothQuotesCannotBeOpened)
+{
+    std::string path = folder.Write("\"it's\".bib", OneEntry);
+    Open(folder.Write("a.bib", OneEntry));
+    AllowDialogs allow;
+    AnswerFileDialog answer(path);
+    PressShortcut('O', true, false);
+    EXPECT_EQ("Open BIB file: A file whose path holds both ' and \" can't be opened:\n\n" + path,
+              answer.box);
+    EXPECT_EQ((std::vector<wxString>{"one (a)"}), Rows());
 }
 
 TEST_F(Window, LogsTheEntryThatItShowsFirst)
@@ -406,7 +441,7 @@ TEST_F(Window, IgnoresAModificationOfNoFile)
 TEST_F(Window, PassesNoCommandBackAndForth)
 {
     Open(folder.Write("a.bib", OneEntry));
-    for (int id : {ID_COMMAND_FIRST + 0, ID_OPEN + 0, 6005, ID_COMMAND_LAST + 0}) {
+    for (int id : {ID_COMMAND_FIRST + 0, 6005, ID_COMMAND_LAST + 0}) {
         wxCommandEvent event(wxEVT_MENU, id);
         EXPECT_FALSE(Panel()->ProcessWindowEvent(event));
         EXPECT_FALSE(frame->ProcessWindowEvent(event));
