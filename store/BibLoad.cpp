@@ -314,7 +314,7 @@ static int TakeItem(Load *load, const char *item)
         load->line = header.line;
     if (header.kind == BIB_ITEM_END) {
         load->end = header.number;
-        return 0;
+        return 1; // nothing follows, but how the child ends is still to be seen
     }
     CountMessage(load, &header);
     BibCurrentFile = load->file;
