@@ -120,21 +120,26 @@ void MyFrame::OnDeactivation()
 
 void MyFrame::OnClose(wxCloseEvent &event)
 {
+    if (!m_panel) {
+        if (event.CanVeto())
+            event.Veto();
+        return; // a box about a file is open, and the constructor waits for it
+    }
     m_panel->SaveAll(true);
     if (event.CanVeto() && !MayLoseChanges()) {
         event.Veto();
         return;
     }
+    m_panel = nullptr; // nothing is saved any more: the user may just have given the changes up
     Destroy();
 }
 
 // Asks when files could not be saved.
 bool MyFrame::MayLoseChanges()
 {
-    wxString files = m_panel->ModifiedPaths();
-    if (files.empty())
+    if (FileSet_ModifiedCount(m_panel->Files()) == 0)
         return true;
-    return wxMessageBox("These Bib-files can't be saved:\n\n" + files +
+    return wxMessageBox("These Bib-files can't be saved:\n\n" + m_panel->UnsavedText() +
                             "\nDo you want to close and to lose the changes ?",
                         "Save Bibliography File - Question",
                         wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION, this) == wxYES;

@@ -15,7 +15,7 @@ public:
     // Loads the files that the command line names. `state` outlives the frame.
     MyFrame(const wxString &title, const char *commandLine, CommandState *state);
 
-    Cartulo *Panel() const { return m_panel; }
+    Cartulo *Panel() const { return m_panel; } // null once the window is closed
 
     void OnDeactivation(); // the program lost the focus to another: saves all files
 
@@ -29,7 +29,7 @@ private:
     void OnClose(wxCloseEvent &event);
     bool MayLoseChanges();
 
-    Cartulo *m_panel = nullptr;       // child window; null while it is being made
+    Cartulo *m_panel = nullptr;       // child window; null until it is made and once this is closed
     wxSearchCtrl *m_search = nullptr; // child of the tool bar
 
     wxDECLARE_EVENT_TABLE();

@@ -133,8 +133,12 @@ void Cartulo::CreateOpenPane()
 
 void Cartulo::ShowBox(void *owner, const char *caption, const char *text)
 {
-    wxWindow *panel = static_cast<Cartulo *>(owner);
-    wxMessageBox(PathText(text), caption, wxOK | wxICON_WARNING, wxGetTopLevelParent(panel));
+    static_cast<Cartulo *>(owner)->ShowWarning(caption, PathText(text));
+}
+
+void Cartulo::ShowWarning(const wxString &caption, const wxString &text)
+{
+    wxMessageBox(text, caption, wxOK | wxICON_WARNING, wxGetTopLevelParent(this));
 }
 
 // 1 when the record, which was at `path`, is still in the set; it may have been freed.
@@ -211,8 +215,8 @@ void Cartulo::OpenFile(const std::string &path)
 {
     std::string commandLine = Command_Quote(path.c_str());
     if (commandLine.empty()) {
-        ShowBox(this, "Open BIB file",
-                ("A file whose path holds both ' and \" can't be opened:\n\n" + path).c_str());
+        ShowWarning("Open BIB file", "A file whose path holds both ' and \" can't be opened:\n\n" +
+                                         PathText(path.c_str()));
         return;
     }
     ProcessCommand(commandLine.c_str(), "OnOpen");
@@ -262,19 +266,26 @@ void Cartulo::SetModified(int file)
     UpdateSaveTool();
 }
 
+// wxYES, wxNO or wxCANCEL.
+int Cartulo::AskToSave()
+{
+    char *question = FileSet_SaveQuestion(&m_set);
+    m_busy = true; // another program may be activated meanwhile: nothing is saved before the answer
+    int answer = wxMessageBox(PathText(question), "Save Bibliography File - Question",
+                              wxYES_NO | wxCANCEL | wxICON_QUESTION, wxGetTopLevelParent(this));
+    m_busy = false;
+    free(question);
+    return answer;
+}
+
 int Cartulo::SaveAll(bool quiet)
 {
     TNSMessage("INFO: Cartulo::SaveAll", "", TNS_ACTION);
     if (m_busy || FileSet_ModifiedCount(&m_set) == 0)
         return 0;
-    if (!quiet) {
-        char *question = FileSet_SaveQuestion(&m_set);
-        int answer = wxMessageBox(PathText(question), "Save Bibliography File - Question",
-                                  wxYES_NO | wxCANCEL | wxICON_QUESTION, wxGetTopLevelParent(this));
-        free(question);
-        if (answer != wxYES)
-            return answer == wxNO ? 0 : -1;
-    }
+    int answer = quiet ? wxYES : AskToSave();
+    if (answer != wxYES)
+        return answer == wxNO ? 0 : -1;
     m_busy = true;
     int saved = FileSet_SaveAll(&m_set);
     m_busy = false;
@@ -284,19 +295,21 @@ int Cartulo::SaveAll(bool quiet)
     return saved;
 }
 
-wxString Cartulo::ModifiedPaths() const
+wxString Cartulo::UnsavedText() const
 {
-    wxString paths;
-    for (int i = 0; i < m_set.count; ++i) {
-        if (m_set.files[i]->modified)
-            paths += PathText(m_set.files[i]->path) + "\n";
-    }
-    return paths;
+    if (m_set.saveErrors)
+        return PathText(m_set.saveErrors);
+    char *paths = FileSet_ModifiedPaths(&m_set);
+    wxString text = PathText(paths);
+    free(paths);
+    return text;
 }
 
 void Cartulo::OnSave(wxCommandEvent &)
 {
-    SaveAll(true);
+    if (SaveAll(true) == 0 && FileSet_ModifiedCount(&m_set) != 0)
+        ShowWarning("Save Bibliography File",
+                    "These Bib-files can't be saved:\n\n" + UnsavedText());
 }
 
 // --- The list ---
@@ -311,8 +324,10 @@ void Cartulo::OnSearch(wxCommandEvent &event)
     std::wstring text = field->GetValue().ToStdWstring();
     std::vector<char> narrow(text.size() + 1);
     m_search = Enc_FromUnicode(narrow.data(), text.c_str());
-    TNSMessage("INFO: Cartulo::OnSearch ", m_search.c_str(), TNS_ACTION);
+    TNSMessage("INFO: Cartulo::OnSearch ", StoreText(m_search.c_str()).utf8_str(), TNS_ACTION);
     m_list->Update_Index(m_entry, m_search.c_str());
+    bool found = m_list->GetItemCount() > 0 || m_search.empty();
+    ShowStatus(this, found ? "" : "No entry holds this text.");
     ShowSelection();
 }
 

@@ -33,8 +33,10 @@ public:
     // nothing was saved or a save failed, 1 when every modified file was saved.
     int SaveAll(bool quiet);
 
-    wxString CountText() const;     // "There are ... entries in ... BIB files."
-    wxString ModifiedPaths() const; // one line for each file with unsaved changes
+    wxString CountText() const; // "There are ... entries in ... BIB files."
+
+    // The files with unsaved changes, and why they could not be saved where that was tried.
+    wxString UnsavedText() const;
 
     void Update_Tools();                         // enables the tools that apply now
     void ShowEntry(BibEntry *entry, int file);   // fills the entry pane; null changes nothing
@@ -63,6 +65,8 @@ private:
     void ShowRows(int count);
     void UpdateSaveTool();
     void ShowRow(const char *handler);
+    int AskToSave();
+    void ShowWarning(const wxString &caption, const wxString &text);
     static void ShowBox(void *owner, const char *caption, const char *text);
 
     void OnOpen(wxCommandEvent &event);

@@ -9,6 +9,7 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
+#include "app/Companion.h"
 #include "app/Ids.h"
 #include "ui/Cartulo.h"
 #include "ui/QListBox.h"
@@ -80,6 +81,25 @@ TEST_F(ListInWindow, ShowsAnEmptyPaneWhenNothingIsFound)
     SearchFor("");
     EXPECT_EQ(5u, Rows().size());
     EXPECT_EQ(1u, ShownFields().size());
+}
+
+TEST_F(ListInWindow, SaysWhenNothingIsFound)
+{
+    SearchFor("nowhere");
+    EXPECT_EQ("No entry holds this text.", Status());
+    SearchFor("oak");
+    EXPECT_EQ("", Status());
+    SearchFor("nowhere");
+    SearchFor("");
+    EXPECT_EQ("", Status());
+}
+
+TEST_F(ListInWindow, LogsTheSearchTextAsItWasTyped)
+{
+    ForgetLog();
+    SearchFor(L"M\u00FCnchen");
+    std::vector<LogLine> expected = {{"INFO: Cartulo::OnSearch M\xC3\xBCnchen", TNS_ACTION}};
+    EXPECT_EQ(expected, TakeLog("INFO: Cartulo::OnSearch"));
 }
 
 TEST_F(ListInWindow, KeepsTheEntryThatWasFoundWhenTheSearchIsCleared)

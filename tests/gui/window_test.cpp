@@ -4,6 +4,7 @@
 
 #include <csignal>
 #include <filesystem>
+#include <functional>
 
 #include <sys/wait.h>
 #include <unistd.h>
@@ -240,6 +241,46 @@ TEST_F(Window, SaysThatAFileIsLockedElsewhere)
     EXPECT_TRUE(IsShowing(ID_OPEN));
 }
 
+// Does something while a message box is open, and answers it. Closes the messages window.
+class WhileBoxIsOpen : public wxModalDialogHook
+{
+public:
+    WhileBoxIsOpen(const std::function<void()> &action, int answer)
+        : m_action(action), m_answer(answer)
+    {
+        Register();
+    }
+
+    int boxes = 0;
+
+protected:
+    int Enter(wxDialog *dialog) override
+    {
+        if (dynamic_cast<Cartulo_Messages *>(dialog))
+            return wxID_OK;
+        ++boxes;
+        m_action();
+        return m_answer;
+    }
+
+private:
+    std::function<void()> m_action;
+    int m_answer;
+};
+
+TEST_F(Window, StaysWhileItIsMade)
+{
+    std::string path = folder.Write("taken.bib", OneEntry);
+    OtherProgram other(path);
+    WhileBoxIsOpen hook([] { EXPECT_FALSE(wxTopLevelWindows.GetLast()->GetData()->Close()); },
+                        wxID_OK);
+    Open(path + " " + folder.Write("b.bib", OneEntry));
+    EXPECT_EQ(1, hook.boxes);
+    ASSERT_TRUE(frame);
+    EXPECT_TRUE(frame->IsShown());
+    EXPECT_EQ((std::vector<wxString>{"one (b)"}), Rows());
+}
+
 // --- Messages ---
 
 TEST_F(Window, ShowsTheMessagesOfABrokenFile)
@@ -418,21 +459,117 @@ TEST_F(Window, ForgetsNoChangeWhenAFileCannotBeSaved)
     EXPECT_EQ("ERROR: Can't save all modified BIB files.", Status());
 
     wxString caption = "Save Bibliography File - Question";
-    wxString question = "These Bib-files can't be saved:\n\n" + path +
+    wxString question = "These Bib-files can't be saved:\n\nFile: `" + path + "'\n" + reason +
                         "\n\nDo you want to close and to lose the changes ?";
     wxTEST_DIALOG(frame->Close(), ExpectBox(caption, question, wxID_NO));
-    ASSERT_TRUE(frame);
-    EXPECT_FALSE(frame->IsBeingDeleted());
+    ASSERT_TRUE(frame && frame->IsShown());
     wxTEST_DIALOG(frame->Close(), ExpectBox(caption, question, wxID_YES));
     DeleteClosedWindows();
     EXPECT_FALSE(frame);
+}
+
+TEST_F(SaveQuestion, KeepsTheProgramFromSavingBeforeTheAnswer)
+{
+    WhileBoxIsOpen hook([this] { frame->OnDeactivation(); }, wxID_NO);
+    EXPECT_EQ(0, Panel()->SaveAll(false));
+    EXPECT_EQ(1, hook.boxes);
+    EXPECT_FALSE(IsSaved("a.bib") || IsSaved("c.bib"));
+    frame->OnDeactivation();
+    EXPECT_TRUE(IsSaved("a.bib") && IsSaved("c.bib"));
+}
+
+// A file that was opened, changed, and cannot be saved any more.
+class FailedSave : public CartuloWindow
+{
+protected:
+    void SetUp() override
+    {
+        path = folder.Write("a.bib", OneEntry);
+        Open(path);
+        Change(0, "Changed");
+        Panel()->Files()->files[0]->readOnly = 1;
+        text = "These Bib-files can't be saved:\n\nFile: `" + path + "'\nThe file is read-only\n";
+    }
+
+    std::string path;
+    wxString text;
+};
+
+TEST_F(FailedSave, IsExplainedWhenTheUserAskedForIt)
+{
+    ExpectBox box("Save Bibliography File", text, wxID_OK);
+    wxTEST_DIALOG(PressShortcut('B', true, false), box);
+    EXPECT_TRUE(SaveEnabled());
+    EXPECT_EQ("ERROR: Can't save all modified BIB files.", Status());
+    wxCommandEvent tool(wxEVT_TOOL, ID_SAVE);
+    wxTEST_DIALOG(frame->GetToolBar()->ProcessWindowEvent(tool), box);
+}
+
+TEST_F(FailedSave, ShowsNoBoxWhenTheProgramLosesTheFocus)
+{
+    frame->OnDeactivation();
+    EXPECT_TRUE(SaveEnabled());
+    EXPECT_EQ("ERROR: Can't save all modified BIB files.", Status());
+}
+
+TEST_F(FailedSave, IsExplainedBeforeTheWindowCloses)
+{
+    wxTEST_DIALOG(frame->Close(),
+                  ExpectBox("Save Bibliography File - Question",
+                            text + "\nDo you want to close and to lose the changes ?", wxID_NO));
+    EXPECT_TRUE(frame && frame->IsShown());
+}
+
+TEST_F(FailedSave, IsNotTriedAgainOnceTheWindowIsClosed)
+{
+    BibFile *file = Panel()->Files()->files[0];
+    wxTEST_DIALOG(frame->Close(),
+                  ExpectBox("Save Bibliography File - Question",
+                            text + "\nDo you want to close and to lose the changes ?", wxID_YES));
+    file->readOnly = 0;
+    frame->OnDeactivation();
+    EXPECT_EQ(OneEntry, folder.Read("a.bib"));
+    DeleteClosedWindows();
+    EXPECT_FALSE(frame);
+}
+
+TEST_F(Window, NamesARecordThatIsListedTwiceOnce)
+{
+    std::string path = folder.Write("a.bib", OneEntry);
+    Open(path);
+    Panel()->ProcessCommand((path + " " + path).c_str(), "test");
+    ASSERT_EQ(2, Panel()->Files()->count);
+    ASSERT_EQ(Panel()->Files()->files[0], Panel()->Files()->files[1]);
+    Change(1, "Changed");
+    EXPECT_EQ(path + "\n", Panel()->UnsavedText());
+    wxTEST_DIALOG(Panel()->SaveAll(false), ExpectBox("Save Bibliography File - Question",
+                                                     "There are modified Bib-files:\n\n" + path +
+                                                         "\n\nDo you want to save them ?",
+                                                     wxID_NO));
+    Panel()->Files()->files[0]->readOnly = 1;
+    wxString text =
+        "These Bib-files can't be saved:\n\nFile: `" + path + "'\nThe file is read-only\n";
+    ExpectBox box("Save Bibliography File", text, wxID_OK);
+    wxTEST_DIALOG(PressShortcut('B', true, false), box);
 }
 
 TEST_F(Window, IgnoresAModificationOfNoFile)
 {
     Open(folder.Write("a.bib", OneEntry));
     Panel()->SetModified(-1);
+    EXPECT_EQ(Lines(), TakeLog("Cartulo: SetModified"));
     Panel()->SetModified(1);
+    EXPECT_EQ(
+        (Lines{{"Cartulo: SetModified-ERROR - wrong file index  1 out of 0..1", TNS_WARNING}}),
+        TakeLog("Cartulo: SetModified"));
+    EXPECT_FALSE(SaveEnabled());
+}
+
+TEST_F(Window, IgnoresAModificationWithoutFiles)
+{
+    Open("");
+    Panel()->SetModified(0);
+    EXPECT_EQ(Lines(), TakeLog("Cartulo: SetModified"));
     EXPECT_FALSE(SaveEnabled());
 }
 
