@@ -25,6 +25,7 @@
 #include "ui/Theme.h"
 
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, COLUMN_GAP = 8, PANE_BORDER = 8 };
+static const double LIST_SHARE = 0.35; // of what the window grows or shrinks
 static const Colour HeadingColour = {0, 0, 100};
 
 wxBEGIN_EVENT_TABLE(Cartulo, wxSplitterWindow)
@@ -55,6 +56,7 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     ProcessCommand(commandLine, "OnInit");
     AppLog("More ...");
     SetMinimumPaneSize(FromDIP(SMALLEST_PANE));
+    SetSashGravity(LIST_SHARE);
     m_list = new QListBox(this, this, ID_INDEX, wxDefaultPosition, wxDefaultSize, wxBORDER_STATIC);
     CreateEntryPane();
     CreateOpenPane();

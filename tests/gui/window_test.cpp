@@ -660,6 +660,19 @@ TEST_F(Window, IsNotSmallerThanItsMinimum)
     EXPECT_EQ(frame->FromDIP(wxSize(800, 600)), frame->GetSize());
 }
 
+TEST_F(Window, SharesItsWidthBetweenListAndEntry)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    EXPECT_EQ(frame->FromDIP(300), Panel()->GetSashPosition());
+    int width = EntryPane()->GetSize().x;
+    frame->SetSize(frame->GetMinSize());
+    ASSERT_TRUE(WaitFor([&] { return EntryPane()->GetSize().x != width; }));
+    EXPECT_NEAR(300 - 0.35 * (800 - 512), frame->ToDIP(Panel()->GetSashPosition()), 10);
+    frame->SetSize(frame->FromDIP(wxSize(800, 600)));
+    ASSERT_TRUE(WaitFor([&] { return EntryPane()->GetSize().x == width; }));
+    EXPECT_NEAR(300, frame->ToDIP(Panel()->GetSashPosition()), 10);
+}
+
 // --- Colours ---
 
 static Colour Of(const wxColour &colour)
