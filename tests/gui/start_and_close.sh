@@ -4,8 +4,6 @@
 # the program ends well.
 set -eu
 program=$1
-env -u DISPLAY -u WAYLAND_DISPLAY "$program" --help >/dev/null
-env -u DISPLAY -u WAYLAND_DISPLAY "$program" --version >/dev/null
 folder=$(mktemp -d)
 editor=
 trap '[ -z "$editor" ] || kill "$editor" 2>/dev/null || true; rm -rf "$folder"' EXIT
