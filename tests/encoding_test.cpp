@@ -382,9 +382,9 @@ TEST(EncFromUnicode, GivesBackEveryByteThatIsAloneWithItsMeaning)
 
 TEST(EncFromUnicode, LogsTheTextAndTheResult)
 {
-    // Display text as UTF-8, store text as it is.
+    // Display text as UTF-8, store text as it is, but control characters as blanks.
     EXPECT_EQ("Cartulo: strconv in: a\u00E4\u00AB\u20AC\U0001F600\n"
-              "Cartulo: strconv out: a\xE4\x02\x80\xFF\n",
+              "Cartulo: strconv out: a\xE4 \x80\xFF\n",
               LogOf("1", [] { FromUnicode(L"a\u00E4\u00AB\u20AC\U0001F600"); }));
     EXPECT_EQ("", LogOf("2", [] { FromUnicode(L"a"); }));
 }
