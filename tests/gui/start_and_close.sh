@@ -19,7 +19,15 @@ until window=$(xdotool search --all --onlyvisible --pid "$editor" --name '^Quarl
     [ "$tries" -lt 200 ] && kill -0 "$editor" || { echo "no window" >&2; exit 1; }
     sleep 0.1
 done
-xdotool windowactivate --sync "$window" key alt+F4
+# Right after the start the window manager may not heed the first requests.
+while kill -0 "$editor" 2>/dev/null; do
+    tries=$((tries + 1))
+    [ "$tries" -lt 200 ] || { echo "the window does not close" >&2; exit 1; }
+    xdotool windowactivate "$window" 2>/dev/null || true
+    sleep 0.1
+    [ "$(xdotool getactivewindow 2>/dev/null)" != "$window" ] || xdotool key alt+F4
+    sleep 0.1
+done
 wait "$editor" || { echo "the editor ended with status $?" >&2; exit 1; }
 editor=
 
