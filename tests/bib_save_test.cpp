@@ -86,10 +86,7 @@ TEST(BibWriteValue, WritesTheTable)
     for (const Lines &block : blocks) {
         ASSERT_LE(2u, block.size()) << block[0];
         EXPECT_EQ(block[1], Written(block[0])) << block[0];
-        Lines logged;
-        for (size_t i = 2; i < block.size(); ++i) // the log shows marks as blanks
-            logged.push_back(Replaced(Replaced(block[i], "\2", " "), "\5", " "));
-        EXPECT_EQ(logged, log.Lines()) << block[0];
+        EXPECT_EQ(Lines(block.begin() + 2, block.end()), log.Lines()) << block[0];
     }
 }
 
