@@ -124,12 +124,6 @@ static int IsOpenAt(int fd, const char *path)
     return fstat(fd, &opened) == 0 && stat(path, &named) == 0 && IsSame(&opened, &named);
 }
 
-void Sys_SurviveFailedWrites()
-{
-    signal(SIGPIPE, SIG_IGN);
-    signal(SIGXFSZ, SIG_IGN);
-}
-
 int Sys_RemoveFile(const char *path)
 {
     return unlink(path) == 0;
@@ -291,6 +285,12 @@ int Sys_IsLockedHere(const char *path)
 }
 
 // --- Replacing a file, and keeping the old one ---
+
+void Sys_SurviveFailedWrites()
+{
+    signal(SIGPIPE, SIG_IGN);
+    signal(SIGXFSZ, SIG_IGN);
+}
 
 // With the '/' at its end; "" for the current folder.
 static std::string FolderOf(const char *path)
