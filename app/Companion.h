@@ -1,5 +1,6 @@
 // app/Companion.h - services of the TeX environment around the program.
-// Companion-standalone.cpp serves a program that runs on its own.
+// CompanionLog-standalone.cpp (TNSMessage) and Companion-standalone.cpp (the others) serve a
+// program that runs on its own. Texts are 8-bit, paths as the system has them.
 #pragma once
 
 // Levels of TNSMessage.
@@ -16,3 +17,28 @@ enum {
 // CARTULO_LOG=level[:file] names the lowest level that is shown (default 4) and a file that is
 // appended to instead of standard error. Never fails toward the caller.
 void TNSMessage(const char *prefix, const char *text, int level);
+
+// The full path of a file, malloc'd; null for none. `category` is one of
+//   "bib"      a BIB file by its name without folder: asks kpsewhich where TeX is installed, else
+//              looks through the folders of the environment variable BIBINPUTS
+//   "Icon"     the picture of a tool, by its name without ending
+//   "Logo"     a picture of a program, by the program's name
+//   "Program"  a program of the environment
+// The last three look through the folders that the key of the category's name in section "Search"
+// lists (TNSValue; separated by colons), then the user's own, then those installed with this
+// program.
+char *TNSearch(const char *category, const char *name);
+
+// A setting of the environment, malloc'd; null for none. Read afresh each time from the file
+// Cartulo/environment.ini in the user's configuration folder.
+char *TNSValue(const char *section, const char *key);
+
+// The text of a control word; null for none. Nothing controls a program that runs on its own.
+const char *TNSFind(const char *word);
+
+// Makes a window known to the user's processes under a name, until this process ends. The window
+// is the handle by which other programs name it; the last call for a name holds.
+void RegisterFrame(const char *instance, long window);
+
+// The window of a living process that is known under that name; 0 for none.
+long FindFrame(const char *instance);

@@ -61,6 +61,58 @@ void Sys_CancelReplace(SysReplace *replace);                 // frees; removes t
 int32_t Sys_Milliseconds();                       // a tick count for differences
 int Sys_CurrentFolder(char *buffer, size_t size); // 1, or 0 when it does not fit
 
+// Where the user's programs keep files; malloc'd.
+char *Sys_ConfigFolder(); // $XDG_CONFIG_HOME, else ~/.config
+char *Sys_DataFolder();   // $XDG_DATA_HOME, else ~/.local/share
+
+// The path by which the user's processes meet under `name`, a text of any form: a file named by a
+// number made of it, with `ending`, in a folder that nobody else can enter
+// ($XDG_RUNTIME_DIR/quarlo, else one in the temporary folder). malloc'd; null, with the reason in
+// Sys_LastErrorText(), when there is no such folder and none can be made.
+char *Sys_PrivatePath(const char *name, const char *ending);
+
+const char *Sys_LoginName(); // of the user; a number when the account has no name
+
+// --- Other programs ---
+
+// Runs a program and waits for its end, for `milliseconds` at most: then it is ended. `argv` ends
+// with null; a name without a slash is looked for in PATH; no shell is involved. The program reads
+// nothing, and what it writes to standard error is dropped. Returns its output, malloc'd, or null
+// when it could not be started, was ended, or left with a status other than 0.
+char *Sys_RunForOutput(const char *const *argv, int milliseconds);
+
+// --- Folders ---
+
+// The path of the first file called `name` in `folder`, and with `deep` in the folders below it,
+// nearest first; malloc'd, null for none. Links to folders are not followed, and a bounded number
+// of folders is looked at.
+char *Sys_FindFile(const char *folder, const char *name, int deep);
+
+// --- Local sockets: byte streams between the processes of one user ---
+// A socket is a number above 2; it never waits, and started programs do not inherit it.
+
+// Listens at `path` (mode 0600). A socket file that nobody serves is replaced; any other file is
+// left alone. 0 on failure, with the reason in Sys_LastErrorText().
+int Sys_ListenLocal(const char *path);
+
+// The next peer that waits; 0 for none. A peer of another user is turned away.
+int Sys_AcceptLocal(int listener);
+
+// Connects to who serves `path`, within `milliseconds`. 0 on failure, with the reason in
+// Sys_LastErrorText(). A server of another user is not trusted.
+int Sys_ConnectLocal(const char *path, int milliseconds);
+
+// The count of bytes; 0 when nothing can be read or written now, -1 when the other side is gone.
+long Sys_Receive(int socket, void *buffer, size_t size);
+long Sys_Send(int socket, const void *data, size_t size);
+
+// 1 when it can be read (written) within `milliseconds`, or has failed.
+int Sys_WaitReadable(int socket, int milliseconds);
+int Sys_WaitWritable(int socket, int milliseconds);
+
+void Sys_CloseSocket(int socket);
+void Sys_CloseListener(int listener, const char *path); // removes the socket file, if it is ours
+
 // --- A child process that works for this one ---
 
 struct SysChild {

@@ -1,4 +1,4 @@
-// app/Companion-standalone.cpp - the services for a program that runs on its own.
+// app/CompanionLog-standalone.cpp - the log of a program that runs on its own.
 #include "app/Companion.h"
 
 #include <cstdio>
