@@ -110,6 +110,11 @@ long Sys_Send(int socket, const void *data, size_t size);
 int Sys_WaitReadable(int socket, int milliseconds);
 int Sys_WaitWritable(int socket, int milliseconds);
 
+// Says that nothing more will be sent, and waits for the other side to end: 1 when it did and had
+// read everything, 0 when it broke off before, -1 when it has not ended within `milliseconds`. What
+// it still sends is dropped.
+int Sys_FinishSending(int socket, int milliseconds);
+
 void Sys_CloseSocket(int socket);
 void Sys_CloseListener(int listener, const char *path); // removes the socket file, if it is ours
 
