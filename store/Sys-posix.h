@@ -7,3 +7,11 @@
 // A program may be started without its standard streams. A file of the user's that is opened then
 // must not take their place: it would get the lines of the log. And 0 stands for "no lock".
 int Sys_MoveOffStandard(int fd);
+
+// A pipe whose ends are above 2 and not inherited by started programs. 1, or 0 with the reason in
+// errno.
+int Sys_OpenPipe(int ends[2]);
+
+// Whoever started this program may have left it a setting by which children vanish when they end:
+// then nobody can tell how, and their numbers may be somebody else's. Call before starting one.
+void Sys_KeepEndedChildren();

@@ -77,9 +77,12 @@ const char *Sys_LoginName(); // of the user; a number when the account has no na
 
 // Runs a program and waits for its end, for `milliseconds` at most: then it is ended. `argv` ends
 // with null; a name without a slash is looked for in PATH; no shell is involved. The program reads
-// nothing, and what it writes to standard error is dropped. Returns its output, malloc'd, or null
-// when it could not be started, was ended, or left with a status other than 0.
-char *Sys_RunForOutput(const char *const *argv, int milliseconds);
+// nothing, and what it writes to standard error is dropped. Returns its output, malloc'd, with the
+// status it left with; null when it could not be started, crashed, or was ended: with all that it
+// had started, also for an output of more than 1 MiB.
+char *Sys_RunForOutput(const char *const *argv, int milliseconds, int *status);
+
+int Sys_IsProgram(const char *path); // 1 when it is a file that may be started
 
 // --- Folders ---
 

@@ -52,7 +52,7 @@ static void VolunteerForLackOfMemory()
     close(score);
 }
 
-static int OpenPipe(int ends[2])
+int Sys_OpenPipe(int ends[2])
 {
     if (pipe2(ends, O_CLOEXEC) != 0)
         return 0;
@@ -67,9 +67,7 @@ static int OpenPipe(int ends[2])
     return 0;
 }
 
-// Whoever started this program may have left it a setting by which children vanish when they end:
-// then nobody can tell how, and their numbers may be somebody else's.
-static void KeepEndedChildren()
+void Sys_KeepEndedChildren()
 {
     struct sigaction action;
     if (sigaction(SIGCHLD, nullptr, &action) == 0 && action.sa_handler == SIG_IGN)
@@ -79,9 +77,9 @@ static void KeepEndedChildren()
 int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds)
 {
     int ends[2];
-    if (!OpenPipe(ends))
+    if (!Sys_OpenPipe(ends))
         return 0;
-    KeepEndedChildren();
+    Sys_KeepEndedChildren();
     fcntl(ends[1], F_SETPIPE_SZ, 1 << 20); // fewer switches between the two; it may be refused
     fflush(nullptr); // else the child would hold, and perhaps write, unwritten lines of ours
     pid_t pid = fork();
