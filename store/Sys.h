@@ -71,6 +71,14 @@ char *Sys_DataFolder();   // $XDG_DATA_HOME, else ~/.local/share
 // Sys_LastErrorText(), when there is no such folder and none can be made.
 char *Sys_PrivatePath(const char *name, const char *ending);
 
+// Leaves a text for the user's other processes at `path`; it stands while this process lives,
+// however that ends, and not for children that outlive it. It takes the place of an older text in
+// one step, also of another process's. 1, or 0 with the reason in Sys_LastErrorText().
+int Sys_PostNote(const char *path, const char *text);
+
+// The text there; malloc'd, at most 4 KiB. Null for none, or when its process has ended.
+char *Sys_ReadNote(const char *path);
+
 const char *Sys_LoginName(); // of the user; a number when the account has no name
 
 // --- Other programs ---

@@ -51,14 +51,18 @@ static int TakeFolder(const std::string &path)
     return 0;
 }
 
+// "" where there is none. A program that was started as another user may have been left that one's
+// variable: then the temporary folder has to do.
 static std::string PrivateFolder()
 {
     const char *runtime = getenv("XDG_RUNTIME_DIR");
-    if (runtime && *runtime == '/')
-        return std::string(runtime) + "/quarlo";
+    std::string folder = std::string(runtime ? runtime : "") + "/quarlo";
+    if (runtime && *runtime == '/' && TakeFolder(folder))
+        return folder;
     const char *temporary = getenv("TMPDIR");
-    std::string folder = temporary && *temporary == '/' ? temporary : "/tmp";
-    return folder + "/quarlo-" + std::to_string(getuid());
+    folder = temporary && *temporary == '/' ? temporary : "/tmp";
+    folder += "/quarlo-" + std::to_string(getuid());
+    return TakeFolder(folder) ? folder : std::string();
 }
 
 // FNV-1a, 64 bits.
@@ -73,7 +77,7 @@ static uint64_t Hash(const char *text)
 char *Sys_PrivatePath(const char *name, const char *ending)
 {
     std::string folder = PrivateFolder();
-    if (!TakeFolder(folder))
+    if (folder.empty())
         return nullptr;
     char number[17];
     snprintf(number, sizeof number, "%016llx", static_cast<unsigned long long>(Hash(name)));
