@@ -18,26 +18,36 @@ enum {
 // appended to instead of standard error. Never fails toward the caller.
 void TNSMessage(const char *prefix, const char *text, int level);
 
-// The full path of a file, malloc'd; null for none. `category` is one of
-//   "bib"      a BIB file by its name without folder: asks kpsewhich where TeX is installed, else
-//              looks through the folders of the environment variable BIBINPUTS
+// The full path of a file, malloc'd; null for none, and for a name with a '/'. `category` is one of
+//   "bib"      a BIB file by its name, as typed or with ".bib" added: asks kpsewhich, whose answer
+//              holds; where there is no working one, looks through the parts of the environment
+//              variable BIBINPUTS (separated by colons; "//" at the end of a part: the folders
+//              below, too; an empty part: the current folder)
 //   "Icon"     the picture of a tool, by its name without ending
 //   "Logo"     a picture of a program, by the program's name
 //   "Program"  a program of the environment
 // The last three look through the folders that the key of the category's name in section "Search"
 // lists (TNSValue; separated by colons), then the user's own, then those installed with this
-// program.
+// program:
+//   "Logo"     $XDG_DATA_HOME/cartulo, share/cartulo beside the folder of the executable, the
+//              folder of resources that the program was built with
+//   "Icon"     icons in each of these
+//   "Program"  $XDG_DATA_HOME/cartulo/bin, the folder of the executable, libexec/cartulo beside
+//              that, then PATH
+// Pictures end in .svg, .png, .xpm, .bmp or .gif; the first of these holds. Relative folders in
+// settings and in PATH do not count.
 char *TNSearch(const char *category, const char *name);
 
-// A setting of the environment, malloc'd; null for none. Read afresh each time from the file
-// Cartulo/environment.ini in the user's configuration folder.
+// A setting of the environment, malloc'd, at most 4095 bytes; null for none. Read afresh each time
+// from the file Cartulo/environment.ini in the user's configuration folder.
 char *TNSValue(const char *section, const char *key);
 
 // The text of a control word; null for none. Nothing controls a program that runs on its own.
 const char *TNSFind(const char *word);
 
 // Makes a window known to the user's processes under a name, until this process ends. The window
-// is the handle by which other programs name it; the last call for a name holds.
+// is the handle by which other programs name it; the last call for a name holds, whichever process
+// made it.
 void RegisterFrame(const char *instance, long window);
 
 // The window of a living process that is known under that name; 0 for none.
