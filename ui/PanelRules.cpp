@@ -3,6 +3,28 @@
 #include <algorithm>
 #include <cmath>
 
+PanelPane Panel_Pane(int fileCount, int rowCount)
+{
+    if (fileCount == 0)
+        return PANE_OPEN;
+    return rowCount > 0 ? PANE_ENTRY : PANE_NEW;
+}
+
+static bool IsWritable(const BibFileSet *set, int file)
+{
+    return file >= 0 && file < set->count && !set->files[file]->readOnly;
+}
+
+PanelTools Panel_Tools(const BibFileSet *set, int file, bool editMode)
+{
+    if (editMode)
+        return {false, false};
+    PanelTools tools = {IsWritable(set, file), IsWritable(set, file)};
+    for (int i = 0; i < set->count && !tools.add; ++i)
+        tools.add = IsWritable(set, i); // a new entry may go to any file
+    return tools;
+}
+
 static double Linear(unsigned char channel)
 {
     double c = channel / 255.0;

@@ -1,6 +1,23 @@
 // ui/PanelRules.h - decisions of the editor panel that need no window.
 #pragma once
 
+#include "store/BibFileSet.h"
+
+// What the panel shows beside the list, or instead of it.
+enum PanelPane {
+    PANE_OPEN,  // no file is open: only the button that opens one
+    PANE_ENTRY, // the list and the selected entry
+    PANE_NEW    // the list has no row: the button that adds an entry
+};
+PanelPane Panel_Pane(int fileCount, int rowCount);
+
+// Which commands on entries apply. `file` is the index of the current file; any other number when
+// there is none.
+struct PanelTools {
+    bool add, change; // change: edit, rename, remove
+};
+PanelTools Panel_Tools(const BibFileSet *set, int file, bool editMode);
+
 struct Colour {
     unsigned char red, green, blue;
 };
