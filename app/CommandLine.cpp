@@ -112,6 +112,26 @@ const char *NextToken(const char *text, char *out, size_t size)
     return SkipBlanks(end);
 }
 
+// --- The start of the program ---
+
+StartUp Command_StartUp(const char *commandLine)
+{
+    StartUp start = {"Cartulo", "", commandLine};
+    char first[TOKEN_SIZE];
+    const char *rest = NextToken(commandLine, first, sizeof first);
+    if (!rest || Ascii_CompareN(first, "-d", 2) != 0)
+        return start;
+    start.baseFolder = first + 2;
+    if (start.baseFolder.size() >= BASE_FOLDER_SIZE) {
+        start.baseFolder.clear(); // the panel says that it is too long
+        return start;
+    }
+    start.instance += "-" + start.baseFolder;
+    std::replace(start.instance.begin(), start.instance.end(), '\\', '/');
+    start.commandLine = rest;
+    return start;
+}
+
 // --- File names ---
 
 static bool IsAbsolute(const char *token)

@@ -37,6 +37,15 @@ std::string Command_Quote(const char *text);
 // stays as it is.
 std::string Command_QuoteArgument(const char *argument);
 
+// What a second start has in common with a first one: a start whose first argument is "-dFOLDER"
+// serves that folder alone.
+struct StartUp {
+    std::string instance;    // "Cartulo", or "Cartulo-FOLDER" with forward slashes
+    std::string baseFolder;  // "" unless the instance is a folder's
+    const char *commandLine; // for the panel, part of the line; null when the line is too long
+};
+StartUp Command_StartUp(const char *commandLine);
+
 // Copies the next token to `out` (at most size - 1 bytes) and returns where the following one
 // starts, null when there was none. Blanks separate; a token may stand in quotes of either kind.
 // Bytes compare as signed, so an unquoted token ends at a byte of 128 or more; at such a byte the

@@ -97,6 +97,49 @@ Tokens Split(const char *text, size_t size = TOKEN_SIZE)
 
 using BuildCommandLineTest = Traced;
 
+TEST(CommandStartUp, IsAloneWithoutAFolder)
+{
+    StartUp start = Command_StartUp("refs.bib -d/home/");
+    EXPECT_EQ("Cartulo", start.instance);
+    EXPECT_EQ("", start.baseFolder);
+    EXPECT_STREQ("refs.bib -d/home/", start.commandLine);
+    EXPECT_STREQ("", Command_StartUp("").commandLine);
+}
+
+TEST(CommandStartUp, ServesTheFolderOfTheFirstArgument)
+{
+    StartUp start = Command_StartUp("-d/home/u/ refs.bib -eCP1250");
+    EXPECT_EQ("Cartulo-/home/u/", start.instance);
+    EXPECT_EQ("/home/u/", start.baseFolder);
+    EXPECT_STREQ("refs.bib -eCP1250", start.commandLine);
+}
+
+TEST(CommandStartUp, IgnoresTheCaseOfTheOptionAndTurnsBackslashes)
+{
+    StartUp start = Command_StartUp("-DC:\\work\\");
+    EXPECT_EQ("Cartulo-C:/work/", start.instance);
+    EXPECT_EQ("C:\\work\\", start.baseFolder);
+    EXPECT_STREQ("", start.commandLine);
+}
+
+TEST(CommandStartUp, TakesAFolderInQuotes)
+{
+    StartUp start = Command_StartUp("\"-d/my papers/\" a");
+    EXPECT_EQ("/my papers/", start.baseFolder);
+    EXPECT_STREQ("a", start.commandLine);
+}
+
+TEST(CommandStartUp, LeavesAFolderThatIsTooLongToThePanel)
+{
+    std::string fits = "-d" + std::string(BASE_FOLDER_SIZE - 1, 'x');
+    EXPECT_EQ(BASE_FOLDER_SIZE - 1u, Command_StartUp(fits.c_str()).baseFolder.size());
+    std::string line = fits + "x";
+    StartUp start = Command_StartUp(line.c_str());
+    EXPECT_EQ("Cartulo", start.instance);
+    EXPECT_EQ("", start.baseFolder);
+    EXPECT_EQ(line, start.commandLine);
+}
+
 TEST_F(BuildCommandLineTest, JoinsTheArgumentsFromTheSecondOn)
 {
     const char *argv[] = {"cartulo", "-d/work", "refs", "more.bib"};
