@@ -246,6 +246,7 @@ TEST(SysRunForOutput, PassesNoSignalSettingsOn)
 TEST(SysRunForOutput, PassesNoFilesOn)
 {
     TempFolder folder;
+    close_range(3, ~0u, 0); // what this program was started with
     int lock = Sys_LockFile(folder.Path("lock").c_str());
     ASSERT_NE(0, lock);
     EXPECT_EQ("0\n1\n2\n", RunScript("for i in 0 1 2 3 4 5 6 7 8 9; do"
