@@ -2,6 +2,7 @@
 #include "app/IpcClient.h"
 
 #include <cstdlib>
+#include <cstring>
 
 #include "app/Companion.h"
 #include "app/Ipc.h"
@@ -61,11 +62,10 @@ bool CmdConnection::Open(const char *topic, int milliseconds)
 bool CmdConnection::Execute(const char *text)
 {
     LogClient("Execute...");
-    std::string bytes = Ipc_Execute(text);
-    if (bytes.size() > IPC_DATA_SIZE)
+    if (strlen(text) + 1 > IPC_DATA_SIZE)
         return false; // no server takes that
     int32_t end = Sys_Milliseconds() + m_milliseconds;
-    return Send(bytes + Ipc_CodeAlone(IPC_DISCONNECT), end) &&
+    return Send(Ipc_Execute(text) + Ipc_CodeAlone(IPC_DISCONNECT), end) &&
            Sys_FinishSending(m_socket, TimeLeft(end)) != 0;
 }
 
@@ -105,8 +105,10 @@ bool CmdConnection::Send(const std::string &bytes, int32_t end)
 bool CmdConnection::ReceiveAnswer(IpcMessage *answer, int32_t end)
 {
     while (TakeMessage(answer, end)) {
-        if (answer->code == IPC_DISCONNECT)
-            break;
+        if (answer->code == IPC_DISCONNECT) {
+            OnDisconnect();
+            return false;
+        }
         if (answer->code != IPC_ADVISE)
             return true;
         OnAdvise();
