@@ -3,7 +3,7 @@
 set -eu
 
 build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libbtparse-dev
-       libgtest-dev libgmock-dev libbenchmark-dev"
+       libgtest-dev libgmock-dev libbenchmark-dev cmark"
 # A private screen with a window manager, and pictures of it.
 screen="xvfb openbox x11-utils dbus-daemon xdotool imagemagick fonts-dejavu-core adwaita-icon-theme"
 test="locales python3"

@@ -1,0 +1,91 @@
+// help/metahelp.cpp - the help program: shows the user's manual.
+
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+
+#include <wx/app.h>
+#include <wx/image.h>
+#include <wx/msgdlg.h>
+
+#include "help/HelpFrame.h"
+#include "help/HelpPage.h"
+#include "store/BibStore.h"
+#include "store/Sys.h"
+
+static const char Usage[] = "Usage: metahelp [TOPIC]\n"
+                            "\n"
+                            "Shows the user's manual of Cartulo, which is the topic .QRL.Cartulo.\n"
+                            "\n"
+                            "  --help       show this text\n"
+                            "  --version    show the version\n";
+
+static const char NoManual[] = "The manual of Cartulo (manual.html) is not where it should be: in "
+                               "the folder of this program, or in share/doc/cartulo.";
+
+namespace
+{
+
+class HelpApp : public wxApp
+{
+public:
+    HelpApp(const std::string &manual, const char *topic) : m_manual(manual), m_topic(topic) {}
+
+    bool OnInit() override;
+
+private:
+    std::string m_manual; // "" when there is none
+    const char *m_topic;
+};
+
+} // namespace
+
+bool HelpApp::OnInit()
+{
+    if (m_manual.empty()) {
+        wxMessageBox(NoManual, "Cartulo", wxOK | wxICON_ERROR);
+        return false;
+    }
+    wxInitAllImageHandlers();
+    (new HelpFrame(m_manual, Help_Notice(m_topic)))->wxFrame::Show();
+    return true;
+}
+
+// "" when it is missing or cannot be read.
+static std::string ReadManual()
+{
+    std::string path = Help_FindManual(Sys_ModulePath());
+    FILE *stream = path.empty() ? nullptr : Sys_OpenRegular(path.c_str());
+    if (!stream)
+        return std::string();
+    size_t length = 0;
+    char *text = Sys_ReadAll(stream, &length);
+    fclose(stream);
+    std::string manual(text ? text : "", text ? length : 0);
+    free(text);
+    return manual;
+}
+
+// Answers that need no display. 1 when that was all.
+static int AnswerWithoutDisplay(int argc, char **argv)
+{
+    for (int i = 1; i < argc; ++i) {
+        if (strcmp(argv[i], "--help") == 0)
+            return fputs(Usage, stdout), 1;
+        if (strcmp(argv[i], "--version") == 0)
+            return puts("metahelp " CARTULO_VERSION), 1;
+    }
+    return 0;
+}
+
+int main(int argc, char **argv)
+{
+    if (AnswerWithoutDisplay(argc, argv))
+        return fflush(stdout) == 0 ? 0 : 1;
+    std::string manual = ReadManual();
+    if (manual.empty())
+        fprintf(stderr, "metahelp: %s\n", NoManual);
+    wxApp::SetInstance(new HelpApp(manual, argc > 1 ? argv[1] : ""));
+    int status = wxEntry(argc, argv);
+    return manual.empty() ? 1 : status;
+}

@@ -1,0 +1,76 @@
+#!/bin/sh
+# Starts the help program on a display as the editor does: metahelp.sh METAHELP VERSION. Fails unless
+# its window shows the manual and closes with the keyboard, and unless it says so when there is none.
+set -eu
+program=$1
+version=$2
+folder=$(mktemp -d)
+help=
+trap '[ -z "$help" ] || kill "$help" 2>/dev/null || true; rm -rf "$folder"' EXIT
+
+fail() {
+    echo "$1" >&2
+    exit 1
+}
+
+# Runs a command until it succeeds, for about 20 seconds at the most.
+until_done() {
+    tries=0
+    until "$@"; do
+        tries=$((tries + 1))
+        [ "$tries" -lt 200 ] || return 1
+        sleep 0.1
+    done
+}
+
+has_window() {
+    window=$(xdotool search --all --onlyvisible --pid "$help" --name "$1" 2>/dev/null)
+}
+
+# Right after the start the window manager may not heed the first requests.
+closes_with() {
+    ! kill -0 "$help" 2>/dev/null && return 0
+    xdotool windowactivate "$window" 2>/dev/null || true
+    sleep 0.1
+    [ "$(xdotool getactivewindow 2>/dev/null)" != "$window" ] || xdotool key "$1"
+    sleep 0.1
+    ! kill -0 "$help" 2>/dev/null
+}
+
+# shows_manual KEY [TOPIC]
+shows_manual() {
+    key=$1
+    shift
+    "$program" "$@" 2>"$folder/errors" &
+    help=$!
+    until_done has_window '^Cartulo: the manual$' || fail "no window: $(cat "$folder/errors")"
+    until_done closes_with "$key" || fail "the window does not close with $key"
+    wait "$help" || fail "the help program ended with status $?"
+    help=
+}
+
+[ "$("$program" --version)" = "metahelp $version" ] || fail "wrong version"
+case $(env -u DISPLAY "$program" --help) in
+Usage:*.QRL.Cartulo*) ;;
+*) fail "wrong help" ;;
+esac
+! "$program" --version >/dev/full || fail "--version did not fail"
+
+shows_manual ctrl+w .QRL.Cartulo
+shows_manual Escape .QRL.Other
+shows_manual Escape
+
+# Alone in a folder, without its manual.
+cp "$program" "$folder/metahelp"
+status=0
+env -u DISPLAY "$folder/metahelp" .QRL.Cartulo 2>"$folder/errors" || status=$?
+[ "$status" -eq 1 ] || fail "status $status without a manual"
+grep -q 'manual.html' "$folder/errors" || fail "nothing is said about the manual"
+"$folder/metahelp" .QRL.Cartulo 2>"$folder/errors" &
+help=$!
+until_done has_window '^Cartulo$' || fail "no box about the missing manual"
+until_done closes_with Escape || fail "the box does not close"
+status=0
+wait "$help" || status=$?
+help=
+[ "$status" -eq 1 ] || fail "status $status behind the box"
