@@ -71,6 +71,19 @@ static std::string ProgramFolder()
     return ParentOf(Sys_ModulePath());
 }
 
+static const char HelperFolder[] = "/libexec/cartulo";
+
+// Where the program is installed, as an editor in "bin" or as a helper of it.
+static std::string PrefixFolder()
+{
+    std::string folder = ProgramFolder();
+    size_t length = strlen(HelperFolder);
+    if (folder.size() >= length &&
+        folder.compare(folder.size() - length, length, HelperFolder) == 0)
+        return folder.substr(0, folder.size() - length);
+    return ParentOf(folder);
+}
+
 // --- BIB files ---
 
 static char *FullPath(const std::string &path)
@@ -137,7 +150,7 @@ static char *FindBib(const char *name)
 // The last folder is that of a program which is run from where it was built.
 static Folders ResourceFolders()
 {
-    return {UserFolder(), ParentOf(ProgramFolder()) + "/share/cartulo", CARTULO_RESOURCES};
+    return {UserFolder(), PrefixFolder() + "/share/cartulo", CARTULO_RESOURCES};
 }
 
 static char *FindPicture(const Folders &folders, const std::string &name)
@@ -175,7 +188,7 @@ static char *FindProgram(const char *name)
     AppendSetting(&folders, "Program");
     folders.push_back(UserFolder() + "/bin");
     folders.push_back(ProgramFolder());
-    folders.push_back(ParentOf(ProgramFolder()) + "/libexec/cartulo");
+    folders.push_back(PrefixFolder() + HelperFolder);
     AppendAbsolute(&folders, getenv("PATH"));
     for (const std::string &folder : folders) {
         std::string path = folder + "/" + name;

@@ -29,11 +29,11 @@ void TNSMessage(const char *prefix, const char *text, int level);
 // The last three look through the folders that the key of the category's name in section "Search"
 // lists (TNSValue; separated by colons), then the user's own, then those installed with this
 // program:
-//   "Logo"     $XDG_DATA_HOME/cartulo, share/cartulo beside the folder of the executable, the
-//              folder of resources that the program was built with
+//   "Logo"     $XDG_DATA_HOME/cartulo, ../share/cartulo from the executable (../../share/cartulo
+//              from one in libexec/cartulo), the resources that the program was built with
 //   "Icon"     icons in each of these
-//   "Program"  $XDG_DATA_HOME/cartulo/bin, the folder of the executable, libexec/cartulo beside
-//              that, then PATH
+//   "Program"  $XDG_DATA_HOME/cartulo/bin, the folder of the executable, ../libexec/cartulo from
+//              it, then PATH
 // Pictures end in .svg, .png, .xpm, .bmp or .gif; the first of these holds. Relative folders in
 // settings and in PATH do not count.
 char *TNSearch(const char *category, const char *name);

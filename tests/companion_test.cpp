@@ -87,7 +87,6 @@ string Value(const char *section, const char *key)
 }
 
 using TNSearchBib = Companion;
-using TNSearchInstalled = Companion;
 
 class TNSearchPicture : public Companion, public testing::WithParamInterface<const char *>
 {
@@ -354,30 +353,44 @@ TEST_F(TNSearchProgram, AreNotTakenFromTheCurrentFolder)
 
 // --- A program that is installed ---
 
-TEST_F(TNSearchInstalled, LooksBesideItsFolder)
+class TNSearchInstalled : public Companion
 {
-    string program = m_folder.Path("usr/bin/search");
-    fs::create_directories(m_folder.Path("usr/bin"));
-    fs::copy_file(SEARCH_PROGRAM, program);
-    auto find = [&](const char *category, const char *name) {
-        const char *const argv[] = {program.c_str(), category, name, nullptr};
+protected:
+    // What the program finds when it is installed as `name`.
+    string FindAs(const string &name, const char *category, const char *wanted)
+    {
+        string program = m_folder.Path(name);
+        fs::create_directories(fs::path(program).parent_path());
+        fs::copy_file(SEARCH_PROGRAM, program, fs::copy_options::skip_existing);
+        const char *const argv[] = {program.c_str(), category, wanted, nullptr};
         int status;
         string text = TextOf(Sys_RunForOutput(argv, 30000, &status));
         return text.substr(0, text.find('\n'));
-    };
+    }
+};
+
+TEST_F(TNSearchInstalled, FindsThePicturesBesideItsFolder)
+{
     string icon = Make("usr/share/cartulo/icons/Warning.svg");
     string logo = Make("usr/share/cartulo/Cartulo.png");
+    for (const char *name : {"usr/bin/search", "usr/libexec/cartulo/search"}) {
+        EXPECT_EQ(icon, FindAs(name, "Icon", "Warning"));
+        EXPECT_EQ(logo, FindAs(name, "Logo", "Cartulo"));
+        EXPECT_EQ("none", FindAs(name, "Icon", "no-such-icon"));
+    }
+    string own = Make("data/cartulo/icons/Warning.bmp");
+    EXPECT_EQ(own, FindAs("usr/bin/search", "Icon", "Warning"));
+}
+
+TEST_F(TNSearchInstalled, FindsItsHelpersBeforeThoseInPath)
+{
+    const char name[] = "usr/bin/search";
     MakeProgram("path/tool");
     string helper = MakeProgram("usr/libexec/cartulo/tool");
-    EXPECT_EQ(icon, find("Icon", "Warning"));
-    EXPECT_EQ(logo, find("Logo", "Cartulo"));
-    EXPECT_EQ(helper, find("Program", "tool"));
-    EXPECT_EQ(program, find("Program", "search"));
+    EXPECT_EQ(helper, FindAs(name, "Program", "tool"));
     string beside = MakeProgram("usr/bin/tool");
-    EXPECT_EQ(beside, find("Program", "tool"));
-    string own = Make("data/cartulo/icons/Warning.bmp");
-    EXPECT_EQ(own, find("Icon", "Warning"));
-    EXPECT_EQ("none", find("Icon", "no-such-icon"));
+    EXPECT_EQ(beside, FindAs(name, "Program", "tool"));
+    EXPECT_EQ(m_folder.Path(name), FindAs(name, "Program", "search"));
 }
 
 // --- Settings ---
