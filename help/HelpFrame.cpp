@@ -2,6 +2,7 @@
 
 #include <algorithm>
 
+#include <wx/display.h>
 #include <wx/html/htmlcell.h>
 #include <wx/settings.h>
 #include <wx/sizer.h>
@@ -101,7 +102,9 @@ HelpFrame::HelpFrame(const std::string &manual, const std::string &notice)
     m_view->SetRelatedFrame(this, "%s");
     ShowPage();
     SetMinSize(FromDIP(wxSize(360, 240)));
-    SetSize(FromDIP(wxSize(760, 680)));
+    wxSize size = FromDIP(wxSize(760, 680));
+    size.DecTo(wxDisplay(this).GetClientArea().GetSize());
+    SetSize(size);
     m_view->SetFocus(); // the arrow keys scroll at once
 }
 
