@@ -292,6 +292,16 @@ void Sys_SurviveFailedWrites()
     signal(SIGXFSZ, SIG_IGN);
 }
 
+void Sys_FillStandard()
+{
+    int fd;
+    do
+        fd = open("/dev/null", O_RDWR);
+    while (fd >= 0 && fd <= STDERR_FILENO);
+    if (fd >= 0)
+        close(fd);
+}
+
 // With the '/' at its end; "" for the current folder.
 static std::string FolderOf(const char *path)
 {

@@ -43,6 +43,10 @@ int Sys_RemoveFile(const char *path); // 1 or 0
 // of ending the process with all that is not saved. Call once, at the start.
 void Sys_SurviveFailedWrites();
 
+// Gives a process that was started without standard input, output or error the null device for
+// it, so that no other file takes the number and gets what is printed. Call once, before all else.
+void Sys_FillStandard();
+
 // Replacing a file in one step: new contents go to a temporary file in the same folder, and
 // Sys_CommitReplace puts it in place of the path (of its target, when it is a symbolic link)
 // after it reached the disk, with the old file's mode and, where allowed, owner. Until then, and

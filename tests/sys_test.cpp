@@ -508,3 +508,20 @@ TEST(SysSurviveFailedWrites, TurnsSignalsIntoFailures)
     EXPECT_EQ(EPIPE, errno);
     close(ends[1]);
 }
+
+// --- Standard streams ---
+
+TEST(SysFillStandard, KeepsOtherFilesOffTheStandardNumbers)
+{
+    pid_t child = fork();
+    if (child == 0) {
+        close(0);
+        close(2);
+        Sys_FillStandard();
+        int next = open("/dev/null", O_RDONLY);
+        _exit(fcntl(0, F_GETFD) == 0 && fcntl(2, F_GETFD) == 0 && next > 2 ? 0 : 1);
+    }
+    int status = -1;
+    waitpid(child, &status, 0);
+    EXPECT_EQ(0, status);
+}
