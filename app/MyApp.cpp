@@ -13,6 +13,8 @@
 #include <wx/utils.h>
 
 #include "app/Companion.h"
+#include "app/Ipc.h"
+#include "app/IpcServer.h"
 #include "app/Log.h"
 #include "app/LogGui.h"
 #include "app/Native.h"
@@ -24,15 +26,20 @@ wxBEGIN_EVENT_TABLE(MyApp, wxApp)
     EVT_ACTIVATE_APP(MyApp::OnActivateApp)
 wxEND_EVENT_TABLE()
 
+enum { HAND_OVER_TIME = 10000, HAND_OVER_PAUSE = 100 }; // milliseconds
+
 static const char Usage[] =
     "Usage: cartulo [options] [BIB files]\n"
     "\n"
     "Shows the entries of all named BibTeX databases in one searchable list.\n"
-    "The extension .bib may be left out.\n"
+    "The extension .bib may be left out. A second start with the same -dFOLDER/ hands its files\n"
+    "over to the first.\n"
     "\n"
     "  -dFOLDER/    folder that relative file names start from (first, with the slash)\n"
     "  -eNAME       code page of the files, like -eCP1251; without it CP1252\n"
     "  -i           forget the files named so far\n"
+    "  -wWINDOW/SERVICE\n"
+    "               window and service of the editor that \\cite commands go to\n"
     "  --help       show this text\n"
     "  --version    show the version\n"
     "\n"
@@ -58,9 +65,8 @@ bool MyApp::CheckParser()
     return false;
 }
 
-// The command line for the frame; null, shown to the user, when it is too long. A first argument
-// "-dFOLDER" sets the base folder and is taken off.
-const char *MyApp::TakeCommandLine()
+// The arguments as a command line; null, shown to the user, when it is too long.
+const char *MyApp::BuildLine()
 {
     std::vector<std::string> quoted;
     for (int i = 0; i < m_argumentCount; ++i)
@@ -69,19 +75,44 @@ const char *MyApp::TakeCommandLine()
     for (const std::string &argument : quoted)
         arguments.push_back(argument.c_str());
     const char *line = BuildCommandLine(int(arguments.size()), arguments.data());
-    if (!line) {
+    if (!line)
         wxMessageBox("The command line is too long. Name fewer BIB files.", "Cartulo",
                      wxOK | wxICON_WARNING);
-        return nullptr;
+    return line;
+}
+
+// False when another process serves the same folder. The lock ends with the process, however that
+// ends, so nothing is left to be cleaned up. Where it can't be made, the program runs alone.
+bool MyApp::TakeInstance()
+{
+    std::string name = "Quarlo-" + m_start.instance + "-" + Sys_LoginName();
+    TNSMessage("INFO: Cartulo::Single ", name.c_str(), TNS_LIFECYCLE);
+    char *path = Sys_PrivatePath(name.c_str(), ".lock");
+    if (!path) {
+        AppLog("ERROR: No folder for the instance lock: ", Sys_LastErrorText());
+        return true;
     }
-    char first[TOKEN_SIZE];
-    const char *rest = NextToken(line, first, sizeof first);
-    if (!rest || Ascii_CompareN(first, "-d", 2) != 0)
-        return line;
-    if (strlen(first + 2) >= sizeof m_state.baseFolder)
-        return line; // the panel says that it is too long
-    strcpy(m_state.baseFolder, first + 2);
-    return rest;
+    m_instanceLock = Sys_LockFile(path);
+    free(path);
+    return m_instanceLock != 0;
+}
+
+// To the first instance, which may still be loading its files.
+void MyApp::HandOver(const char *commandLine)
+{
+    long window = FindFrame(m_start.instance.c_str());
+    if (window != 0)
+        Native_BringForward(window);
+    int32_t start = Sys_Milliseconds();
+    do {
+        handedOver = SendCommand(m_service.c_str(), commandLine);
+        if (handedOver)
+            return;
+        wxMilliSleep(HAND_OVER_PAUSE);
+    } while (Sys_Milliseconds() - start < HAND_OVER_TIME);
+    fprintf(stderr,
+            "cartulo: the running Cartulo does not answer; these files were not opened: %s\n",
+            commandLine);
 }
 
 void MyApp::OpenConfig()
@@ -92,14 +123,33 @@ void MyApp::OpenConfig()
     wxConfigBase::Get();
 }
 
+static char *FindBib(const char *name)
+{
+    return TNSearch("bib", name);
+}
+
+static void LogControl(const char *word)
+{
+    const char *answer = TNSFind(word);
+    AppLog("TNS Control: ", answer ? answer : "");
+}
+
 bool MyApp::OnInit()
 {
     AppLog("Cartulo::OnInit --- ", "Start");
+    LogControl("!NoMake");
+    LogControl("!AutoDownload=OFF");
     Enc_Select("CP1252");
     AppLog("Cartulo::OnInit --- ", "Command_Line");
-    const char *commandLine = TakeCommandLine();
+    const char *commandLine = BuildLine();
     if (!commandLine || !CheckParser())
         return false;
+    m_start = Command_StartUp(commandLine);
+    m_service = "/tmp/Quarlo-DDE-" + m_start.instance;
+    if (!m_start.baseFolder.empty() && !TakeInstance()) {
+        HandOver(commandLine);
+        return false;
+    }
     wxInitAllImageHandlers();
     AppLog("Cartulo::OnInit --- ", "Names");
     SetVendorName("Quarlo");
@@ -107,17 +157,29 @@ bool MyApp::OnInit()
     AppLog("Cartulo::OnInit --- ", "pConfig");
     OpenConfig();
     AppLog("Cartulo::OnInit --- ", "Frame ...");
-    m_frame = new MyFrame("Quarlo Cartulo", commandLine, &m_state);
-    // Programs that this one starts find its window so.
-    wxSetEnv("QUARLOSTERWINDOW", wxString::Format("%ld", Native_WindowHandle(m_frame)));
+    strcpy(m_state.baseFolder, m_start.baseFolder.c_str());
+    m_state.findBib = FindBib;
+    m_frame = new MyFrame("Quarlo Cartulo", m_start.commandLine, &m_state);
+    Publish(Native_WindowHandle(m_frame));
     m_frame->Show();
     return true;
+}
+
+// Other processes find the window by the instance's name, and those that this one starts by the
+// environment variable.
+void MyApp::Publish(long window)
+{
+    RegisterFrame(m_start.instance.c_str(), window);
+    wxSetEnv("QUARLOSTERWINDOW", wxString::Format("%ld", window));
+    m_server = StartCommandServer(m_service.c_str(), m_frame);
 }
 
 int MyApp::OnExit()
 {
     TNSMessage("INFO: MyApp:OnExit ", "Begin", TNS_LIFECYCLE);
     delete wxConfigBase::Set(nullptr); // writes it
+    Sys_UnlockFile(m_instanceLock);
+    delete m_server;
     TNSMessage("INFO: MyApp:OnExit ", "End", TNS_LIFECYCLE);
     return wxApp::OnExit();
 }
@@ -147,10 +209,13 @@ int main(int argc, char **argv)
 {
     if (AnswerWithoutDisplay(argc, argv))
         return fflush(stdout) == 0 ? 0 : 1;
+    Sys_FillStandard();
     Sys_SurviveFailedWrites();
     if (!wxGetEnv("GDK_BACKEND", nullptr))
         wxSetEnv("GDK_BACKEND", "x11,*"); // other programs can name and raise our window there
     Log_SetUpToolkit();
     wxApp::SetInstance(new MyApp(argc, argv));
-    return wxEntry(argc, argv);
+    int status = wxEntry(argc, argv);
+    return MyApp::HasHandedOver() ? 0
+                                  : status; // the toolkit calls a start without window a failure
 }

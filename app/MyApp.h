@@ -7,6 +7,8 @@
 #include "app/CommandLine.h"
 #include "app/MyFrame.h"
 
+class MyServer;
+
 class MyApp : public wxApp
 {
 public:
@@ -16,19 +18,30 @@ public:
     bool OnInit() override; // false: the program ends at once
     int OnExit() override;
 
+    // True when another process has taken the command line, and OnInit returned false for that.
+    static bool HasHandedOver() { return handedOver; }
+
 protected:
     wxAppTraits *CreateTraits() override;
 
 private:
+    const char *BuildLine();
     bool CheckParser();
-    const char *TakeCommandLine();
+    bool TakeInstance();
+    void HandOver(const char *commandLine);
+    void Publish(long window);
     void OpenConfig();
     void OnActivateApp(wxActivateEvent &event);
 
     int m_argumentCount;
     char **m_arguments;
+    static inline bool handedOver = false;
+    StartUp m_start;
+    std::string m_service; // name of the command channel
     CommandState m_state = {};
-    wxWeakRef<MyFrame> m_frame;
+    int m_instanceLock = 0;       // held while this is the first instance of its folder
+    MyServer *m_server = nullptr; // ours; null when it could not be started
+    wxWeakRef<MyFrame> m_frame;   // the toolkit destroys it
 
     wxDECLARE_EVENT_TABLE();
 };

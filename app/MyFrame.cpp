@@ -1,37 +1,82 @@
 #include "app/MyFrame.h"
 
+#include <wx/config.h>
+#include <wx/display.h>
+#include <wx/menu.h>
+#include <wx/modalhook.h>
 #include <wx/msgdlg.h>
 #include <wx/srchctrl.h>
 #include <wx/toolbar.h>
+#include <wx/utils.h>
 
+#include "app/AboutDlg.h"
 #include "app/Companion.h"
-#include "app/FrameRules.h"
 #include "app/Icons.h"
 #include "app/Ids.h"
 #include "app/Log.h"
 #include "app/Native.h"
+#include "store/Sys.h"
 #include "ui/Cartulo.h"
+#include "ui/DisplayText.h"
+#include "ui/Messages.h"
 #include "ui/MessagesText.h"
+#include "ui/QListBox.h"
 
-enum { ICON_SIZE = 16, TOOL_MARGIN = 4, SEARCH_WIDTH = 240 };
+enum { SMALLEST_WINDOW = 512, DEFAULT_PLACE = 50, TOOL_MARGIN = 4, SEARCH_WIDTH = 160 };
+enum { PLACING_TIME = 500 }; // milliseconds that a window manager may take
 
 // The first row that matches handles the event.
 wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
     EVT_MENU(ID_CLOSE, MyFrame::OnQuit)
     EVT_MENU(ID_EXIT, MyFrame::OnQuit)
+    EVT_MENU(ID_HELP, MyFrame::OnHelp)
+    EVT_BUTTON(ID_HELP, MyFrame::OnHelp)
+    EVT_MENU(ID_ABOUT, MyFrame::OnAbout)
+    EVT_BUTTON(ID_ABOUT, MyFrame::OnAbout)
+    EVT_MENU(ID_CONTEXT_MENU, MyFrame::OnContextMenu)
     EVT_MENU(ID_SEARCH, MyFrame::OnFind)
     EVT_MENU_RANGE(ID_COMMAND_FIRST, ID_COMMAND_LAST, MyFrame::OnCommand)
     EVT_TEXT(ID_SEARCH, MyFrame::OnSearch)
     EVT_SEARCH(ID_SEARCH, MyFrame::OnSearch)
     EVT_CHAR_HOOK(MyFrame::OnCharHook)
+    EVT_MOVE(MyFrame::OnMove)
+    EVT_SIZE(MyFrame::OnSize)
     EVT_CLOSE(MyFrame::OnClose)
 wxEND_EVENT_TABLE()
 
-MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *state)
-    : wxFrame(nullptr, wxID_ANY, title)
+// Counts the open dialogs that must not have the files exchanged under them.
+class DialogCount : public wxModalDialogHook
 {
-    SetMinSize(FromDIP(wxSize(512, 512)));
-    SetSize(FromDIP(wxSize(800, 600)));
+public:
+    DialogCount() { Register(); }
+    ~DialogCount() override { Unregister(); }
+
+    int Open() const { return m_open; }
+
+protected:
+    int Enter(wxDialog *dialog) override
+    {
+        m_open += Counts(dialog);
+        return wxID_NONE; // it is shown
+    }
+
+    void Exit(wxDialog *dialog) override { m_open -= Counts(dialog); }
+
+private:
+    static int Counts(wxDialog *dialog)
+    {
+        return !dynamic_cast<Cartulo_Messages *>(dialog) && !dynamic_cast<AboutDlg *>(dialog);
+    }
+
+    int m_open = 0;
+};
+
+// --- Construction ---
+
+MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *state)
+    : wxFrame(nullptr, wxID_ANY, title), m_state(state), m_dialogs(new DialogCount)
+{
+    Place();
     SetFont(wxFontInfo(10));
     SetIcons(Icon_Program());
     AppLog("Cartulo::Frame --- ", "Creating Helper ...");
@@ -43,28 +88,193 @@ MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *s
     AppLog("Cartulo::Frame --- ", "End.");
 }
 
+MyFrame::~MyFrame()
+{
+    TNSMessage("INFO: MyFrame::~MyFrame ", "Begin", TNS_LIFECYCLE);
+    SaveGeometry();
+    delete m_contextMenu;
+    TNSMessage("INFO: MyFrame::~MyFrame ", "End", TNS_LIFECYCLE);
+}
+
+static wxRect Desktop()
+{
+    wxRect desktop;
+    for (unsigned i = 0; i < wxDisplay::GetCount(); ++i)
+        desktop.Union(wxDisplay(i).GetGeometry());
+    return desktop;
+}
+
+// Where the last run left the window.
+void MyFrame::Place()
+{
+    wxConfigBase *config = wxConfigBase::Get();
+    wxPoint place(int(config->ReadLong("/MainWindow/x", DEFAULT_PLACE)),
+                  int(config->ReadLong("/MainWindow/y", DEFAULT_PLACE)));
+    wxSize size(int(config->ReadLong("/MainWindow/w", FRAME_MIN_WIDTH)),
+                int(config->ReadLong("/MainWindow/h", FRAME_MIN_HEIGHT)));
+    wxSize smallest = FromDIP(wxSize(FRAME_MIN_WIDTH, FRAME_MIN_HEIGHT));
+    wxRect desktop = Desktop();
+    place = FromDIP(place);
+    size = FromDIP(size);
+    FrameGeometry fit =
+        Frame_FitGeometry({place.x, place.y, size.x, size.y}, {smallest.x, smallest.y},
+                          {desktop.GetRight() + 1, desktop.GetBottom() + 1});
+    SetMinSize(FromDIP(wxSize(SMALLEST_WINDOW, SMALLEST_WINDOW)));
+    m_place = wxRect(fit.x, fit.y, fit.width, fit.height);
+    SetSize(m_place);
+}
+
+bool MyFrame::Show(bool show)
+{
+    m_shownAt = Sys_Milliseconds();
+    return wxFrame::Show(show);
+}
+
+bool MyFrame::IsNew() const
+{
+    return !IsShown() || Sys_Milliseconds() - m_shownAt < PLACING_TIME;
+}
+
+// Some window managers choose a place of their own for a new window, and none tells the size of
+// the borders before. So it is put where it belongs again, at once, before the user has seen it.
+void MyFrame::Correct()
+{
+    if (!IsShown() || !IsNew() || m_corrections == 0 || GetRect() == m_place)
+        return;
+    --m_corrections;
+    SetSize(m_place);
+}
+
+void MyFrame::OnMove(wxMoveEvent &event)
+{
+    CallAfter(&MyFrame::Correct);
+    event.Skip();
+}
+
+void MyFrame::OnSize(wxSizeEvent &event)
+{
+    if (m_panel)
+        m_panel->HoldSash(IsNew());
+    CallAfter(&MyFrame::Correct);
+    event.Skip();
+}
+
+void MyFrame::SaveGeometry()
+{
+    wxConfigBase *config = wxConfigBase::Get(false);
+    if (!config || IsIconized())
+        return;
+    if (IsMaximized()) {
+        config->Write("/MainWindow/Max", 1);
+        return;
+    }
+    wxPoint place = ToDIP(GetPosition());
+    wxSize size = ToDIP(GetSize());
+    config->Write("/MainWindow/x", place.x);
+    config->Write("/MainWindow/y", place.y);
+    config->Write("/MainWindow/w", size.x);
+    config->Write("/MainWindow/h", size.y);
+    config->Write("/MainWindow/Max", 0);
+}
+
+// --- Tools ---
+
+static int ToolIconSize()
+{
+    char *setting = TNSValue("Common", "TOOLSIZE");
+    int size = Frame_ToolIconSize(setting);
+    if (size != TOOL_ICON_SIZE)
+        TNSMessage("INFO: Cartulo toolbar size: ", setting, TNS_LIFECYCLE);
+    free(setting);
+    return size;
+}
+
+void MyFrame::AddTool(int id, const char *label, const char *icon, const char *tip)
+{
+    wxToolBar *bar = GetToolBar();
+    bar->AddTool(id, label, Icon_Load(icon, bar->GetToolBitmapSize().x), tip);
+}
+
 void MyFrame::CreateTools()
 {
     wxToolBar *bar = CreateToolBar();
-    bar->SetToolBitmapSize(wxSize(ICON_SIZE, ICON_SIZE));
+    int size = ToolIconSize();
+    bar->SetToolBitmapSize(wxSize(size, size));
     bar->SetMargins(TOOL_MARGIN, TOOL_MARGIN);
-    bar->AddTool(ID_SAVE, "Save", Icon_Load("document-save", ICON_SIZE, wxART_FILE_SAVE),
-                 "Save All BIB files.");
-    bar->EnableTool(ID_SAVE, false);
+    AddTool(ID_SAVE, "Save", "document-save", "Save All BIB files.");
+    AddTool(ID_STRINGS, "Strings", "script-edit", "Edit/Insert Strings [Abbreviations] (Alt+S)");
+    AddTool(ID_PREAMBLE, "Preambles", "accessories-text-editor", "Edit Preamble (Alt+P)");
+    AddTool(ID_CITE, "\\cite", "insert-tex-cite",
+            "Inserts `\\cite' command into the currently edited (La)TeX file (ENTER)");
+    AddTool(ID_NEW_ENTRY, "New", "list-add", "Add new Bibliography entry (Alt+A)");
+    AddTool(ID_RENAME_ENTRY, "Rename", "list-rename", "Rename currently selected entry (Alt+N)");
+    AddTool(ID_REMOVE_ENTRY, "Delete", "list-remove", "Remove currently selected entry (Alt+D)");
+    AddTool(ID_EDIT_ENTRY, "Edit", "list-edit", "Edit currently selected entry (Alt+E,ESC,TAB)");
     if (Messages_HasCounts(m_panel->Files()))
-        bar->AddTool(ID_MESSAGES, "Messages", Icon_Load("Warning", ICON_SIZE, wxART_WARNING),
-                     "Show error/warning messages of loading current BIB-file (Alt+M)");
+        AddTool(ID_MESSAGES, "Messages", "Warning",
+                "Show error/warning messages of loading current BIB-file (Alt+M)");
     m_search = new wxSearchCtrl(bar, ID_SEARCH, "", wxDefaultPosition,
                                 FromDIP(wxSize(SEARCH_WIDTH, -1)), wxTE_PROCESS_ENTER);
     m_search->SetDescriptiveText("Find");
     m_search->SetToolTip("Enter string to find entries");
     bar->AddControl(m_search, "Find");
+    AddTool(ID_HELP, "Help", "help-contents", "Help on using Cartulo");
+    AddTool(ID_ABOUT, "About", "help-about", "About Cartulo");
     bar->Realize();
+    UpdateCiteTool();
+    m_panel->Update_Tools();
 }
+
+void MyFrame::UpdateCiteTool()
+{
+    GetToolBar()->EnableTool(ID_CITE, *m_state->companionService != 0);
+}
+
+// --- Commands ---
 
 void MyFrame::OnQuit(wxCommandEvent &)
 {
     Close(true);
+}
+
+void MyFrame::OnHelp(wxCommandEvent &)
+{
+    char *program = TNSearch("Program", "metahelp");
+    if (!program) {
+        TNSMessage("ERROR: MyFrame::OnHelp", " Can't find <Program>metahelp", TNS_ERROR);
+        ShowStatusError(this, "ERROR: The help program \"metahelp\" can't be found.");
+        return;
+    }
+    TNSMessage("INFO: Running ", ("\"" + std::string(program) + "\" .QRL.Cartulo").c_str(),
+               TNS_LIFECYCLE);
+    const char *arguments[] = {program, ".QRL.Cartulo", nullptr};
+    if (wxExecute(arguments, wxEXEC_ASYNC) == 0)
+        ShowStatusError(this, "ERROR: The help program can't be started.");
+    free(program);
+}
+
+void MyFrame::OnAbout(wxCommandEvent &)
+{
+    AboutDlg dialog(this);
+    dialog.ShowModal();
+}
+
+void MyFrame::OnContextMenu(wxCommandEvent &)
+{
+    if (m_contextMenu)
+        PopupMenu(m_contextMenu);
+}
+
+bool MyFrame::MayTakeCommand() const
+{
+    return m_dialogs->Open() == 0 && m_panel && !m_panel->IsBusy();
+}
+
+void MyFrame::TakeCommand(const char *commandLine)
+{
+    m_panel->ProcessCommand(commandLine, "Pellion");
+    m_panel->ShowOpenFiles();
+    UpdateCiteTool();
 }
 
 void MyFrame::OnFind(wxCommandEvent &)
@@ -95,26 +305,55 @@ static void LogKey(const wxKeyEvent &event)
     TNSMessage("INFO: MyFrame::OnCharHook ", text.utf8_str(), TNS_LIFECYCLE);
 }
 
+// The arrow leads from the search field down into what it found.
+bool MyFrame::LeaveSearch(int key)
+{
+    wxWindow *focus = FindFocus();
+    if (key != WXK_DOWN || !m_panel || !focus || !m_search->IsDescendant(focus))
+        return false;
+    m_panel->FocusList();
+    return true;
+}
+
+// The toolkit's code of the key, or what the keyboard table has instead.
+static int KeyOf(const wxKeyEvent &event)
+{
+    switch (event.GetKeyCode()) {
+    case WXK_NUMPAD_ENTER:
+        return WXK_RETURN;
+    case WXK_F1:
+        return FRAME_KEY_F1;
+    default:
+        return event.GetKeyCode();
+    }
+}
+
 void MyFrame::OnCharHook(wxKeyEvent &event)
 {
     if (GetStatusBar())
         SetStatusText("", 0);
     LogKey(event);
+    if (LeaveSearch(event.GetKeyCode()))
+        return;
     bool alt = event.AltDown(), ctrl = event.ControlDown();
-    int key = Frame_ShortcutKey(event.GetKeyCode(), event.GetUnicodeKey(),
-                                Native_LatinLetter(event), alt, ctrl);
-    const Shortcut *row = Frame_FindShortcut(key, alt, ctrl);
-    if (!row || !m_panel) {
+    int key = KeyOf(event);
+    int id = 0;
+    key = Frame_ShortcutKey(key, event.GetUnicodeKey(), Native_LatinLetter(event), alt, ctrl);
+    const Shortcut *row =
+        m_panel ? Frame_FindShortcut(key, alt, ctrl, m_panel->InEditMode(), &id) : nullptr;
+    if (!row) {
         event.Skip();
         return;
     }
     TNSMessage("INFO: MyFrame::OnCharHook ", row->label, TNS_LIFECYCLE);
-    m_panel->GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, row->id));
+    m_panel->GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, id));
 }
+
+// --- Leaving and closing ---
 
 void MyFrame::OnDeactivation()
 {
-    if (m_panel)
+    if (m_panel && m_autoSave)
         m_panel->SaveAll(true);
 }
 
@@ -125,13 +364,23 @@ void MyFrame::OnClose(wxCloseEvent &event)
             event.Veto();
         return; // a box about a file is open, and the constructor waits for it
     }
-    m_panel->SaveAll(true);
-    if (event.CanVeto() && !MayLoseChanges()) {
+    if (!MayClose(event.CanVeto())) {
         event.Veto();
         return;
     }
     m_panel = nullptr; // nothing is saved any more: the user may just have given the changes up
     Destroy();
+}
+
+// Saves; false when the user wants to stay.
+bool MyFrame::MayClose(bool mayAsk)
+{
+    bool quiet = m_autoSave || !mayAsk;
+    int saved = m_panel->SaveAll(quiet);
+    if (saved < 0)
+        return false;
+    bool dropped = !quiet && saved == 0 && !m_panel->Files()->saveErrors; // answered with No
+    return !mayAsk || dropped || MayLoseChanges();
 }
 
 // Asks when files could not be saved.

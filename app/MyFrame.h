@@ -2,11 +2,16 @@
 // Commands are carried out by the panel; the frame hands them on.
 #pragma once
 
+#include <memory>
+
 #include <wx/frame.h>
 
 #include "app/CommandLine.h"
+#include "app/FrameRules.h"
 
 class Cartulo;
+class DialogCount;
+class wxMenu;
 class wxSearchCtrl;
 
 class MyFrame : public wxFrame
@@ -14,23 +19,56 @@ class MyFrame : public wxFrame
 public:
     // Loads the files that the command line names. `state` outlives the frame.
     MyFrame(const wxString &title, const char *commandLine, CommandState *state);
+    ~MyFrame() override;
+
+    bool Show(bool show = true) override;
+    bool IsNew() const; // true until the window manager has had the time to place the window
 
     Cartulo *Panel() const { return m_panel; } // null once the window is closed
 
-    void OnDeactivation(); // the program lost the focus to another: saves all files
+    // Auto-save mode, on from the start: closing and leaving the window save all files. With it
+    // off, closing asks and leaving does nothing.
+    void SetAutoSave(bool on) { m_autoSave = on; }
+    bool AutoSave() const { return m_autoSave; }
+
+    void OnDeactivation(); // the program lost the focus to another
+
+    // Command lines of other programs: only while nothing is being asked, loaded or saved. The
+    // messages window and the About box may be open.
+    bool MayTakeCommand() const;
+    void TakeCommand(const char *commandLine);
 
 private:
+    void Place();
+    void SaveGeometry();
     void CreateTools();
+    void AddTool(int id, const char *label, const char *icon, const char *tip);
+    void UpdateCiteTool();
     void OnQuit(wxCommandEvent &event);
+    void OnHelp(wxCommandEvent &event);
+    void OnAbout(wxCommandEvent &event);
+    void OnContextMenu(wxCommandEvent &event);
     void OnFind(wxCommandEvent &event);
     void OnCommand(wxCommandEvent &event);
     void OnSearch(wxCommandEvent &event);
     void OnCharHook(wxKeyEvent &event);
+    bool LeaveSearch(int key);
+    void Correct();
+    void OnMove(wxMoveEvent &event);
+    void OnSize(wxSizeEvent &event);
     void OnClose(wxCloseEvent &event);
+    bool MayClose(bool mayAsk);
     bool MayLoseChanges();
 
+    CommandState *m_state;
+    std::unique_ptr<DialogCount> m_dialogs;
     Cartulo *m_panel = nullptr;       // child window; null until it is made and once this is closed
     wxSearchCtrl *m_search = nullptr; // child of the tool bar
+    wxMenu *m_contextMenu = nullptr;  // nobody fills it yet
+    bool m_autoSave = true;
+    wxRect m_place;        // where the window shall open
+    int m_corrections = 2; // tries that are left to put it there
+    int32_t m_shownAt = 0; // Sys_Milliseconds
 
     wxDECLARE_EVENT_TABLE();
 };

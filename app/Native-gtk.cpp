@@ -2,8 +2,11 @@
 
 #include <cstring>
 
+#include <X11/Xlib.h>
 #include <gdk/gdkx.h>
 #include <gtk/gtk.h>
+
+#include "app/Companion.h"
 
 long Native_WindowHandle(wxTopLevelWindow *window)
 {
@@ -11,6 +14,36 @@ long Native_WindowHandle(wxTopLevelWindow *window)
     gtk_widget_realize(widget);
     GdkWindow *inner = gtk_widget_get_window(widget);
     return inner && GDK_IS_X11_WINDOW(inner) ? long(GDK_WINDOW_XID(inner)) : 0;
+}
+
+// A message to the window manager, from a program that acts for the user.
+static void AskForActivation(Display *screen, Window root, Window window)
+{
+    enum { FROM_A_PAGER = 2 };
+    XEvent event = {};
+    event.xclient.type = ClientMessage;
+    event.xclient.window = window;
+    event.xclient.message_type = XInternAtom(screen, "_NET_ACTIVE_WINDOW", False);
+    event.xclient.format = 32;
+    event.xclient.data.l[0] = FROM_A_PAGER;
+    event.xclient.data.l[1] = gtk_get_current_event_time();
+    XSendEvent(screen, root, False, SubstructureRedirectMask | SubstructureNotifyMask, &event);
+}
+
+void Native_BringForward(long handle)
+{
+    GdkDisplay *display = gdk_display_get_default();
+    int failed = 1;
+    if (handle != 0 && display && GDK_IS_X11_DISPLAY(display)) {
+        Display *screen = GDK_DISPLAY_XDISPLAY(display);
+        XWindowAttributes attributes;
+        gdk_x11_display_error_trap_push(display); // the window may be gone
+        if (XGetWindowAttributes(screen, Window(handle), &attributes))
+            AskForActivation(screen, attributes.root, Window(handle));
+        failed = gdk_x11_display_error_trap_pop(display);
+    }
+    if (failed)
+        TNSMessage("WARNING: Native_BringForward ", "there is no such window", TNS_WARNING);
 }
 
 int Native_LatinLetter(const wxKeyEvent &event)

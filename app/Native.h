@@ -7,6 +7,10 @@
 // The handle by which other programs know the window; 0 when the window system has none.
 long Native_WindowHandle(wxTopLevelWindow *window);
 
+// Brings a window of this or another program to the front, from the task bar too, and gives it the
+// keyboard. Only asks: the window manager decides. Without such a window, a log line.
+void Native_BringForward(long handle);
+
 // The Latin letter, in upper case, that is printed on the key, whatever the keyboard layout makes
 // of it; 0 for other keys.
 int Native_LatinLetter(const wxKeyEvent &event);

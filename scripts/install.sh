@@ -2,7 +2,7 @@
 # Installs the Debian packages that are missing: install.sh build [screen] [test]
 set -eu
 
-build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libbtparse-dev
+build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libx11-dev libbtparse-dev
        libgtest-dev libgmock-dev libbenchmark-dev cmark"
 # A private screen with a window manager, and pictures of it.
 screen="xvfb openbox x11-utils dbus-daemon xdotool imagemagick fonts-dejavu-core adwaita-icon-theme"

@@ -5,10 +5,14 @@
 #include <vector>
 
 #include <wx/button.h>
+#include <wx/choice.h>
+#include <wx/combobox.h>
+#include <wx/config.h>
 #include <wx/filedlg.h>
 #include <wx/frame.h>
 #include <wx/msgdlg.h>
 #include <wx/panel.h>
+#include <wx/settings.h>
 #include <wx/sizer.h>
 #include <wx/srchctrl.h>
 #include <wx/stattext.h>
@@ -16,33 +20,68 @@
 #include <wx/toolbar.h>
 
 #include "app/Companion.h"
+#include "app/FrameRules.h"
+#include "app/Icons.h"
 #include "app/Ids.h"
+#include "app/Ipc.h"
 #include "app/Log.h"
+#include "app/Native.h"
 #include "encoding/Encoding.h"
 #include "ui/DisplayText.h"
 #include "ui/Messages.h"
 #include "ui/QListBox.h"
+#include "ui/Schema.h"
 #include "ui/Theme.h"
 
-enum { SASH_POSITION = 300, SMALLEST_PANE = 20, COLUMN_GAP = 8, PANE_BORDER = 8 };
-static const double LIST_SHARE = 0.35; // of what the window grows or shrinks
+enum { SASH_POSITION = 300, SMALLEST_PANE = 20, COLUMN_GAP = 8, PANE_BORDER = 8, HELP_HEIGHT = 40 };
+enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window
+static const char SashKey[] = "/MainWindow/Splitter"; // in the toolkit's configuration
+static const double LIST_SHARE = 0.35;                // of what the window grows or shrinks
 static const Colour HeadingColour = {0, 0, 100};
 
+// Every command comes from a button or as a tool, key or menu.
+#define ON_COMMAND(id, handler) EVT_BUTTON(id, handler) EVT_MENU(id, handler)
+
 wxBEGIN_EVENT_TABLE(Cartulo, wxSplitterWindow)
-    EVT_BUTTON(ID_OPEN, Cartulo::OnOpen)
-    EVT_MENU(ID_OPEN, Cartulo::OnOpen)
-    EVT_BUTTON(ID_SAVE, Cartulo::OnSave)
-    EVT_MENU(ID_SAVE, Cartulo::OnSave)
-    EVT_BUTTON(ID_MESSAGES, Cartulo::OnShowMessages)
-    EVT_MENU(ID_MESSAGES, Cartulo::OnShowMessages)
+    ON_COMMAND(ID_OPEN, Cartulo::OnOpen)
+    ON_COMMAND(ID_SAVE, Cartulo::OnSave)
+    ON_COMMAND(ID_MESSAGES, Cartulo::OnShowMessages)
+    ON_COMMAND(ID_CITE, Cartulo::OnInsertCite)
+    ON_COMMAND(ID_STRINGS, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_PREAMBLE, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_NEW_ENTRY, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_REMOVE_ENTRY, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_RENAME_ENTRY, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_EDIT_ENTRY, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_COMMIT_ENTRY, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_NEW_FIELD, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_RENAME_FIELD, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_REMOVE_FIELD, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_EDIT_FIELD, Cartulo::OnUnavailable)
     EVT_TEXT(ID_SEARCH, Cartulo::OnSearch)
     EVT_SEARCH(ID_SEARCH, Cartulo::OnSearch)
     EVT_LISTBOX(ID_INDEX, Cartulo::OnIndexChanged)
     EVT_LISTBOX_DCLICK(ID_INDEX, Cartulo::OnIndexActivate)
     EVT_SPLITTER_SASH_POS_CHANGED(ID_SPLITTER, Cartulo::OnSashMove)
+    EVT_PAINT(Cartulo::OnPaint)
 wxEND_EVENT_TABLE()
 
 // --- Construction ---
+
+static wxWindow *OpenButton(wxWindow *parent)
+{
+    wxButton *button = new wxButton(parent, ID_OPEN, "Open");
+    button->SetBitmap(Icon_Load("document-open", TOOL_ICON_SIZE));
+    button->SetToolTip("Click to open BIB-file.");
+    return button;
+}
+
+static wxWindow *AddButton(wxWindow *parent)
+{
+    wxWindow *button = new xBitmapButton(parent, ID_NEW_ENTRY, "&Add", "list-add");
+    button->SetToolTip("Add new Bibliography entry (Alt+A)");
+    return button;
+}
 
 Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     : wxSplitterWindow(parent, ID_SPLITTER, wxDefaultPosition, parent->GetClientSize(),
@@ -51,25 +90,43 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
 {
     m_set.box = ShowBox;
     m_set.boxOwner = this;
-    Bib_Initialize();
+    ReadSchema();
     AppLog("IFNO: Cartulo::Cartulo ", "Parse_Command_Line");
     ProcessCommand(commandLine, "OnInit");
     AppLog("More ...");
+    m_sashPosition = int(wxConfigBase::Get()->ReadLong(SashKey, 0));
     SetMinimumPaneSize(FromDIP(SMALLEST_PANE));
-    SetSashGravity(LIST_SHARE);
     m_list = new QListBox(this, this, ID_INDEX, wxDefaultPosition, wxDefaultSize, wxBORDER_STATIC);
+    m_list->Update_Index(nullptr, m_search.c_str());
     CreateEntryPane();
-    CreateOpenPane();
+    m_openPane =
+        CreateBlankPane("To open TeX Bibliography file (BIB) click the button:", OpenButton);
+    m_newPane = CreateBlankPane("To add new enrty click the button:", AddButton);
     Arrange();
-    RefreshList(nullptr);
+    ClearEntry();
+    if (m_list->Item(0))
+        ShowRow("OnIndexChanged");
 }
 
 Cartulo::~Cartulo()
 {
     TNSMessage("INFO: Cartulo::~Cartulo ", "Begin", TNS_LIFECYCLE);
+    KeepSashPosition();
+    wxConfigBase *config = wxConfigBase::Get(false);
+    if (config && m_sashPosition > 0)
+        config->Write(SashKey, m_sashPosition);
     m_list->Drop_Index();
     FileSet_Free(&m_set);
     TNSMessage("INFO: Cartulo::~Cartulo ", "End", TNS_LIFECYCLE);
+}
+
+// The types of the file come before those that BIB files bring along.
+void Cartulo::ReadSchema()
+{
+    m_ini = Schema_FindIni();
+    m_name = Schema_ApplicationName(m_ini.c_str());
+    Bib_Initialize();
+    Schema_RegisterTypes(m_ini.c_str());
 }
 
 wxStaticText *Cartulo::CreateHeading(wxWindow *parent, const wxString &text)
@@ -82,53 +139,179 @@ wxStaticText *Cartulo::CreateHeading(wxWindow *parent, const wxString &text)
     return heading;
 }
 
+// File, type, and the rows of the fields.
+wxSizer *Cartulo::CreateFieldGrid()
+{
+    wxFlexGridSizer *grid = new wxFlexGridSizer(3, wxSize(FromDIP(COLUMN_GAP), 0));
+    grid->AddGrowableCol(1);
+    wxSizerFlags labelPlace = wxSizerFlags().CentreVertical();
+    grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "BIB File:"), labelPlace);
+    m_fileName = new wxStaticText(m_entryPane, wxID_ANY, "file-name.bib", wxDefaultPosition,
+                                  wxDefaultSize, wxST_ELLIPSIZE_START | wxST_NO_AUTORESIZE);
+    m_fileName->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
+    grid->Add(m_fileName, wxSizerFlags().Expand().Border(wxTOP | wxBOTTOM, FromDIP(4)));
+    grid->AddSpacer(0);
+    grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "Entry Type:"), labelPlace);
+    m_type = new wxChoice(m_entryPane, ID_TYPE);
+    m_type->Disable();
+    grid->Add(m_type);
+    grid->AddSpacer(0);
+    for (int i = 0; i < ROW_COUNT; ++i) {
+        FieldRow &row = m_rows[i];
+        row.label = new wxStaticText(m_entryPane, wxID_ANY, "Field:");
+        row.value = new wxTextCtrl(m_entryPane, wxID_ANY, "FieldValue");
+        row.value->SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
+        row.value->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
+        row.remove = new xBitmapButton(m_entryPane, ID_REMOVE_ROW + i, "&Delete", "list-remove");
+        row.remove->SetToolTip("Delete the field");
+        grid->Add(row.label, labelPlace);
+        grid->Add(row.value, wxSizerFlags().Expand());
+        grid->Add(row.remove, labelPlace);
+    }
+    return grid;
+}
+
+wxSizer *Cartulo::CreateNewFieldRow()
+{
+    m_newFieldLabel = new wxStaticText(m_entryPane, wxID_ANY, "Add Field:");
+    m_newFieldKey = new wxComboBox(m_entryPane, ID_NEW_FIELD_KEY);
+    m_newField = new xBitmapButton(m_entryPane, ID_NEW_FIELD, "&Add", "list-add");
+    m_newField->SetToolTip("Add new fields to the Entry with specified key (Alt+A)");
+    m_missingFields = new wxStaticText(m_entryPane, wxID_ANY, "(no comment)");
+    m_done = new wxButton(m_entryPane, ID_COMMIT_ENTRY, "Done");
+    m_done->SetToolTip("Finish editing the entry.");
+    wxBoxSizer *row = new wxBoxSizer(wxHORIZONTAL);
+    wxSizerFlags place = wxSizerFlags().CentreVertical().Border(wxRIGHT, FromDIP(COLUMN_GAP));
+    for (wxWindow *control : std::initializer_list<wxWindow *>{m_newFieldLabel, m_newFieldKey,
+                                                               m_newField, m_missingFields}) {
+        row->Add(control, place);
+        control->Hide(); // until an entry is edited
+    }
+    row->AddStretchSpacer();
+    row->Add(m_done);
+    m_done->Hide();
+    return row;
+}
+
 void Cartulo::CreateEntryPane()
 {
     m_entryPane = new wxScrolledWindow(this, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                                        wxBORDER_STATIC | wxTAB_TRAVERSAL | wxVSCROLL);
-    wxFlexGridSizer *grid = new wxFlexGridSizer(2, wxSize(FromDIP(COLUMN_GAP), 0));
-    grid->AddGrowableCol(1);
-    wxSizerFlags labelPlace = wxSizerFlags().CentreVertical();
-    wxSizerFlags textPlace = wxSizerFlags().Expand().Border(wxTOP | wxBOTTOM, FromDIP(4));
-    grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "BIB File:"), labelPlace);
-    m_fileName = new wxStaticText(m_entryPane, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
-                                  wxST_ELLIPSIZE_START | wxST_NO_AUTORESIZE);
-    grid->Add(m_fileName, textPlace);
-    grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "Entry Type:"), labelPlace);
-    m_typeName = new wxStaticText(m_entryPane, wxID_ANY, "");
-    grid->Add(m_typeName, textPlace);
-    for (FieldRow &row : m_rows) {
-        row.label = new wxStaticText(m_entryPane, wxID_ANY, "Field:");
-        row.value = new wxTextCtrl(m_entryPane, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
-                                   wxTE_READONLY);
-        grid->Add(row.label, labelPlace);
-        grid->Add(row.value, wxSizerFlags().Expand());
-    }
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
+    wxSizerFlags place = wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER));
     column->Add(CreateHeading(m_entryPane, "Records of currently selected bibliography entry"),
-                wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
-    column->Add(grid, wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
+                place);
+    column->Add(CreateFieldGrid(), place);
     m_moreFields = new wxStaticText(m_entryPane, wxID_ANY, "");
-    column->Add(m_moreFields, wxSizerFlags().Border(wxALL, FromDIP(PANE_BORDER)));
+    column->Add(m_moreFields, place);
+    column->Add(CreateNewFieldRow(), place);
+    m_help = new wxTextCtrl(m_entryPane, wxID_ANY, "Ctrl+F1 to help", wxDefaultPosition,
+                            wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY | wxTE_NO_VSCROLL);
+    m_help->SetMinSize(FromDIP(wxSize(-1, HELP_HEIGHT)));
+    column->Add(m_help, wxSizerFlags(place).Proportion(1));
     m_entryPane->SetSizer(column);
     m_entryPane->SetScrollRate(0, FromDIP(16));
     m_entryPane->Hide();
 }
 
-void Cartulo::CreateOpenPane()
+// A pane with a text above a button, in the middle.
+wxPanel *Cartulo::CreateBlankPane(const wxString &text, wxWindow *(*createButton)(wxWindow *parent))
 {
-    m_openPane = new wxPanel(this, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                             wxBORDER_NONE | wxTAB_TRAVERSAL);
-    wxButton *button = new wxButton(m_openPane, ID_OPEN, "Open");
-    button->SetToolTip("Click to open BIB-file.");
+    wxPanel *pane = new wxPanel(this, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+                                wxBORDER_NONE | wxTAB_TRAVERSAL);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
     column->AddStretchSpacer();
-    column->Add(CreateHeading(m_openPane, "To open TeX Bibliography file (BIB) click the button:"),
+    column->Add(CreateHeading(pane, text),
                 wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
-    column->Add(button, wxSizerFlags().Centre().Border(wxALL, FromDIP(PANE_BORDER)));
+    column->Add(createButton(pane), wxSizerFlags().Centre().Border(wxALL, FromDIP(PANE_BORDER)));
     column->AddStretchSpacer();
-    m_openPane->SetSizer(column);
+    pane->SetSizer(column);
+    pane->Hide();
+    return pane;
+}
+
+// --- Panes ---
+
+wxWindow *Cartulo::PaneFor(int pane) const
+{
+    switch (pane) {
+    case PANE_OPEN:
+        return m_openPane;
+    case PANE_NEW:
+        return m_newPane;
+    default:
+        return m_entryPane;
+    }
+}
+
+// The panes that fit what is open.
+void Cartulo::Arrange()
+{
+    int pane = Panel_Pane(m_set.count, int(m_list->GetItemCount()));
+    if (pane == PANE_OPEN)
+        ShowAlone(m_openPane);
+    else if (IsSplit())
+        ReplacePane(PaneFor(pane));
+    else
+        Split(PaneFor(pane));
+    Layout();
+}
+
+void Cartulo::RefreshPane()
+{
+    if (IsSplit() && m_set.count > 0)
+        ReplacePane(PaneFor(Panel_Pane(m_set.count, int(m_list->GetItemCount()))));
+}
+
+void Cartulo::ShowAlone(wxWindow *pane)
+{
+    KeepSashPosition();
+    if (IsSplit())
+        Unsplit();
+    m_list->Hide();
+    m_entryPane->Hide();
+    m_newPane->Hide();
+    pane->Show();
+    Initialize(pane);
+    pane->SetFocus();
+}
+
+void Cartulo::Split(wxWindow *pane)
+{
+    m_list->Show();
+    m_list->SetFocus(); // before the button that has it is hidden
     m_openPane->Hide();
+    pane->Show();
+    SplitVertically(m_list, pane, FromDIP(SashPosition()));
+}
+
+void Cartulo::ReplacePane(wxWindow *pane)
+{
+    wxWindow *old = GetWindow2();
+    if (old == pane)
+        return;
+    wxWindow *focus = FindFocus();
+    if (focus && old->IsDescendant(focus))
+        m_list->SetFocus(); // a hidden window must not keep the focus: keys would be lost
+    ReplaceWindow(old, pane);
+    old->Hide();
+    pane->Show();
+}
+
+void Cartulo::HoldSash(bool hold)
+{
+    SetSashGravity(hold ? 0 : LIST_SHARE);
+}
+
+int Cartulo::SashPosition() const
+{
+    return m_sashPosition > 0 ? m_sashPosition : SASH_POSITION;
+}
+
+void Cartulo::KeepSashPosition()
+{
+    if (IsSplit())
+        m_sashPosition = ToDIP(GetSashPosition());
 }
 
 // --- Files ---
@@ -166,9 +349,8 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *)
     CommandResult result = Command_Process(&m_set, m_state, commandLine);
     m_busy = false;
     if (m_list) {
-        if (result.changes != 0)
-            Arrange();
-        RefreshList(IsOpen(&m_set, file, path) ? entry : nullptr);
+        m_list->Update_Index(IsOpen(&m_set, file, path) ? entry : nullptr, m_search.c_str());
+        Arrange();
     }
     if (result.errors != 0) {
         TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
@@ -177,32 +359,13 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *)
     return 0;
 }
 
-// Shows the rows of what is open now, and the entry `select` or the first.
-void Cartulo::RefreshList(BibEntry *select)
+void Cartulo::ShowOpenFiles()
 {
-    m_list->Update_Index(select, m_search.c_str());
+    Arrange();
     Update_Tools();
-    if (m_list->GetItemCount() > 0)
-        ShowRow("OnIndexChanged");
-    else
-        ClearEntry();
-}
-
-// The panes that fit the number of files.
-void Cartulo::Arrange()
-{
-    if (m_set.count > 0 && !IsSplit()) {
-        m_list->SetFocus(); // before the button that has it is hidden
-        m_openPane->Hide();
-        SplitVertically(m_list, m_entryPane, FromDIP(SASH_POSITION));
-    } else if (m_set.count == 0) {
-        Unsplit(m_entryPane);
-        m_list->Hide();
-        m_openPane->Show();
-        Initialize(m_openPane);
-        m_openPane->SetFocus();
-    }
-    Layout();
+    ClearEntry();
+    ShowRow("OnIndexChanged");
+    ShowStatus(this, CountText());
 }
 
 void Cartulo::OnOpen(wxCommandEvent &)
@@ -222,7 +385,7 @@ void Cartulo::OpenFile(const std::string &path)
         return;
     }
     ProcessCommand(commandLine.c_str(), "OnOpen");
-    ShowStatus(this, CountText());
+    ShowOpenFiles();
 }
 
 wxString Cartulo::CountText() const
@@ -234,8 +397,33 @@ wxString Cartulo::CountText() const
 void Cartulo::OnShowMessages(wxCommandEvent &)
 {
     TNSMessage("INFO: Cartulo::OnShowMessages", "", TNS_ACTION);
+    if (m_messages) { // a command line came in while it is open
+        m_messages->Fill(&m_set);
+        return;
+    }
     Cartulo_Messages dialog(wxGetTopLevelParent(this), &m_set);
+    m_messages = &dialog;
     dialog.ShowModal();
+    m_messages = nullptr;
+}
+
+// --- Other programs ---
+
+void Cartulo::OnInsertCite(wxCommandEvent &)
+{
+    TNSMessage("INFO: Cartulo::OnInsertCite", "", TNS_ACTION);
+    if (!m_entry || m_state->companionWindow == 0 || !*m_state->companionService)
+        return;
+    wxString command = "-s (" + StoreText(m_entry->key) + ") ...InsCite";
+    AppLog("Pass* ", command.utf8_str());
+    Native_BringForward(m_state->companionWindow);
+    if (!SendCommand(m_state->companionService, command.utf8_str()))
+        ShowStatusError(this, "ERROR: The editor of the document does not answer.");
+}
+
+void Cartulo::OnUnavailable(wxCommandEvent &)
+{
+    ShowStatusError(this, "This version of Cartulo can't do that yet.");
 }
 
 // --- Saving ---
@@ -246,15 +434,26 @@ static wxToolBar *ToolBarOf(wxWindow *window)
     return frame ? frame->GetToolBar() : nullptr;
 }
 
+static void EnableTool(wxWindow *window, int id, bool enable)
+{
+    if (wxToolBar *bar = ToolBarOf(window))
+        bar->EnableTool(id, enable);
+}
+
 void Cartulo::UpdateSaveTool()
 {
-    if (wxToolBar *bar = ToolBarOf(this))
-        bar->EnableTool(ID_SAVE, FileSet_ModifiedCount(&m_set) != 0);
+    EnableTool(this, ID_SAVE, FileSet_ModifiedCount(&m_set) != 0);
 }
 
 void Cartulo::Update_Tools()
 {
-    TNSMessage("INFO: Cartulo::Update_Tools(): ", "ListMode", TNS_LIFECYCLE);
+    TNSMessage("INFO: Cartulo::Update_Tools(): ", m_editMode ? "EditMode" : "ListMode",
+               TNS_LIFECYCLE);
+    m_list->Enable(!m_editMode);
+    PanelTools tools = Panel_Tools(&m_set, m_file, m_editMode);
+    EnableTool(this, ID_NEW_ENTRY, tools.add);
+    for (int id : {ID_REMOVE_ENTRY, ID_RENAME_ENTRY, ID_EDIT_ENTRY})
+        EnableTool(this, id, tools.change);
     UpdateSaveTool();
 }
 
@@ -328,9 +527,16 @@ void Cartulo::OnSearch(wxCommandEvent &event)
     m_search = Enc_FromUnicode(narrow.data(), text.c_str());
     TNSMessage("INFO: Cartulo::OnSearch ", StoreText(m_search.c_str()).utf8_str(), TNS_ACTION);
     m_list->Update_Index(m_entry, m_search.c_str());
+    RefreshPane();
     bool found = m_list->GetItemCount() > 0 || m_search.empty();
     ShowStatus(this, found ? "" : "No entry holds this text.");
     ShowSelection();
+}
+
+void Cartulo::FocusList()
+{
+    if (m_list->IsShown() && m_list->IsEnabled())
+        m_list->SetFocus();
 }
 
 // The selected entry, or an empty pane.
@@ -368,6 +574,15 @@ void Cartulo::OnIndexActivate(wxCommandEvent &)
     ShowRow("OnIndexActivate");
 }
 
+// Tells how long the start took; the base class paints.
+void Cartulo::OnPaint(wxPaintEvent &event)
+{
+    if (!m_isPainted)
+        TNSMessage("INFO: Cartulo::OnPaint ", "First", TNS_LIFECYCLE);
+    m_isPainted = true;
+    event.Skip();
+}
+
 void Cartulo::OnSashMove(wxSplitterEvent &event)
 {
     wxSize left = GetWindow1()->GetSize(), right = GetWindow2()->GetSize();
@@ -394,6 +609,14 @@ void Cartulo::FillRow(int row, const BibField *field)
         value->SetToolTip("This value is too long to be shown in full.");
 }
 
+// The choice leaves out the fixed types, which no entry has.
+void Cartulo::FillTypes()
+{
+    int known = BibTypeCount - BIB_FIXED_TYPES;
+    for (int i = int(m_type->GetCount()); i < known; ++i)
+        m_type->Append(StoreText(BibTypeTable[BIB_FIXED_TYPES + i]));
+}
+
 void Cartulo::ShowEntry(BibEntry *entry, int file)
 {
     if (!entry)
@@ -404,13 +627,15 @@ void Cartulo::ShowEntry(BibEntry *entry, int file)
     m_entryPane->Freeze();
     m_fileName->SetLabelText(path);
     m_fileName->SetToolTip(path);
-    m_typeName->SetLabelText(StoreText(BibTypeTable[entry->type]));
+    FillTypes();
+    m_type->SetSelection(std::max<int>(entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
     int shown = std::min<int>(entry->fieldCount, ROW_COUNT);
     for (int i = 0; i < shown; ++i)
         FillRow(i, &entry->fields[i]);
     ShowMoreFields(entry->fieldCount - shown);
     ShowRows(shown);
     m_entryPane->Thaw();
+    Update_Tools();
 }
 
 void Cartulo::ClearEntry()
@@ -419,9 +644,10 @@ void Cartulo::ClearEntry()
     m_file = -1;
     m_fileName->SetLabelText("");
     m_fileName->UnsetToolTip();
-    m_typeName->SetLabelText("");
+    m_type->SetSelection(wxNOT_FOUND);
     ShowMoreFields(0);
     ShowRows(0);
+    Update_Tools();
 }
 
 // Nobody shall take an entry with more fields than rows for one with that many fields.
@@ -437,10 +663,12 @@ void Cartulo::ShowMoreFields(int count)
 void Cartulo::ShowRows(int count)
 {
     for (int i = 0; i < ROW_COUNT; ++i) {
-        if (i >= count && m_rows[i].value->HasFocus())
-            m_list->SetFocus(); // a hidden window must not keep the focus: keys would be lost
-        m_rows[i].label->Show(i < count);
-        m_rows[i].value->Show(i < count);
+        FieldRow &row = m_rows[i];
+        row.label->Show(i < count);
+        row.value->Show(i < count);
+        row.value->Enable(m_editMode);
+        row.remove->Show(i < count);
+        row.remove->Enable(m_editMode);
     }
     m_entryPane->FitInside(); // the scroll bar follows the rows
     m_entryPane->Layout();

@@ -9,7 +9,12 @@
 #include "app/CommandLine.h"
 #include "store/BibFileSet.h"
 
+class Cartulo_Messages;
 class QListBox;
+class xBitmapButton;
+class wxButton;
+class wxChoice;
+class wxComboBox;
 class wxStaticText;
 class wxTextCtrl;
 
@@ -22,10 +27,17 @@ public:
 
     const BibFileSet *Files() const { return &m_set; }
     const BibEntry *CurrentEntry() const { return m_entry; } // null for none
+    bool InEditMode() const { return m_editMode; }
+    bool IsBusy() const { return m_busy; } // loading, saving or asking about it
 
-    // Carries out a command line: opens and closes files, shows what is open then. `origin` says
-    // where the line came from; it changes nothing. Returns 0.
+    // Carries out a command line: opens and closes files and rebuilds the list. `origin` says
+    // where the line came from; it changes nothing. Returns 0. Call ShowOpenFiles after it.
     int ProcessCommand(const char *commandLine, const char *origin);
+
+    void ShowOpenFiles(); // the panes, the tools and the entry for what is open now
+
+    void FocusList();         // unless there is none
+    void HoldSash(bool hold); // whether it stays where it is when the window changes its size
 
     void SetModified(int file); // the file of this index has one change more
 
@@ -50,16 +62,27 @@ private:
     struct FieldRow {
         wxStaticText *label;
         wxTextCtrl *value;
+        xBitmapButton *remove;
     };
 
+    void ReadSchema();
     void CreateEntryPane();
-    void CreateOpenPane();
+    wxSizer *CreateFieldGrid();
+    wxSizer *CreateNewFieldRow();
+    wxPanel *CreateBlankPane(const wxString &text, wxWindow *(*createButton)(wxWindow *parent));
     wxStaticText *CreateHeading(wxWindow *parent, const wxString &text);
+    wxWindow *PaneFor(int pane) const;
+    void Split(wxWindow *pane);
     void Arrange();
-    void RefreshList(BibEntry *select);
+    void RefreshPane();
+    void ShowAlone(wxWindow *pane);
+    void ReplacePane(wxWindow *pane);
+    int SashPosition() const;
+    void KeepSashPosition();
     void OpenFile(const std::string &path);
     void ShowSelection();
     void ClearEntry();
+    void FillTypes();
     void FillRow(int row, const BibField *field);
     void ShowMoreFields(int count);
     void ShowRows(int count);
@@ -72,22 +95,38 @@ private:
     void OnOpen(wxCommandEvent &event);
     void OnSave(wxCommandEvent &event);
     void OnShowMessages(wxCommandEvent &event);
+    void OnInsertCite(wxCommandEvent &event);
+    void OnUnavailable(wxCommandEvent &event);
     void OnSashMove(wxSplitterEvent &event);
+    void OnPaint(wxPaintEvent &event);
 
     BibFileSet m_set = {};
     CommandState *m_state;
     BibEntry *m_entry = nullptr; // owned by its file; null whenever that may be freed
     int m_file = -1;             // index of the file that holds m_entry
     std::string m_search;        // store text
-    bool m_busy = false;         // saving or carrying out a command line
+    bool m_isPainted = false;
+    bool m_editMode = false; // else the list is in use
+    bool m_busy = false;     // saving or carrying out a command line
+    std::string m_ini;       // path of the INI file with the entry types
+    std::string m_name;      // of the application, from there
+    int m_sashPosition;      // of the split window, kept while it is not split
 
     QListBox *m_list = nullptr; // child windows, made after the first files are loaded
     wxScrolledWindow *m_entryPane = nullptr;
     wxPanel *m_openPane = nullptr;
+    wxPanel *m_newPane = nullptr;
+    Cartulo_Messages *m_messages = nullptr; // while it is open
     wxStaticText *m_fileName = nullptr;
-    wxStaticText *m_typeName = nullptr;
+    wxChoice *m_type = nullptr;
     FieldRow m_rows[ROW_COUNT] = {};
     wxStaticText *m_moreFields = nullptr; // how many fields found no row
+    wxStaticText *m_newFieldLabel = nullptr;
+    wxComboBox *m_newFieldKey = nullptr;
+    xBitmapButton *m_newField = nullptr;
+    wxStaticText *m_missingFields = nullptr;
+    wxButton *m_done = nullptr;
+    wxTextCtrl *m_help = nullptr;
 
     wxDECLARE_EVENT_TABLE();
 };

@@ -32,24 +32,29 @@ Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
                wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER)
 {
     SetFont(wxFontInfo(10));
-    MessagesVerdict verdict = Messages_Verdict(set);
-    wxStaticText *heading = new wxStaticText(this, wxID_ANY, Messages_Heading(verdict));
-    Theme_SetTextColour(heading, HeadingColour(verdict));
-    wxTextCtrl *text =
-        new wxTextCtrl(this, ID_MESSAGES_TEXT, "There is no messages ...", wxDefaultPosition,
-                       wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY);
-    text->SetMinSize(FromDIP(wxSize(600, 200)));
-    text->ChangeValue(wxString(Messages_Text(set, PathTextWide)));
+    m_heading = new wxStaticText(this, wxID_ANY, "");
+    m_text = new wxTextCtrl(this, ID_MESSAGES_TEXT, "There is no messages ...", wxDefaultPosition,
+                            wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY);
+    m_text->SetMinSize(FromDIP(wxSize(600, 200)));
+    Fill(set);
 
     const int border = FromDIP(12);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
-    column->Add(heading, wxSizerFlags().Border(wxALL, border));
-    column->Add(text, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
+    column->Add(m_heading, wxSizerFlags().Border(wxALL, border));
+    column->Add(m_text, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
     column->Add(CreateStdDialogButtonSizer(wxOK), wxSizerFlags().Expand().Border(wxALL, border));
     SetSizerAndFit(column);
     // The window manager centres the dialog on its parent. It alone knows at the start where that
     // is.
     FindWindow(wxID_OK)->SetFocus();
+}
+
+void Cartulo_Messages::Fill(const BibFileSet *set)
+{
+    MessagesVerdict verdict = Messages_Verdict(set);
+    m_heading->SetLabelText(Messages_Heading(verdict));
+    Theme_SetTextColour(m_heading, HeadingColour(verdict));
+    m_text->ChangeValue(wxString(Messages_Text(set, PathTextWide)));
 }
 
 void Cartulo_Messages::OnOK(wxCommandEvent &event)

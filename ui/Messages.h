@@ -5,14 +5,21 @@
 
 #include "store/BibFileSet.h"
 
+class wxStaticText;
+class wxTextCtrl;
+
 class Cartulo_Messages : public wxDialog
 {
 public:
-    // Reads the set once, here.
     Cartulo_Messages(wxWindow *parent, const BibFileSet *set);
+
+    void Fill(const BibFileSet *set); // reads the set once, here
 
 private:
     void OnOK(wxCommandEvent &event);
+
+    wxStaticText *m_heading; // child windows
+    wxTextCtrl *m_text;
 
     wxDECLARE_EVENT_TABLE();
 };

@@ -6,6 +6,8 @@
 #include <cstring>
 
 #include <wx/app.h>
+#include <wx/choice.h>
+#include <wx/fileconf.h>
 #include <wx/scrolwin.h>
 #include <wx/srchctrl.h>
 #include <wx/stattext.h>
@@ -159,16 +161,36 @@ void HandleQueuedEvents()
 
 // --- The window ---
 
+wxConfigBase *CartuloWindow::Config()
+{
+    wxConfigBase *config = wxConfigBase::Get(false);
+    if (!config) {
+        config = new wxFileConfig("Cartulo", "Quarlo", folder.Path("Cartulo.conf"), "",
+                                  wxCONFIG_USE_LOCAL_FILE);
+        wxConfigBase::Set(config);
+    }
+    return config;
+}
+
 void CartuloWindow::Open(const std::string &commandLine)
 {
+    Config();
     ForgetLog();
     frame = new MyFrame("Quarlo Cartulo", commandLine.c_str(), &state);
     frame->Show();
     ASSERT_TRUE(WaitFor([this] { return frame->IsShownOnScreen() && frame->IsActive(); }));
 }
 
+void CartuloWindow::Close()
+{
+    frame->Close();
+    DeleteClosedWindows();
+    ASSERT_FALSE(frame);
+}
+
 void CartuloWindow::TearDown()
 {
+    delete wxConfigBase::Set(nullptr);
     if (!frame)
         return;
     for (int i = 0; i < Panel()->Files()->count; ++i)
@@ -209,7 +231,7 @@ std::vector<CartuloWindow::Field> CartuloWindow::ShownFields() const
         if (wxStaticText *text = dynamic_cast<wxStaticText *>(child))
             label = text->GetLabelText();
         wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(child);
-        if (value && value->IsShown())
+        if (value && value->IsShown() && !value->IsMultiLine())
             fields.push_back({label, value->GetValue()});
     }
     return fields;
@@ -222,6 +244,8 @@ wxString CartuloWindow::TextAfter(const wxString &label) const
         wxStaticText *text = dynamic_cast<wxStaticText *>(child);
         if (text && found)
             return text->GetLabelText();
+        if (wxChoice *choice = found ? dynamic_cast<wxChoice *>(child) : nullptr)
+            return choice->GetStringSelection();
         found = text && text->GetLabelText() == label;
     }
     ADD_FAILURE() << "no text " << label;
@@ -233,9 +257,14 @@ wxString CartuloWindow::Status() const
     return frame->GetStatusBar()->GetStatusText(0);
 }
 
+bool CartuloWindow::ToolEnabled(int id) const
+{
+    return frame->GetToolBar()->GetToolEnabled(id);
+}
+
 bool CartuloWindow::SaveEnabled() const
 {
-    return frame->GetToolBar()->GetToolEnabled(ID_SAVE);
+    return ToolEnabled(ID_SAVE);
 }
 
 bool CartuloWindow::IsShowing(wxWindowID id) const

@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include <wx/config.h>
 #include <wx/msgdlg.h>
 #include <wx/weakref.h>
 
@@ -101,8 +102,11 @@ protected:
 
     void TearDown() override; // changes that are left are dropped
 
-    // Opens the window with a command line, and waits until it is active.
+    // Opens the window with a command line, and waits until it is active. The configuration is a
+    // file of the test's folder.
     void Open(const std::string &commandLine);
+    void Close(); // as the user does, with the window deleted
+    wxConfigBase *Config();
 
     Cartulo *Panel() const { return frame->Panel(); }
     class QListBox *List() const;
@@ -113,6 +117,7 @@ protected:
     wxString TextAfter(const wxString &label) const; // the static text that follows another one
     wxString Status() const;
     bool SaveEnabled() const;
+    bool ToolEnabled(int id) const;
     bool IsShowing(wxWindowID id) const;
 
     void SearchFor(const wxString &text);

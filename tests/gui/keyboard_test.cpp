@@ -20,12 +20,6 @@ protected:
         ASSERT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
     }
 
-    bool FocusIsInEntryPane() const
-    {
-        wxWindow *focus = wxWindow::FindFocus();
-        return focus && EntryPane()->IsDescendant(focus);
-    }
-
     wxUIActionSimulator keys;
 };
 
@@ -43,37 +37,36 @@ TEST_F(Keyboard, MovesThroughTheListWithTheArrows)
     EXPECT_EQ((Field{"title", "Second"}), ShownFields().at(0));
 }
 
-TEST_F(Keyboard, LeavesTheListWithTab)
-{
-    keys.Char(WXK_TAB);
-    EXPECT_TRUE(WaitFor([this] { return FocusIsInEntryPane(); }));
-}
-
-TEST_F(Keyboard, SearchesWithCtrlFAndGoesBackToTheListWithTab)
+TEST_F(Keyboard, SearchesWithCtrlFAndGoesDownIntoTheList)
 {
     keys.Char('F', wxMOD_CONTROL);
     ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
     keys.Text("second");
     EXPECT_TRUE(WaitFor([this] { return List()->GetItemCount() == 1; }));
-    keys.Char(WXK_TAB);
+    keys.Char(WXK_DOWN);
     EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+    EXPECT_EQ(0, List()->GetSelection());
 }
 
-TEST_F(Keyboard, ShowsTheMessagesFromEveryControl)
+TEST_F(Keyboard, ShowsTheMessagesFromTheSearchField)
 {
-    EntryPane()->SetFocus();
-    ASSERT_TRUE(WaitFor([this] { return FocusIsInEntryPane(); }));
+    Search()->SetFocus();
+    ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
     wxString text;
     wxTEST_DIALOG((keys.Char('M', wxMOD_ALT), WaitFor([&] { return !text.empty(); })),
                   ExpectMessages("There is no any messages related with loading BIB-files", &text));
     EXPECT_FALSE(text.empty());
 }
 
-TEST_F(Keyboard, KeepsWorkingWhenTheRowWithTheFocusIsHidden)
+// The pane goes while a button of it has the focus.
+TEST_F(Keyboard, KeepsWorkingWhenTheOpenPaneGoes)
 {
-    keys.Char(WXK_TAB);
-    ASSERT_TRUE(WaitFor([this] { return FocusIsInEntryPane(); }));
-    Panel()->ProcessCommand(folder.Write("new.bib", "").c_str(), "test");
-    EXPECT_TRUE(ShownFields().empty());
+    frame->TakeCommand("");
+    ASSERT_TRUE(WaitFor([this] { return IsShowing(ID_OPEN); }));
+    Panel()->FindWindow(ID_OPEN)->SetFocus();
+    ASSERT_TRUE(WaitFor([this] { return Panel()->FindWindow(ID_OPEN)->HasFocus(); }));
+    frame->TakeCommand(folder.Path("a.bib").c_str());
     EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+    keys.Text("tw");
+    EXPECT_TRUE(WaitFor([this] { return List()->GetSelection() == 1; }));
 }

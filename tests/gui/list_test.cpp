@@ -186,7 +186,7 @@ TEST_F(ListInWindow, LogsEachKeyInAWholeLine)
 TEST_F(ListInWindow, ReturnsZeroWithoutFilesAndNeverReadsTheOldRows)
 {
     EXPECT_EQ(1, List()->Update_Index(nullptr, ""));
-    Panel()->ProcessCommand("", "test"); // closes all files
+    frame->TakeCommand(""); // closes all files
     EXPECT_EQ(0, List()->Update_Index(nullptr, ""));
     EXPECT_EQ(-1, List()->GetSelection());
     EXPECT_EQ(nullptr, List()->Item(0));
@@ -198,7 +198,7 @@ TEST_F(ListInWindow, ShowsSixteenFieldsAtMost)
     std::string text = "@misc{many";
     for (int i = 10; i < 30; ++i)
         text += ", field" + std::to_string(i) + " = {" + std::to_string(i) + "}";
-    Panel()->ProcessCommand(folder.Write("many.bib", text + "}\n").c_str(), "test");
+    frame->TakeCommand(folder.Write("many.bib", text + "}\n").c_str());
     std::vector<Field> fields = ShownFields();
     ASSERT_EQ(16u, fields.size());
     EXPECT_EQ((Field{"field10", "10"}), fields.front());
@@ -212,8 +212,7 @@ TEST_F(ListInWindow, TellsOfTheFieldsThatItDoesNotShow)
         std::string text = "@misc{many";
         for (int i = 0; i < fields; ++i)
             text += ", f" + std::to_string(i) + " = 1";
-        Panel()->ProcessCommand(folder.Write(std::to_string(fields) + ".bib", text + "}\n").c_str(),
-                                "test");
+        frame->TakeCommand(folder.Write(std::to_string(fields) + ".bib", text + "}\n").c_str());
     };
     auto note = [&] {
         for (wxWindow *child : EntryPane()->GetChildren()) {
@@ -237,7 +236,7 @@ TEST_F(ListInWindow, ShowsTextsInTheSelectedCodePage)
 {
     std::string path =
         folder.Write("o.bib", "@misc{\xFCn, title = {M\xFCnchen \\& 100\x80} # jan}\n");
-    Panel()->ProcessCommand(path.c_str(), "test");
+    frame->TakeCommand(path.c_str());
     EXPECT_EQ((std::vector<wxString>{L"\u00FCn (o)"}), Rows());
     EXPECT_EQ(L"M\u00FCnchen \\& 100\u20AC\u00ABjan\u00BB", ShownFields().at(0).value);
 }
@@ -245,7 +244,7 @@ TEST_F(ListInWindow, ShowsTextsInTheSelectedCodePage)
 TEST_F(ListInWindow, ShowsFileNamesInTheSystemsEncoding)
 {
     std::string path = folder.Write("M\xC3\xBCller.bib", "@misc{a, note = {n}}\n");
-    Panel()->ProcessCommand(("\"" + path + "\"").c_str(), "test");
+    frame->TakeCommand(("\"" + path + "\"").c_str());
     EXPECT_EQ((std::vector<wxString>{L"a (M\u00FCller)"}), Rows());
     EXPECT_TRUE(TextAfter("BIB File:").EndsWith(L"/M\u00FCller.bib"));
 }
@@ -254,10 +253,11 @@ TEST_F(ListInWindow, HintsAtAValueThatIsTooLongForItsControl)
 {
     std::string path =
         folder.Write("long.bib", "@misc{a, note = {" + std::string(70000, 'x') + "}, x = {y}}\n");
-    Panel()->ProcessCommand(path.c_str(), "test");
+    frame->TakeCommand(path.c_str());
     std::vector<wxString> hints;
     for (wxWindow *child : EntryPane()->GetChildren()) {
-        if (child->IsShown() && dynamic_cast<wxTextCtrl *>(child))
+        wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(child);
+        if (value && value->IsShown() && !value->IsMultiLine())
             hints.push_back(child->GetToolTipText());
     }
     EXPECT_EQ((std::vector<wxString>{"This value is too long to be shown in full.", ""}), hints);

@@ -130,19 +130,27 @@ TEST_F(Window, LogsTheEntryThatItShowsFirst)
     EXPECT_EQ((Lines{{std::string(Shown) + "one (a)", TNS_ACTION}}), TakeLog(Shown));
 }
 
-TEST_F(Window, LogsNothingAboutASelectionWhenThereIsNone)
+TEST_F(Window, LogsNothingAboutASelectionWhenItOpensWithoutEntries)
 {
     Open(folder.Write("new.bib", ""));
-    Panel()->ProcessCommand("", "test");
     for (const LogLine &line : TakeLog(""))
         EXPECT_EQ(std::string::npos, line.text.find("OnIndex")) << line.text;
+}
+
+TEST_F(Window, WarnsWhenACommandLineLeavesNothingToSelect)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    ForgetLog();
+    frame->TakeCommand("");
+    EXPECT_EQ((Lines{{"WARNING: Cartulo::OnIndexChanged no selection in index", TNS_WARNING}}),
+              TakeLog("WARNING: Cartulo::OnIndexChanged"));
 }
 
 TEST_F(Window, GoesBackToTheOpenPaneWhenTheLastFileIsClosed)
 {
     Open(folder.Write("a.bib", OneEntry));
     EXPECT_NE(nullptr, Panel()->CurrentEntry());
-    Panel()->ProcessCommand("", "test");
+    frame->TakeCommand("");
     EXPECT_EQ(nullptr, Panel()->CurrentEntry());
     EXPECT_TRUE(IsShowing(ID_OPEN));
     EXPECT_FALSE(IsShowing(ID_INDEX));
@@ -163,7 +171,7 @@ TEST_F(Window, LetsGoOfEntriesOfFilesThatACommandLineDrops)
     std::string a = folder.Write("a.bib", OneEntry);
     std::string b = folder.Write("b.bib", "@misc{two, note = {Second}}\n");
     Open(a);
-    Panel()->ProcessCommand(b.c_str(), "test");
+    frame->TakeCommand(b.c_str());
     EXPECT_EQ((std::vector<wxString>{"two (b)"}), Rows());
     EXPECT_EQ((std::vector<Field>{{"note", "Second"}}), ShownFields());
     ASSERT_NE(nullptr, Panel()->CurrentEntry());
@@ -176,7 +184,7 @@ TEST_F(Window, KeepsTheShownEntryWhenItsFileStaysOpen)
     std::string b = folder.Write("b.bib", "@misc{aaa, note = {Third}}\n");
     Open(a);
     TypeIntoList('t', 1000);
-    Panel()->ProcessCommand((b + " " + a).c_str(), "test");
+    frame->TakeCommand((b + " " + a).c_str());
     EXPECT_EQ(3u, Rows().size());
     EXPECT_EQ((std::vector<Field>{{"note", "Second"}}), ShownFields());
     EXPECT_EQ(a, TextAfter("BIB File:"));
@@ -188,7 +196,7 @@ TEST_F(Window, KeepsTheShownEntryWhenTheSameFilesAreNamedAgain)
     Open(a);
     TypeIntoList('t', 1000);
     const BibEntry *entry = Panel()->CurrentEntry();
-    Panel()->ProcessCommand(a.c_str(), "test");
+    frame->TakeCommand(a.c_str());
     EXPECT_EQ(entry, Panel()->CurrentEntry());
     EXPECT_EQ(1, List()->GetSelection());
     EXPECT_EQ((std::vector<Field>{{"note", "Second"}}), ShownFields());
@@ -537,7 +545,7 @@ TEST_F(Window, NamesARecordThatIsListedTwiceOnce)
 {
     std::string path = folder.Write("a.bib", OneEntry);
     Open(path);
-    Panel()->ProcessCommand((path + " " + path).c_str(), "test");
+    frame->TakeCommand((path + " " + path).c_str());
     ASSERT_EQ(2, Panel()->Files()->count);
     ASSERT_EQ(Panel()->Files()->files[0], Panel()->Files()->files[1]);
     Change(1, "Changed");
@@ -621,7 +629,7 @@ TEST_F(Window, LogsEachKeyInAWholeLine)
         const char *line;
     } keys[] = {{0, "Key=0( ),Mod=1"},
                 {'x', "Key=120(x),Mod=1"},
-                {WXK_TAB, "Key=9( ),Mod=1"},
+                {WXK_BACK, "Key=8( ),Mod=1"},
                 {WXK_DELETE, "Key=127( ),Mod=1"},
                 {0xFC, "Key=252(\xC3\xBC),Mod=1"},
                 {WXK_F2, "Key=341( ),Mod=1"}};
@@ -657,13 +665,14 @@ TEST_F(Window, IsNotSmallerThanItsMinimum)
 {
     Open("");
     EXPECT_EQ(frame->FromDIP(wxSize(512, 512)), frame->GetMinSize());
-    EXPECT_EQ(frame->FromDIP(wxSize(800, 600)), frame->GetSize());
+    EXPECT_TRUE(WaitFor([this] { return frame->GetSize() == frame->FromDIP(wxSize(800, 600)); }));
 }
 
 TEST_F(Window, SharesItsWidthBetweenListAndEntry)
 {
     Open(folder.Write("a.bib", OneEntry));
     EXPECT_EQ(frame->FromDIP(300), Panel()->GetSashPosition());
+    ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
     int width = EntryPane()->GetSize().x;
     frame->SetSize(frame->GetMinSize());
     ASSERT_TRUE(WaitFor([&] { return EntryPane()->GetSize().x != width; }));
