@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # Runs a command on a screen of its own, with a window manager and a message bus of its own, and
 # passes its exit status on: with-display.sh COMMAND [ARGUMENT...]
-# Needs Xvfb, openbox, xprop and dbus-run-session.
+# WINDOW_MANAGER=xfwm4 in the environment takes that one instead of openbox.
+# Needs Xvfb, the window manager, xprop and dbus-daemon.
 set -u
 
 if [ $# -eq 0 ]; then
@@ -9,14 +10,23 @@ if [ $# -eq 0 ]; then
     exit 2
 fi
 
+case ${WINDOW_MANAGER:=openbox} in
+openbox) manage="openbox --sm-disable" ;;
+xfwm4) manage="xfwm4 --compositor=off" ;;
+*)
+    echo "with-display.sh: unknown window manager: $WINDOW_MANAGER" >&2
+    exit 2
+    ;;
+esac
+
 seconds=30 # how long the screen and the window manager may take to come up
 work=$(mktemp -d) || exit 125
-screen= manager= command=
+screen= bus= manager= command=
 
 # Ends what was started here, and nothing else. The command has a process group of its own.
 clean_up() {
     [ -z "$command" ] || kill -- "-$command" 2>/dev/null
-    for process in $command $manager $screen; do
+    for process in $command $manager $bus $screen; do
         kill "$process" 2>/dev/null
         wait "$process" 2>/dev/null
     done
@@ -50,7 +60,20 @@ export DISPLAY=:$number GDK_BACKEND=x11
 export NO_AT_BRIDGE=${NO_AT_BRIDGE-1} # the accessibility bus would only add noise
 unset WAYLAND_DISPLAY
 
-openbox --sm-disable >"$work/manager.log" 2>&1 &
+# Services that the bus starts, and the window manager, leave the user's own settings alone.
+XDG_CONFIG_HOME=$work dbus-daemon --session --nofork --print-address=3 3>"$work/address" \
+    >"$work/bus.log" 2>&1 &
+bus=$!
+end=$((SECONDS + seconds))
+until [ -s "$work/address" ]; do
+    kill -0 "$bus" 2>/dev/null || fail "the message bus ended"
+    [ "$SECONDS" -lt "$end" ] || fail "the message bus did not start"
+    sleep 0.02
+done
+DBUS_SESSION_BUS_ADDRESS=$(cat "$work/address")
+export DBUS_SESSION_BUS_ADDRESS
+
+XDG_CONFIG_HOME=$work $manage >"$work/manager.log" 2>&1 &
 manager=$!
 # A window manager that is ready names its window on the root window.
 end=$((SECONDS + seconds))
@@ -60,7 +83,7 @@ until xprop -root _NET_SUPPORTING_WM_CHECK 2>/dev/null | grep -q 'window id'; do
     sleep 0.05
 done
 
-setsid dbus-run-session -- "$@" &
+setsid "$@" &
 command=$!
 wait "$command"
 status=$?
