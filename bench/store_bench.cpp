@@ -6,14 +6,11 @@
 // the ratios of the medians, and the peak memory of a load against the file's size.
 #include <benchmark/benchmark.h>
 
-#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
-#include <map>
-#include <numeric>
 #include <string>
 #include <vector>
 
@@ -24,6 +21,7 @@
 #include <unistd.h>
 
 #include "bench/Library.h"
+#include "bench/Ratios.h"
 #include "store/BibStore.h"
 #include "ui/EntryIndex.h"
 
@@ -150,49 +148,7 @@ double LoadMemory()
     return static_cast<double>(bytes);
 }
 
-// --- Report ---
-
-class Ratios : public benchmark::ConsoleReporter
-{
-public:
-    std::map<std::string, std::vector<double>> times; // milliseconds by name
-
-    void ReportRuns(const std::vector<Run> &runs) override
-    {
-        for (const Run &run : runs)
-            if (run.run_type == Run::RT_Iteration && !run.error_occurred)
-                times[run.run_name.function_name].push_back(run.GetAdjustedRealTime());
-    }
-
-    bool ReportContext(const Context &) override { return true; }
-
-    void Print() const
-    {
-        printf("%-28s %10s %10s %10s %10s   (ms)\n", "", "minimum", "median", "average", "maximum");
-        for (const auto &[name, list] : times) {
-            auto [least, most] = std::minmax_element(list.begin(), list.end());
-            double sum = std::accumulate(list.begin(), list.end(), 0.0);
-            printf("%-28s %10.2f %10.2f %10.2f %10.2f\n", name.c_str(), *least, Median(name),
-                   sum / static_cast<double>(list.size()), *most);
-        }
-    }
-
-    // A disk now and then takes three times as long; the median does not care.
-    double Median(const std::string &name) const
-    {
-        auto found = times.find(name);
-        if (found == times.end())
-            return 0;
-        std::vector<double> sorted = found->second;
-        std::sort(sorted.begin(), sorted.end());
-        return sorted[sorted.size() / 2];
-    }
-
-    void PrintRatio(const char *what, const char *name, const char *reference) const
-    {
-        printf("%-60s %6.2f\n", what, Median(name) / Median(reference));
-    }
-};
+// --- Run ---
 
 void Register(const char *name, void (*function)(benchmark::State &))
 {
