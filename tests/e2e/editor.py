@@ -66,23 +66,58 @@ def picture_of_files(folder):
     return picture
 
 
+def user_environment(home):
+    """Variables for programs of a user whose files are all below `home`."""
+    environment = dict(os.environ, HOME=home, LC_ALL="C.UTF-8")
+    for name, folder in [("XDG_CONFIG_HOME", "config"), ("XDG_DATA_HOME", "data"),
+                         ("XDG_RUNTIME_DIR", "run"), ("TMPDIR", "tmp")]:
+        environment[name] = os.path.join(home, folder)
+        os.makedirs(environment[name], mode=0o700, exist_ok=True)
+    environment.pop("BIBINPUTS", None)
+    return environment
+
+
+def active_window():
+    return (xdotool("getactivewindow") or [None])[0]
+
+
+def windows_named(title):
+    """The visible windows of all programs with exactly this title."""
+    return xdotool("search", "--onlyvisible", "--name", f"^{re.escape(title)}$")
+
+
+def window_state(window):
+    """What the window manager says: names like _NET_WM_STATE_HIDDEN."""
+    answer = subprocess.run(["xprop", "-id", window, "_NET_WM_STATE"], stdout=subprocess.PIPE,
+                            stderr=subprocess.DEVNULL, text=True, check=False).stdout
+    return re.findall(r"_NET_WM_STATE_\w+", answer)
+
+
+def minimise(window):
+    xdotool("windowminimize", window)
+    poll(lambda: "_NET_WM_STATE_HIDDEN" in window_state(window), "the window is minimised")
+
+
+def ask_manager(*arguments):
+    subprocess.run(["wmctrl", "-i", *arguments], check=True)
+
+
 class Editor:
-    """One running editor. Its folder holds the BIB files, `home` all that is its own."""
+    """One running editor, started in `folder`. Its log and its output lie in the user's home."""
 
     count = 0
 
-    def __init__(self, program, folder, home, *arguments):
+    def __init__(self, command, folder, environment):
         Editor.count += 1
-        own = os.path.join(home, str(Editor.count))
-        os.mkdir(own)
-        self.log_path = os.path.join(own, "log")
-        self.output_path = os.path.join(own, "output")
-        environment = dict(os.environ, HOME=own, XDG_CONFIG_HOME=os.path.join(own, "config"),
-                           CARTULO_LOG="1:" + self.log_path, LC_ALL="C.UTF-8")
+        own = os.path.join(environment["HOME"], str(Editor.count))
+        self.log_path = own + ".log"
+        self.output_path = own + ".output"
+        environment = dict(environment, CARTULO_LOG="1:" + self.log_path)
         with open(self.output_path, "wb") as output:
-            self.process = subprocess.Popen([program, *arguments], cwd=folder, env=environment,
+            self.process = subprocess.Popen(command, cwd=folder, env=environment,
                                             stdin=subprocess.DEVNULL, stdout=output, stderr=output)
         self.frame = None
+        self.shown = None
 
     # --- What can be seen ---
 
@@ -123,6 +158,13 @@ class Editor:
     def wait_for_window(self, title):
         return self.wait(lambda: self.windows(title), f"window {title!r}")[0]
 
+    def place(self):
+        """Where the main window's contents are: left, top, width, height."""
+        text = subprocess.run(["xwininfo", "-id", self.frame], stdout=subprocess.PIPE,
+                              stderr=subprocess.DEVNULL, text=True, check=False).stdout
+        names = "Absolute upper-left X", "Absolute upper-left Y", "Width", "Height"
+        return tuple(int(re.search(rf"{name}: +(-?\d+)", text).group(1)) for name in names)
+
     def selections(self):
         """The rows that were selected, first to last."""
         return re.findall(r"^INFO: Cartulo::OnIndexChanged to (.*)$", self.log(), re.MULTILINE)
@@ -138,11 +180,15 @@ class Editor:
 
     def activate(self, window):
         xdotool("windowactivate", window)
-        self.wait(lambda: xdotool("getactivewindow") == [window], "the window becomes active")
+        self.wait_until_active(window)
+
+    def wait_until_active(self, window=None):
+        self.wait(lambda: active_window() == (window or self.frame), "the window becomes active")
 
     def await_frame(self):
         self.wait_for_log("Cartulo::Frame --- End.")
         self.frame = self.wait_for_window(FRAME)
+        self.shown = time.monotonic()
         return self
 
     def ready(self):
@@ -163,6 +209,10 @@ class Editor:
         self.activate(window)
         xdotool("key", key)
         self.wait(lambda: window not in self.windows(title), f"{title!r} closes")
+
+    def begin(self, key):
+        """Presses a key that opens a dialog."""
+        xdotool("key", key)
 
     def settle(self):
         """Returns when the main window has handled all keys and clicks so far."""
@@ -202,6 +252,29 @@ class Editor:
             if not row:
                 return rows
             rows += row
+
+    def await_place(self):
+        """Waits until the window is the user's: in its first second it goes where it belongs."""
+        poll(lambda: time.monotonic() > self.shown + 1, "a second")
+        self.settle()
+
+    def change(self):
+        """Changes the selected entry; only the program made for this can."""
+        before = self.log().count("Cartulo: Changed: ")
+        xdotool("key", "F12")
+        self.wait_for_log("Cartulo: Changed: ", before + 1)
+
+    def messages(self):
+        """The text of the messages window, which ends here; it comes by way of the search box."""
+        self.activate(self.wait_for_window(MESSAGES))
+        xdotool("key", "Tab", "ctrl+a", "ctrl+c", "Tab")
+        self.answer(MESSAGES)
+        self.activate(self.frame)
+        before = len(self.log())
+        self.press("ctrl+f", "ctrl+v")
+        text = self.log()[before:].partition("INFO: Cartulo::OnSearch ")[2]
+        self.press("ctrl+f", "BackSpace", "Down")
+        return text.partition("QListBox::")[0]
 
     def close(self):
         """Closes the main window by keyboard and returns the exit status."""

@@ -1,72 +1,14 @@
 #!/usr/bin/python3
-"""Tests the built program from outside: editor_test.py PROGRAM [TEST...], on a private screen."""
+"""Tests what the built program does with BIB files: see cases.py for the arguments."""
 
-import glob
+import getpass
 import os
 import shutil
 import subprocess
-import sys
-import tempfile
-import unittest
 
-from editor import LOCK_BOX, MESSAGES, Editor, is_locked, picture_of_files, use_keyboard
-
-SOURCE = os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
-HOSTILE = os.path.join(SOURCE, "tests", "data", "hostile")
-PROGRAM = ""
-
-REFS = b"""@article{alpha, title = {Old Maps}, year = 1999}
-@book{beta, title = {New Maps}}
-@misc{gamma, note = {Nothing}}
-"""
-MORE = b"""@misc{delta, note = {old wine}}
-@misc{zeta, note = {Last}}
-"""
-ALL_ROWS = ["alpha (refs)", "beta (refs)", "delta (more)", "gamma (refs)", "zeta (more)"]
-BROKEN = b"@misc{kept, note = {x}}\n@misc{broken, note = {y} title = {z}}\n"
-
-
-class EditorTest(unittest.TestCase):
-    """Gives each test a folder for BIB files, and closes what it leaves open."""
-
-    def setUp(self):
-        self.work = tempfile.mkdtemp(prefix="cartulo-e2e-")
-        self.addCleanup(shutil.rmtree, self.work)
-        self.folder = os.path.join(self.work, "files")
-        self.home = os.path.join(self.work, "home")
-        os.mkdir(self.folder)
-        os.mkdir(self.home)
-
-    def write(self, name, contents):
-        path = os.path.join(self.folder, name)
-        os.makedirs(os.path.dirname(path), exist_ok=True)
-        with open(path, "wb") as stream:
-            stream.write(contents)
-        os.utime(path, (1e9, 1e9))  # a write would show even within one tick
-        return path
-
-    def start(self, *arguments):
-        editor = Editor(PROGRAM, self.folder, self.home, *arguments)
-        self.addCleanup(editor.kill)
-        return editor
-
-    def open_both(self):
-        self.write("refs.bib", REFS)
-        self.write("more.bib", MORE)
-        return self.start("refs.bib", "more.bib").ready()
-
-    def start_with_messages(self, *arguments):
-        """Starts the editor, which must show its messages unasked, and closes these."""
-        editor = self.start(*arguments)
-        editor.await_frame()
-        editor.answer(MESSAGES)
-        return editor.ready()
-
-    def assert_opens(self, key, row, *arguments):
-        editor = self.start(*arguments).ready()
-        self.assertEqual([row], editor.type(key))
-        self.assertEqual([], editor.windows(MESSAGES))
-        self.assertEqual(0, editor.close())
+import cases
+from cases import ALL_ROWS, BROKEN, HOSTILE, MORE, MORE_ROWS, REFS, SOURCE, EditorTest
+from editor import LOCK_BOX, MESSAGES, is_locked, picture_of_files, use_keyboard
 
 
 class List(EditorTest):
@@ -106,23 +48,23 @@ class List(EditorTest):
         editor.press("ctrl+f")
         self.assertEqual([], editor.type("OLD"))
         self.assertIn("INFO: Cartulo::OnSearch OLD", editor.log())
-        editor.press("Tab")
+        editor.press("Down")
         self.assertEqual(["alpha (refs)", "delta (more)"], editor.rows())
 
         editor.press("alt+f")
         editor.press("BackSpace")
-        editor.press("Tab")
+        editor.press("Down")
         self.assertEqual(ALL_ROWS, editor.rows())
 
     def test_narrowed_to_nothing_takes_keys_and_comes_back(self):
         editor = self.open_both()
         editor.press("ctrl+f")
         editor.type("no such text")
-        editor.press("Tab")
+        editor.press("Down")
         self.assertEqual([], editor.press("Down", "End", "Home", "Return", "z"))
         editor.press("ctrl+f")
         editor.press("BackSpace")
-        editor.press("Tab")
+        editor.press("Down")
         self.assertEqual(ALL_ROWS, editor.rows())
 
     def test_is_empty_without_files(self):
@@ -157,9 +99,10 @@ class Messages(EditorTest):
     def test_show_a_missing_file_by_themselves(self):
         self.write("more.bib", MORE)
         before = picture_of_files(self.folder)
-        editor = self.start_with_messages("missing.bib", "more.bib")
+        editor = self.start("missing.bib", "more.bib").await_frame()
+        self.assertIn("ERROR: The file 'missing.bib' not found", editor.messages())
         self.assertIn("ERROR: Can't locate Bib-file: missing.bib", editor.log())
-        self.assertEqual(["delta (more)", "zeta (more)"], editor.rows())
+        self.assertEqual(MORE_ROWS, editor.rows())
         self.assertEqual(0, editor.close())
         self.assertEqual(before, picture_of_files(self.folder))
 
@@ -172,10 +115,9 @@ class Lock(EditorTest):
         second = self.start("more.bib", "third.bib")
         second.answer(LOCK_BOX)
         second.await_frame()
-        second.answer(MESSAGES)
-        second.ready()
+        self.assertIn("ERROR: File: `more.bib'", second.messages())
         self.assertTrue(is_locked(third))
-        self.assertEqual(["third (third)"], second.type("t"))
+        self.assertIn("third (third)", second.selections())
         self.assertEqual([], second.type("z"))
         self.assertEqual(0, second.close())
 
@@ -207,6 +149,161 @@ class Close(EditorTest):
         self.assertEqual(before, picture_of_files(self.folder))
         for name in before:
             self.assertFalse(is_locked(os.path.join(self.folder, name)))
+
+
+class Save(EditorTest):
+    """REFS holds one letter more after each change."""
+
+    def start_changed(self):
+        self.write_both()
+        editor = self.start_changing("refs.bib", "more.bib").ready()
+        editor.change()
+        self.assertEqual(REFS, self.read("refs.bib"))
+        return editor
+
+    def assert_saved(self, text, name="refs.bib"):
+        self.assertIn(text, self.read(name))
+        copies = [other for other in os.listdir(self.folder) if "Backup" in other]
+        self.assertEqual([name + ".Backup"], [copy.partition("-")[0] for copy in copies])
+        self.assertIn(self.read(copies[0]), (REFS, MORE))
+        self.assertTrue(is_locked(self.path(name)))
+
+    def test_follows_search_selection_and_change(self):
+        self.write_both()
+        editor = self.start_changing("refs.bib", "more.bib").ready()
+        editor.press("ctrl+f")
+        editor.type("old")
+        editor.press("Down")
+        self.assertEqual(["delta (more)"], editor.press("End"))
+        editor.change()
+        self.assertEqual(MORE, self.read("more.bib"))
+        editor.press("alt+b")
+        self.assert_saved(b"old wineX", "more.bib")
+        self.assertEqual(REFS, self.read("refs.bib"))
+        self.assertEqual(0, editor.close())
+        self.assert_opens("d", "delta (more)", "more.bib")
+
+    def test_comes_with_its_tool(self):
+        editor = self.start_changed()
+        editor.click(24, 20)
+        self.assert_saved(b"Old MapsX")
+        editor.change()
+        editor.click(24, 20)
+        self.assert_saved(b"Old MapsXX")
+
+    def test_comes_with_leaving_the_program(self):
+        editor = self.start_changed()
+        self.start_other()
+        editor.wait_for_log("INFO: Cartulo is now+ Disactivated")
+        editor.wait(lambda: b"Old MapsX" in self.read("refs.bib"), "the change is saved")
+        editor.activate(editor.frame)
+        editor.settle()
+        self.assert_saved(b"Old MapsX")
+        self.assertEqual(1, editor.log().count("INFO: Cartulo is now+ Disactivated"))
+        self.assertEqual(1, editor.log().count("INFO: Cartulo is now+ Activated"))
+
+    def test_does_not_come_with_a_window_of_its_own(self):
+        editor = self.start_changed()
+        editor.show_messages("alt+m")
+        editor.answer(MESSAGES)
+        editor.activate(editor.frame)
+        editor.settle()
+        self.assertNotIn("Disactivated", editor.log())
+        self.assertEqual(REFS, self.read("refs.bib"))
+
+    def test_comes_with_closing(self):
+        editor = self.start_changed()
+        self.assertEqual(0, editor.close())
+        self.assertIn(b"Old MapsX", self.read("refs.bib"))
+        self.assertEqual("", editor.output())
+
+
+class Start(EditorTest):
+    def test_and_end_are_logged_in_their_order(self):
+        path = self.write("refs.bib", REFS)
+        editor = self.start("-d" + self.folder + "/", "refs").ready()
+        self.assertEqual(0, editor.close())
+        instance = f"Cartulo-{self.folder}/"
+        log = editor.log()
+        for line in ("Cartulo: Cartulo::OnInit --- Start",
+                     "Cartulo: TNS Control: ",
+                     "Cartulo: TNS Control: ",
+                     "Cartulo: INFO: Selecting Encoding: CP1252",
+                     "Cartulo: Cartulo::OnInit --- Command_Line",
+                     f"INFO: Command_Line - -d{self.folder}/ refs",
+                     f"INFO: Cartulo::Single Quarlo-{instance}-{getpass.getuser()}",
+                     "Cartulo: Cartulo::OnInit --- Names",
+                     "Cartulo: Cartulo::OnInit --- pConfig",
+                     "Cartulo: Cartulo::OnInit --- Frame ...",
+                     "Cartulo: Cartulo::Frame --- Creating Helper ...",
+                     "Cartulo: IFNO: Cartulo::Cartulo Parse_Command_Line",
+                     "Cartulo: Command: refs",
+                     f"Cartulo: Check: {path}",
+                     f"Cartulo: Loading: {path}",
+                     "Cartulo: More ...",
+                     "INFO: Cartulo::OnIndexChanged to alpha (refs)",
+                     "Cartulo: Cartulo::Frame --- Status Bar.",
+                     "Cartulo: Cartulo::Frame --- End.",
+                     f"INFO: DDE server started /tmp/Quarlo-DDE-{instance}",
+                     "INFO: DDE server uses DDE",
+                     "INFO: Cartulo is now+ Disactivated",
+                     "INFO: MyFrame::~MyFrame Begin",
+                     "INFO: MyFrame::~MyFrame End",
+                     "INFO: Cartulo::~Cartulo Begin",
+                     "INFO: Cartulo::~Cartulo End",
+                     "INFO: MyApp:OnExit Begin",
+                     "INFO: DDE server Disconnected client",
+                     "INFO: MyApp:OnExit End"):
+            _, found, log = log.partition(line + "\n")
+            self.assertTrue(found, f"{line!r} is missing or too early\n{editor.log()}")
+
+    def test_needs_no_standard_streams(self):
+        path = self.write("refs.bib", REFS)
+        closing = ["sh", "-c", 'exec "$@" <&- >&- 2>&-', "sh", cases.program]
+        editor = self.start("refs.bib", command=closing).ready()
+        self.assertEqual(ALL_ROWS[:2] + ["gamma (refs)"], editor.rows())
+        self.assertTrue(is_locked(path))
+        self.assertEqual(0, editor.close())
+        self.assertEqual(REFS, self.read("refs.bib"))
+
+
+class Environment(EditorTest):
+    """Files that are not in the base folder."""
+
+    def setUp(self):
+        super().setUp()
+        self.elsewhere = os.path.join(self.work, "texmf", "below")
+        os.makedirs(self.elsewhere)
+        with open(os.path.join(self.elsewhere, "refs.bib"), "wb") as stream:
+            stream.write(REFS)
+        self.programs = os.path.join(self.work, "bin")
+        os.mkdir(self.programs)
+        self.environment["PATH"] = self.programs  # no other TeX
+
+    def test_finds_what_tex_finds(self):
+        script = os.path.join(self.programs, "kpsewhich")
+        with open(script, "w", encoding="utf-8") as stream:
+            stream.write('#!/bin/sh\necho "$#: $@" >>"$HOME/asked"\n'
+                         f'[ "$3" = refs ] && echo "{self.elsewhere}/refs.bib"\n')
+        os.chmod(script, 0o700)
+        editor = self.start("refs", "missing").await_frame()
+        text = editor.messages()
+        self.assertIn("The file 'missing' not found", text)
+        self.assertIn(f"The file: '{self.elsewhere}/refs.bib'", text)
+        self.assertEqual("gamma (refs)", editor.rows()[-1])
+        self.assertEqual(0, editor.close())
+        with open(os.path.join(self.home, "asked"), encoding="utf-8") as stream:
+            self.assertEqual(["3: -format=bib -- refs", "3: -format=bib -- missing"],
+                             stream.read().splitlines())
+
+    def test_finds_files_in_the_folders_of_bibinputs(self):
+        self.environment["BIBINPUTS"] = f"/nowhere:{os.path.dirname(self.elsewhere)}//:"
+        self.assert_opens("g", "gamma (refs)", "refs")
+
+    def test_prefers_the_base_folder(self):
+        self.environment["BIBINPUTS"] = self.elsewhere
+        self.write("refs.bib", MORE)
+        self.assert_opens("z", "zeta (refs)", "refs")
 
 
 class HostileFiles(EditorTest):
@@ -268,7 +365,7 @@ class HostileFiles(EditorTest):
         editor.await_frame()
         editor.answer(MESSAGES)
         editor.ready()
-        self.assertEqual(["delta (more)", "zeta (more)"], editor.rows())
+        self.assertEqual(MORE_ROWS, editor.rows())
         self.assertEqual(0, editor.close())
         self.assertEqual(before, picture_of_files(self.folder))
 
@@ -307,7 +404,7 @@ class CodePage(EditorTest):
 
         editor.press("ctrl+Cyrillic_a")  # the key that is F elsewhere
         editor.type("карты")
-        editor.press("Tab")
+        editor.press("Down")
         self.assertEqual(["жук (rus)", "як (rus)"], editor.rows())
 
     def test_is_the_western_one_by_default(self):
@@ -324,24 +421,23 @@ class WithoutDisplay(EditorTest):
 
     def test_help_and_version_are_answered(self):
         for option, text in [("--help", "Usage: cartulo "), ("--version", "cartulo ")]:
-            done = self.run_without_display(PROGRAM, option)
+            done = self.run_without_display(cases.program, option)
             self.assertEqual((0, ""), (done.returncode, done.stderr))
             self.assertTrue(done.stdout.startswith(text), done.stdout)
 
     def test_the_start_fails_at_once(self):
-        done = self.run_without_display(PROGRAM, "refs.bib")
+        done = self.run_without_display(cases.program, "refs.bib")
         self.assertNotEqual(0, done.returncode)
         self.assertNotEqual("", done.stderr)
 
     def test_run_sh_starts_the_release(self):
         release = os.path.join(SOURCE, "build", "release", "cartulo")
-        if not os.path.exists(release) or not os.path.samefile(PROGRAM, release):
+        if not os.path.exists(release) or not os.path.samefile(cases.program, release):
             self.skipTest("the program is not the one that run.sh starts")
         done = self.run_without_display(os.path.join(SOURCE, "run.sh"), "--version")
-        version = self.run_without_display(PROGRAM, "--version").stdout
+        version = self.run_without_display(cases.program, "--version").stdout
         self.assertEqual((0, version), (done.returncode, done.stdout), done.stderr)
 
 
 if __name__ == "__main__":
-    PROGRAM = os.path.abspath(sys.argv.pop(1))
-    unittest.main(verbosity=2)
+    cases.run()
