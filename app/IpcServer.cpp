@@ -161,6 +161,7 @@ void MyServer::OnClosed(const IpcPeer *peer)
 {
     if (peer->Connection() == m_connection)
         m_connection = nullptr;
+    m_acceptPaused = false; // there is room
     AskForTurn();
 }
 
