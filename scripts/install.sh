@@ -5,7 +5,8 @@ set -eu
 build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libx11-dev libbtparse-dev
        libgtest-dev libgmock-dev libbenchmark-dev cmark"
 # A private screen with a window manager, and pictures of it.
-screen="xvfb openbox x11-utils dbus-daemon xdotool imagemagick fonts-dejavu-core adwaita-icon-theme"
+screen="xvfb openbox xfwm4 x11-utils dbus-daemon xdotool wmctrl imagemagick fonts-dejavu-core
+        adwaita-icon-theme"
 test="locales python3"
 
 missing=
