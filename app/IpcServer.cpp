@@ -15,6 +15,7 @@ enum { PEERS_MAX = 16, COMMANDS_MAX = 64 };
 
 // Milliseconds.
 enum {
+    TICK_NEXT = 1,      // the next command comes after what the user waits for
     TICK_ACCEPT = 20,   // clients wait for room
     TICK_COMMAND = 100, // commands wait for the end of a dialog
     TICK_PEER = 500     // clients are amid something
@@ -227,7 +228,8 @@ void MyServer::QueueCommand(const std::string &text)
         TNSMessage("ERROR: DDE server ", "Too many commands wait, the last is dropped", TNS_ERROR);
 }
 
-// Carrying one out may ask the user, and further turns come while the box is open.
+// Carrying one out may ask the user, and further turns come while the box is open. A turn that asks
+// for the next one gets it at once, before all drawing and input: so the timer brings that.
 void MyServer::RunNextCommand()
 {
     if (m_running || m_commands.empty())
@@ -243,7 +245,8 @@ void MyServer::RunNextCommand()
     m_running = true;
     m_frame->TakeCommand(command.c_str());
     m_running = false;
-    AskForTurn();
+    if (!m_commands.empty())
+        m_timer.StartOnce(TICK_NEXT);
 }
 
 MyServer *StartCommandServer(const char *service, MyFrame *frame)

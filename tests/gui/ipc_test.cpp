@@ -547,11 +547,41 @@ private:
     std::function<void()> m_look;
 };
 
+// Another process that holds the lock of a file.
+class LockHolder
+{
+public:
+    explicit LockHolder(const std::string &file)
+    {
+        char byte;
+        int ends[2];
+        EXPECT_EQ(0, pipe(ends));
+        m_process = fork();
+        if (m_process == 0) {
+            alarm(60);
+            if (Sys_LockFile(file.c_str()) && write(ends[1], "+", 1) == 1)
+                pause();
+            _exit(1);
+        }
+        close(ends[1]);
+        EXPECT_EQ(1, read(ends[0], &byte, 1)) << "it did not get the lock";
+        close(ends[0]);
+    }
+
+    ~LockHolder()
+    {
+        kill(m_process, SIGKILL);
+        waitpid(m_process, nullptr, 0);
+    }
+
+private:
+    pid_t m_process;
+};
+
 TEST_F(CommandServer, RunsOneCommandAtATime)
 {
     std::string locked = folder.Write("locked.bib", "");
-    Process holder({"/usr/bin/flock", locked, "-c", "echo locked; sleep 60"});
-    ASSERT_EQ("locked\n", holder.Output("locked"));
+    LockHolder holder(locked);
     RawClient client(path, Hello);
     ASSERT_EQ(Accepted, client.Hear(1));
     LookWhileAsked hook([&] {
@@ -563,6 +593,35 @@ TEST_F(CommandServer, RunsOneCommandAtATime)
     EXPECT_TRUE(WaitFor([&] { return hook.boxes > 0; }));
     EXPECT_EQ(Commands{"-bsecond"}, Executed(1));
     hook.Unregister();
+}
+
+// Counts the commands that are carried out between two of its ticks.
+class CommandCounter : public wxTimer
+{
+public:
+    CommandCounter() { Start(1); }
+
+    size_t all = 0, most = 0;
+
+private:
+    void Notify() override
+    {
+        size_t count = TakeLog("Cartulo: Command: ").size();
+        all += count;
+        most = std::max(most, count);
+    }
+};
+
+TEST_F(CommandServer, LetsTheWindowGoOnBetweenCommands)
+{
+    std::string commands;
+    for (int i = 0; i < 60; ++i)
+        commands += Ipc_Execute("-bmany");
+    ForgetLog();
+    CommandCounter counter;
+    RawClient client(path, Hello + commands);
+    EXPECT_TRUE(WaitFor([&] { return counter.all == 60; }));
+    EXPECT_LT(counter.most, 10u);
 }
 
 TEST_F(CommandServer, OutlivesTheWindow)
