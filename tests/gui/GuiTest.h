@@ -16,6 +16,7 @@
 #include <wx/weakref.h>
 
 #include "app/MyFrame.h"
+#include "tests/support/KeepEnvironment.h"
 #include "tests/support/TempFolder.h"
 #include "ui/Messages.h"
 
@@ -130,6 +131,7 @@ protected:
     // Changes the first field of the first file's first entry.
     void Change(int file, const char *value);
 
+    KeepEnvironment environment;
     TempFolder folder;
     CommandState state = {};
     wxWeakRef<MyFrame> frame;
