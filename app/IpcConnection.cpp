@@ -7,7 +7,7 @@
 #include "app/IpcServer.h"
 #include "store/Sys.h"
 
-enum { PATIENCE = 5000, BLOCK_SIZE = 16 * 1024 };
+enum { PATIENCE = 5000, BLOCK_SIZE = 16 * 1024, MESSAGES_AT_ONCE = 16 };
 
 static void LogServer(const char *text)
 {
@@ -111,7 +111,7 @@ int IpcPeer::QuietTime() const
 
 void IpcPeer::Watch()
 {
-    if (IsClosed() || m_source)
+    if (IsClosed() || m_source || HasMore())
         return;
     int direction = m_output.empty() ? wxEVENT_SOURCE_INPUT : wxEVENT_SOURCE_OUTPUT;
     m_source.reset(
@@ -133,7 +133,7 @@ bool IpcPeer::Advance()
 {
     if (IsClosed())
         return false;
-    bool moved = m_output.empty() ? Receive() : Flush();
+    bool moved = m_output.empty() ? m_more || Receive() : Flush();
     HandleInput();
     return moved;
 }
@@ -179,11 +179,14 @@ bool IpcPeer::Send(const std::string &bytes)
     return !m_deaf;
 }
 
+// Short messages are many to a block, and answering them all would take too long.
 void IpcPeer::HandleInput()
 {
-    while (!IsClosed() && m_output.empty() && TakeMessage()) {
-    }
-    if (m_ended && m_output.empty())
+    int count = 0;
+    while (count < MESSAGES_AT_ONCE && !IsClosed() && m_output.empty() && TakeMessage())
+        ++count;
+    m_more = count == MESSAGES_AT_ONCE;
+    if (m_ended && m_output.empty() && !m_more)
         Leave();
 }
 

@@ -49,6 +49,9 @@ public:
     int QuietTime() const;     // milliseconds since something was finished
     MyConnection *Connection() const { return m_connection.get(); } // null until it is accepted
 
+    // It has said more than was heard at once. The server lets it go on, after a while.
+    bool HasMore() const { return !IsClosed() && m_more && m_output.empty(); }
+
     void Watch();                        // until it is ready; then it is the server's turn
     bool Advance();                      // reads or writes a piece; true when there was one
     bool Send(const std::string &bytes); // false when earlier ones are unread, or it is gone
@@ -78,5 +81,6 @@ private:
     std::string m_input, m_output;
     bool m_ended = false; // nothing more is read
     bool m_deaf = false;  // it is gone; what it said before that still counts
+    bool m_more = false;  // there may be whole messages in m_input
     int32_t m_since;      // when something was last finished
 };

@@ -15,7 +15,7 @@ enum { PEERS_MAX = 16, COMMANDS_MAX = 64 };
 
 // Milliseconds.
 enum {
-    TICK_NEXT = 1,      // the next command comes after what the user waits for
+    TICK_NEXT = 1,      // there is more to do, after what the user waits for
     TICK_ACCEPT = 20,   // clients wait for room
     TICK_COMMAND = 100, // commands wait for the end of a dialog
     TICK_PEER = 500     // clients are amid something
@@ -194,13 +194,19 @@ void MyServer::OnTurn()
 void MyServer::OnTimer(wxTimerEvent &)
 {
     m_acceptPaused = false;
-    for (const auto &peer : m_peers)
+    for (const auto &peer : m_peers) {
         peer->DropWhenStalled();
+        if (peer->HasMore())
+            peer->Advance();
+    }
     AskForTurn();
 }
 
 int MyServer::NextTick() const
 {
+    if (std::any_of(m_peers.begin(), m_peers.end(),
+                    [](const auto &peer) { return peer->HasMore(); }))
+        return TICK_NEXT;
     if (m_acceptPaused)
         return TICK_ACCEPT;
     if (!m_commands.empty())

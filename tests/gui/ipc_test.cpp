@@ -595,21 +595,27 @@ TEST_F(CommandServer, RunsOneCommandAtATime)
     hook.Unregister();
 }
 
-// Counts the commands that are carried out between two of its ticks.
-class CommandCounter : public wxTimer
+// Counts the messages in the log that begin so: all, and at most between two of its ticks.
+class LogCounter : public wxTimer
 {
 public:
-    CommandCounter() { Start(1); }
+    explicit LogCounter(const std::string &start) : m_start(start)
+    {
+        ForgetLog();
+        Start(1);
+    }
 
     size_t all = 0, most = 0;
 
 private:
     void Notify() override
     {
-        size_t count = TakeLog("Cartulo: Command: ").size();
+        size_t count = TakeLog(m_start).size();
         all += count;
         most = std::max(most, count);
     }
+
+    std::string m_start;
 };
 
 TEST_F(CommandServer, LetsTheWindowGoOnBetweenCommands)
@@ -617,11 +623,23 @@ TEST_F(CommandServer, LetsTheWindowGoOnBetweenCommands)
     std::string commands;
     for (int i = 0; i < 60; ++i)
         commands += Ipc_Execute("-bmany");
-    ForgetLog();
-    CommandCounter counter;
+    LogCounter counter("Cartulo: Command: ");
     RawClient client(path, Hello + commands);
     EXPECT_TRUE(WaitFor([&] { return counter.all == 60; }));
     EXPECT_LT(counter.most, 10u);
+}
+
+TEST_F(CommandServer, LetsTheWindowGoOnBetweenRequests)
+{
+    std::string requests;
+    for (int i = 0; i < 1000; ++i)
+        requests += Ipc_Request("Date");
+    LogCounter counter("INFO: DDE server OnRequest");
+    RawClient client(path, Hello + requests);
+    client.Leave();
+    EXPECT_TRUE(WaitFor([&] { return counter.all == 1000; }));
+    EXPECT_LT(counter.most, 100u);
+    EXPECT_TRUE(IsServing());
 }
 
 TEST_F(CommandServer, OutlivesTheWindow)
