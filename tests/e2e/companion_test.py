@@ -9,6 +9,7 @@ from editor import minimise, poll, windows_named, xdotool
 
 INSERTION = "execute CommandLine: -s ({}) ...InsCite"
 MANUAL = "Cartulo: the manual"
+TOOL = 133, 20  # where the tool is in the window
 
 
 class Cite(EditorTest):
@@ -18,8 +19,15 @@ class Cite(EditorTest):
         self.service = self.start_peer()
         self.other = self.start_other()  # its window is the document's
 
-    def assert_inserts(self, editor, key):
-        xdotool("key", "Return")
+    def click_tool(self, editor):
+        """The other window may come forward then, so that the editor hears no more keys."""
+        xdotool("mousemove", "--window", editor.frame, *TOOL, "click", 1)
+
+    def assert_inserts(self, editor, key, by_tool=False):
+        if by_tool:
+            self.click_tool(editor)
+        else:
+            xdotool("key", "Return")
         poll(lambda: INSERTION.format(key) in self.peer_lines(), "the peer receives the key")
         self.assertEqual(1, self.peer_lines().count(INSERTION.format(key)))
         self.assertIn(f"Cartulo: Pass* -s ({key}) ...InsCite", editor.log())
@@ -56,13 +64,17 @@ class Cite(EditorTest):
         editor.wait_for_log("Command: " + option + " -w")
         editor.wait_until_active()
         editor.settle()
-        self.assert_inserts(editor, "delta")
+        self.assert_inserts(editor, "delta", by_tool=True)
 
     def test_comes_with_its_tool(self):
         editor = self.start(f"-w{self.other.frame}/{self.service}", "refs.bib").ready()
-        xdotool("mousemove", "--window", editor.frame, 133, 20, "click", 1)
-        poll(lambda: INSERTION.format("alpha") in self.peer_lines(), "the peer receives the key")
-        self.other.wait_until_active()
+        self.assert_inserts(editor, "alpha", by_tool=True)
+
+    def test_has_no_tool_without_a_service(self):
+        editor = self.start(f"-w{self.other.frame}", "refs.bib").ready()
+        self.click_tool(editor)
+        editor.settle()
+        self.assertNotIn("OnInsertCite", editor.log())
 
     def test_outlives_its_editor(self):
         editor = self.start(f"-w{self.other.frame}/{self.service}.gone", "refs.bib").ready()
