@@ -7,7 +7,10 @@
 #include "app/IpcServer.h"
 #include "store/Sys.h"
 
-enum { PATIENCE = 5000, BLOCK_SIZE = 16 * 1024, MESSAGES_AT_ONCE = 16 };
+enum { PATIENCE = 5000, BLOCK_SIZE = 16 * 1024 };
+
+// Messages that are heard at once: of who waits for answers, and of who is gone.
+enum { ANSWERS_AT_ONCE = 16, MESSAGES_AT_ONCE = 256 };
 
 static void LogServer(const char *text)
 {
@@ -182,10 +185,10 @@ bool IpcPeer::Send(const std::string &bytes)
 // Short messages are many to a block, and answering them all would take too long.
 void IpcPeer::HandleInput()
 {
-    int count = 0;
-    while (count < MESSAGES_AT_ONCE && !IsClosed() && m_output.empty() && TakeMessage())
-        ++count;
-    m_more = count == MESSAGES_AT_ONCE;
+    int left = m_deaf ? MESSAGES_AT_ONCE : ANSWERS_AT_ONCE;
+    while (left > 0 && !IsClosed() && m_output.empty() && TakeMessage())
+        --left;
+    m_more = left == 0;
     if (m_ended && m_output.empty() && !m_more)
         Leave();
 }
@@ -237,6 +240,8 @@ void IpcPeer::Open(const std::string &topic)
 
 void IpcPeer::Answer(const IpcMessage &message)
 {
+    if (m_deaf && message.code != IPC_EXECUTE)
+        return; // nobody waits for the answer any more
     const std::string *reply;
     switch (message.code) {
     case IPC_EXECUTE:

@@ -629,16 +629,26 @@ TEST_F(CommandServer, LetsTheWindowGoOnBetweenCommands)
     EXPECT_LT(counter.most, 10u);
 }
 
-TEST_F(CommandServer, LetsTheWindowGoOnBetweenRequests)
+TEST_F(CommandServer, LetsTheWindowGoOnBetweenMessages)
 {
-    std::string requests;
+    std::string pokes;
     for (int i = 0; i < 1000; ++i)
-        requests += Ipc_Request("Date");
-    LogCounter counter("INFO: DDE server OnRequest");
-    RawClient client(path, Hello + requests);
-    client.Leave();
+        pokes += Ipc_Poke("x", "");
+    LogCounter counter("INFO: DDE server OnPoke");
+    RawClient client(path, Hello + pokes);
     EXPECT_TRUE(WaitFor([&] { return counter.all == 1000; }));
     EXPECT_LT(counter.most, 100u);
+}
+
+TEST_F(CommandServer, TakesOnlyTheCommandsOfOneWhoIsGone)
+{
+    std::string requests, last = folder.Write("last.bib", "@book{last, title = {Last}}\n");
+    for (int i = 0; i < 1000; ++i)
+        requests += AskBytes;
+    LogCounter counter("INFO: DDE server OnRequest");
+    RawClient(path, Hello + requests + Ipc_Execute(last.c_str())).Leave();
+    EXPECT_TRUE(WaitFor([this] { return Panel()->Files()->count == 1; }));
+    EXPECT_LT(counter.all, 100u);
     EXPECT_TRUE(IsServing());
 }
 
