@@ -29,6 +29,12 @@ double Ratios::Maximum(const std::string &name) const
                                   : *std::max_element(found->second.begin(), found->second.end());
 }
 
+size_t Ratios::Count(const std::string &name) const
+{
+    auto found = m_times.find(name);
+    return found == m_times.end() ? 0 : found->second.size();
+}
+
 void Ratios::Print() const
 {
     printf("%-36s %10s %10s %10s %10s   (ms)\n", "", "minimum", "median", "average", "maximum");

@@ -17,6 +17,7 @@ public:
     // long; the median does not care.
     double Median(const std::string &name) const;
     double Maximum(const std::string &name) const;
+    size_t Count(const std::string &name) const;
 
     void Print() const; // minimum, median, average and maximum of everything, as it was measured
     void PrintRatio(const char *what, const char *name, const char *reference) const; // of medians
