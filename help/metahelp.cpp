@@ -8,6 +8,9 @@
 #include <wx/image.h>
 #include <wx/msgdlg.h>
 
+#include "app/Companion.h"
+#include "app/Native.h"
+#include "app/PlainAnswer.h"
 #include "help/HelpFrame.h"
 #include "help/HelpPage.h"
 #include "store/BibStore.h"
@@ -32,6 +35,7 @@ public:
     HelpApp(const std::string &manual, const char *topic) : m_manual(manual), m_topic(topic) {}
 
     bool OnInit() override;
+    int OnRun() override { return GetTopWindow() ? wxApp::OnRun() : 0; } // no second window
 
 private:
     std::string m_manual; // "" when there is none
@@ -40,14 +44,29 @@ private:
 
 } // namespace
 
+// Under which the window of this screen is found again.
+static std::string WindowName()
+{
+    const char *screen = getenv("DISPLAY");
+    return std::string("metahelp-") + (screen ? screen : "");
+}
+
 bool HelpApp::OnInit()
 {
     if (m_manual.empty()) {
         wxMessageBox(NoManual, "Cartulo", wxOK | wxICON_ERROR);
         return false;
     }
+    std::string name = WindowName();
+    long running = FindFrame(name.c_str());
+    if (running != 0) {
+        Native_BringForward(running);
+        return true;
+    }
     wxInitAllImageHandlers();
-    (new HelpFrame(m_manual, Help_Notice(m_topic)))->wxFrame::Show();
+    HelpFrame *frame = new HelpFrame(m_manual, Help_Notice(m_topic));
+    RegisterFrame(name.c_str(), Native_WindowHandle(frame));
+    frame->wxFrame::Show();
     return true;
 }
 
@@ -66,22 +85,11 @@ static std::string ReadManual()
     return manual;
 }
 
-// Answers that need no display. 1 when that was all.
-static int AnswerWithoutDisplay(int argc, char **argv)
-{
-    for (int i = 1; i < argc; ++i) {
-        if (strcmp(argv[i], "--help") == 0)
-            return fputs(Usage, stdout), 1;
-        if (strcmp(argv[i], "--version") == 0)
-            return puts("metahelp " CARTULO_VERSION), 1;
-    }
-    return 0;
-}
-
 int main(int argc, char **argv)
 {
-    if (AnswerWithoutDisplay(argc, argv))
-        return fflush(stdout) == 0 ? 0 : 1;
+    int answered = PlainAnswer(argc, argv, Usage, "metahelp " CARTULO_VERSION "\n");
+    if (answered >= 0)
+        return answered;
     std::string manual = ReadManual();
     if (manual.empty())
         fprintf(stderr, "metahelp: %s\n", NoManual);

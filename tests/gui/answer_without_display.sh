@@ -14,6 +14,7 @@ for word in Usage: -dFOLDER/ -eNAME --help --version CARTULO_LOG=; do
     *) echo "the help lacks $word" >&2; exit 1 ;;
     esac
 done
+[ "$("$program" -h)" = "$help" ]
 for option in --version --help; do
     ! "$program" "$option" >/dev/full || { echo "$option did not fail" >&2; exit 1; }
 done

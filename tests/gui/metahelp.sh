@@ -56,6 +56,18 @@ Usage:*.QRL.Cartulo*) ;;
 esac
 ! "$program" --version >/dev/full || fail "--version did not fail"
 
+# A second start brings the first one's window forward, and ends.
+"$program" .QRL.Cartulo &
+help=$!
+until_done has_window '^Cartulo: the manual$' || fail "no window"
+first=$window
+timeout 20 "$program" .QRL.Cartulo || fail "the second start ended with status $?"
+[ "$(xdotool search --all --onlyvisible --name '^Cartulo: the manual$')" = "$first" ] ||
+    fail "there is a second window"
+until_done closes_with Escape || fail "the window does not close"
+wait "$help" || fail "the help program ended with status $?"
+help=
+
 shows_manual ctrl+w .QRL.Cartulo
 shows_manual Escape .QRL.Other
 shows_manual Escape
