@@ -14,12 +14,6 @@ static void LogClient(const char *text)
     TNSMessage("INFO: DDE client ", text, TNS_LIFECYCLE);
 }
 
-static int TimeLeft(int32_t end)
-{
-    int32_t left = end - Sys_Milliseconds();
-    return left > 0 ? left : 0;
-}
-
 // --- Where services are ---
 
 std::string Ipc_SocketPath(const char *service)
@@ -66,7 +60,7 @@ bool CmdConnection::Execute(const char *text)
         return false; // no server takes that
     int32_t end = Sys_Milliseconds() + m_milliseconds;
     return Send(Ipc_Execute(text) + Ipc_CodeAlone(IPC_DISCONNECT), end) &&
-           Sys_FinishSending(m_socket, TimeLeft(end)) != 0;
+           Sys_FinishSending(m_socket, Sys_TimeLeft(end)) != 0;
 }
 
 bool CmdConnection::Request(const char *item, std::string *data)
@@ -95,7 +89,7 @@ bool CmdConnection::Send(const std::string &bytes, int32_t end)
         if (count < 0)
             return false;
         sent += static_cast<size_t>(count);
-        if (count == 0 && !Sys_WaitWritable(m_socket, TimeLeft(end)))
+        if (count == 0 && !Sys_WaitWritable(m_socket, Sys_TimeLeft(end)))
             return false;
     }
     return true;
@@ -136,7 +130,7 @@ bool CmdConnection::TakeMessage(IpcMessage *message, int32_t end)
 bool CmdConnection::ReadMore(int32_t end)
 {
     char block[4096];
-    if (TimeLeft(end) == 0 || !Sys_WaitReadable(m_socket, TimeLeft(end)))
+    if (Sys_TimeLeft(end) == 0 || !Sys_WaitReadable(m_socket, Sys_TimeLeft(end)))
         return false;
     long count = Sys_Receive(m_socket, block, sizeof block);
     if (count < 0) {
@@ -172,11 +166,11 @@ bool MyClient::Connect(const char *service, const char *topic)
     LogClient("is connecting...");
     int32_t end = Sys_Milliseconds() + m_milliseconds;
     for (const std::string &path : {Ipc_SocketPath(service), Ipc_NamedPath(service)}) {
-        int socket = path.empty() ? 0 : Sys_ConnectLocal(path.c_str(), TimeLeft(end));
+        int socket = path.empty() ? 0 : Sys_ConnectLocal(path.c_str(), Sys_TimeLeft(end));
         if (!socket)
             continue;
         m_connection = std::make_unique<CmdConnection>(socket, m_milliseconds);
-        if (m_connection->Open(topic, TimeLeft(end)))
+        if (m_connection->Open(topic, Sys_TimeLeft(end)))
             return true;
         m_connection.reset();
     }

@@ -78,7 +78,7 @@ bool MyServer::Listen(const std::string &path)
     int socket = Sys_ListenLocal(path.c_str());
     if (!socket) {
         std::string text = "can't listen at " + path + ": " + Sys_LastErrorText();
-        TNSMessage("WARNING: DDE server ", text.c_str(), TNS_WARNING);
+        TNSMessage("INFO: DDE server ", text.c_str(), TNS_LIFECYCLE);
         return false;
     }
     m_listeners.push_back(std::make_unique<IpcListener>(this, socket, path));
@@ -90,8 +90,8 @@ bool MyServer::Create(const char *service)
     if (!Listen(Ipc_SocketPath(service)))
         return false;
     std::string named = Ipc_NamedPath(service);
-    if (!named.empty())
-        Listen(named);
+    if (!named.empty() && !Listen(named))
+        TNSMessage("WARNING: DDE server can't be met at ", service, TNS_WARNING);
     return true;
 }
 

@@ -18,6 +18,7 @@
 #include "app/Log.h"
 #include "app/LogGui.h"
 #include "app/Native.h"
+#include "app/PlainAnswer.h"
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
 #include "store/Sys.h"
@@ -33,9 +34,10 @@ static const char Usage[] =
     "\n"
     "Shows the entries of all named BibTeX databases in one searchable list.\n"
     "The extension .bib may be left out. A second start with the same -dFOLDER/ hands its files\n"
-    "over to the first.\n"
+    "over to the first one.\n"
     "\n"
-    "  -dFOLDER/    folder that relative file names start from (first, with the slash)\n"
+    "  -dFOLDER/    folder, with its slash and from / on, that relative file names start from; as\n"
+    "               the first option, it makes the start one that is handed over\n"
     "  -eNAME       code page of the files, like -eCP1251; without it CP1252\n"
     "  -i           forget the files named so far\n"
     "  -wWINDOW/SERVICE\n"
@@ -83,36 +85,46 @@ const char *MyApp::BuildLine()
 
 // False when another process serves the same folder. The lock ends with the process, however that
 // ends, so nothing is left to be cleaned up. Where it can't be made, the program runs alone.
-bool MyApp::TakeInstance()
+bool MyApp::TakeInstance(const std::string &name)
+{
+    char *path = Sys_PrivatePath(name.c_str(), ".lock");
+    m_instanceLock = path ? Sys_LockFile(path) : 0;
+    bool othersHoldIt = path && m_instanceLock == 0 && Sys_IsLockTaken();
+    if (m_instanceLock == 0 && !othersHoldIt)
+        AppLog("ERROR: No instance lock: ", Sys_LastErrorText());
+    free(path);
+    return !othersHoldIt;
+}
+
+bool MyApp::IsFirst(const char *commandLine)
 {
     std::string name = "Quarlo-" + m_start.instance + "-" + Sys_LoginName();
     TNSMessage("INFO: Cartulo::Single ", name.c_str(), TNS_LIFECYCLE);
-    char *path = Sys_PrivatePath(name.c_str(), ".lock");
-    if (!path) {
-        AppLog("ERROR: No folder for the instance lock: ", Sys_LastErrorText());
-        return true;
-    }
-    m_instanceLock = Sys_LockFile(path);
-    free(path);
-    return m_instanceLock != 0;
+    return TakeInstance(name) || !HandOver(name, commandLine);
 }
 
-// To the first instance, which may still be loading its files.
-void MyApp::HandOver(const char *commandLine)
+// To the first instance, which may still be loading its files. False when that one has ended
+// instead, so that this is now the first.
+bool MyApp::HandOver(const std::string &name, const char *commandLine)
 {
+    int32_t end = Sys_Milliseconds() + HAND_OVER_TIME;
     long window = FindFrame(m_start.instance.c_str());
     if (window != 0)
         Native_BringForward(window);
-    int32_t start = Sys_Milliseconds();
-    do {
+    for (;;) {
         handedOver = SendCommand(m_service.c_str(), commandLine);
         if (handedOver)
-            return;
+            return true;
+        if (TakeInstance(name))
+            return false;
+        if (Sys_TimeLeft(end) == 0)
+            break;
         wxMilliSleep(HAND_OVER_PAUSE);
-    } while (Sys_Milliseconds() - start < HAND_OVER_TIME);
+    }
     fprintf(stderr,
             "cartulo: the running Cartulo does not answer; these files were not opened: %s\n",
             commandLine);
+    return true;
 }
 
 void MyApp::OpenConfig()
@@ -146,10 +158,8 @@ bool MyApp::OnInit()
         return false;
     m_start = Command_StartUp(commandLine);
     m_service = "/tmp/Quarlo-DDE-" + m_start.instance;
-    if (!m_start.baseFolder.empty() && !TakeInstance()) {
-        HandOver(commandLine);
+    if (!m_start.baseFolder.empty() && !IsFirst(commandLine))
         return false;
-    }
     wxInitAllImageHandlers();
     AppLog("Cartulo::OnInit --- ", "Names");
     SetVendorName("Quarlo");
@@ -186,29 +196,19 @@ int MyApp::OnExit()
 
 void MyApp::OnActivateApp(wxActivateEvent &event)
 {
-    TNSMessage("INFO: Cartulo is now+ ", event.GetActive() ? "Activated" : "Disactivated",
-               TNS_LIFECYCLE);
+    bool autoSave = !m_frame || m_frame->AutoSave();
+    TNSMessage(autoSave ? "INFO: Cartulo is now+ " : "INFO: Cartulo is now- ",
+               event.GetActive() ? "Activated" : "Disactivated", TNS_LIFECYCLE);
     if (!event.GetActive() && m_frame)
         m_frame->OnDeactivation();
     event.Skip();
 }
 
-// Answers that need no display. 1 when that was all.
-static int AnswerWithoutDisplay(int argc, char **argv)
-{
-    for (int i = 1; i < argc; ++i) {
-        if (strcmp(argv[i], "--help") == 0)
-            return fputs(Usage, stdout), 1;
-        if (strcmp(argv[i], "--version") == 0)
-            return puts("cartulo " CARTULO_VERSION), 1;
-    }
-    return 0;
-}
-
 int main(int argc, char **argv)
 {
-    if (AnswerWithoutDisplay(argc, argv))
-        return fflush(stdout) == 0 ? 0 : 1;
+    int answered = PlainAnswer(argc, argv, Usage, "cartulo " CARTULO_VERSION "\n");
+    if (answered >= 0)
+        return answered;
     Sys_FillStandard();
     Sys_SurviveFailedWrites();
     if (!wxGetEnv("GDK_BACKEND", nullptr))

@@ -27,8 +27,9 @@ protected:
 private:
     const char *BuildLine();
     bool CheckParser();
-    bool TakeInstance();
-    void HandOver(const char *commandLine);
+    bool IsFirst(const char *commandLine);
+    bool TakeInstance(const std::string &name);
+    bool HandOver(const std::string &name, const char *commandLine);
     void Publish(long window);
     void OpenConfig();
     void OnActivateApp(wxActivateEvent &event);

@@ -23,13 +23,13 @@
 // Descriptors of the locks that this process holds.
 static std::vector<int> LockHandles;
 
-static int FailWith(int error)
+int Sys_FailWith(int error)
 {
     errno = error;
     return 0;
 }
 
-static void CloseQuietly(int fd)
+void Sys_CloseQuietly(int fd)
 {
     int reason = errno;
     close(fd);
@@ -41,7 +41,7 @@ int Sys_MoveOffStandard(int fd)
     if (fd < 0 || fd > STDERR_FILENO)
         return fd;
     int other = fcntl(fd, F_DUPFD_CLOEXEC, STDERR_FILENO + 1);
-    CloseQuietly(fd);
+    Sys_CloseQuietly(fd);
     return other;
 }
 
@@ -87,6 +87,12 @@ int32_t Sys_Milliseconds()
     clock_gettime(CLOCK_MONOTONIC, &now);
     uint64_t ticks = static_cast<uint64_t>(now.tv_sec) * 1000 + now.tv_nsec / 1000000;
     return static_cast<int32_t>(static_cast<uint32_t>(ticks));
+}
+
+int Sys_TimeLeft(int32_t end)
+{
+    int32_t left = end - Sys_Milliseconds();
+    return left > 0 ? left : 0;
 }
 
 int Sys_CurrentFolder(char *buffer, size_t size)
@@ -160,7 +166,7 @@ static int IsRegular(mode_t mode)
 {
     if (S_ISREG(mode))
         return 1;
-    return FailWith(S_ISDIR(mode) ? EISDIR : ENOTSUP);
+    return Sys_FailWith(S_ISDIR(mode) ? EISDIR : ENOTSUP);
 }
 
 // A descriptor, or -1 with the reason in errno. O_NONBLOCK: a pipe without a partner must not hang
@@ -173,7 +179,7 @@ static int OpenRegular(const char *path, int flags)
     struct stat status;
     if (fstat(fd, &status) == 0 && IsRegular(status.st_mode))
         return fd;
-    CloseQuietly(fd);
+    Sys_CloseQuietly(fd);
     return -1;
 }
 
@@ -184,7 +190,7 @@ FILE *Sys_OpenRegular(const char *path)
         return nullptr;
     FILE *stream = fdopen(fd, "r");
     if (!stream)
-        CloseQuietly(fd);
+        Sys_CloseQuietly(fd);
     return stream;
 }
 
@@ -254,7 +260,7 @@ int Sys_LockFile(const char *path)
         if (fd < 0)
             return 0;
         if (!LockDescriptor(fd)) {
-            CloseQuietly(fd);
+            Sys_CloseQuietly(fd);
             return 0;
         }
         if (IsOpenAt(fd, path)) {
@@ -263,7 +269,12 @@ int Sys_LockFile(const char *path)
         }
         close(fd);
     }
-    return FailWith(ETXTBSY);
+    return Sys_FailWith(ETXTBSY);
+}
+
+int Sys_IsLockTaken()
+{
+    return errno == ETXTBSY;
 }
 
 void Sys_UnlockFile(int handle)
@@ -387,11 +398,11 @@ static int CopyFile(const char *path, const char *copy)
         return 0;
     int to = Sys_MoveOffStandard(open(copy, O_WRONLY | O_CREAT | O_EXCL | O_CLOEXEC, 0600));
     if (to < 0) {
-        CloseQuietly(from);
+        Sys_CloseQuietly(from);
         return 0;
     }
     int ok = CopyDescriptor(from, to);
-    CloseQuietly(from);
+    Sys_CloseQuietly(from);
     if (close(to) != 0)
         ok = 0;
     if (!ok)
@@ -484,7 +495,7 @@ int Sys_StartReplace(SysReplace *replace, const char *path)
     if (replace->stream && replace->target && replace->temporary)
         return 1;
     if (!replace->stream)
-        CloseQuietly(fd);
+        Sys_CloseQuietly(fd);
     RemoveQuietly(temporary.c_str());
     Sys_CancelReplace(replace);
     return 0;

@@ -1,6 +1,9 @@
 // store/Sys-posix.h - shared by the files that implement Sys.h on POSIX systems.
 #pragma once
 
+int Sys_FailWith(int error);     // leaves the reason in errno; 0
+void Sys_CloseQuietly(int file); // leaves errno alone
+
 // Moves a descriptor off 0 to 2 and returns the new one; others, and -1, come back as they are. -1
 // on failure, with the reason in errno and the old one closed.
 //

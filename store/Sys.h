@@ -29,6 +29,7 @@ char *Sys_ReadAll(FILE *stream, size_t *length);
 // Opens `path` (created when missing) and shuts other writers out; readers stay welcome.
 // Returns a handle, never 0; on failure 0, with the reason in Sys_LastErrorText().
 int Sys_LockFile(const char *path);
+int Sys_IsLockTaken(); // 1 when the last Sys_LockFile failed because somebody else holds the lock
 void Sys_UnlockFile(int handle);        // 0 is ignored
 int Sys_IsLockedHere(const char *path); // 1 when this process holds the lock of that file
 
@@ -63,6 +64,7 @@ void Sys_CancelReplace(SysReplace *replace);                 // frees; removes t
 // --- Time and places ---
 
 int32_t Sys_Milliseconds();                       // a tick count for differences
+int Sys_TimeLeft(int32_t end);                    // ticks until then; 0 when that is over
 int Sys_CurrentFolder(char *buffer, size_t size); // 1, or 0 when it does not fit
 
 // Where the user's programs keep files; malloc'd.

@@ -34,33 +34,14 @@ std::vector<Listener> Listeners;
 
 } // namespace
 
-static int FailWith(int error)
-{
-    errno = error;
-    return 0;
-}
-
-static void CloseQuietly(int fd)
-{
-    int reason = errno;
-    close(fd);
-    errno = reason;
-}
-
-static int TimeLeft(int32_t end)
-{
-    int32_t left = end - Sys_Milliseconds();
-    return left > 0 ? left : 0;
-}
-
 // 0, with the reason in errno, when the path is too long for the system, or empty: that would be
 // an address outside of the file system, open to everybody.
 static int MakeAddress(sockaddr_un *address, const char *path)
 {
     if (*path == 0)
-        return FailWith(EINVAL);
+        return Sys_FailWith(EINVAL);
     if (strlen(path) >= sizeof address->sun_path)
-        return FailWith(ENAMETOOLONG);
+        return Sys_FailWith(ENAMETOOLONG);
     *address = {};
     address->sun_family = AF_UNIX;
     strcpy(address->sun_path, path);
@@ -84,7 +65,7 @@ static int IsOwnUser(int socket)
     socklen_t size = sizeof other;
     if (getsockopt(socket, SOL_SOCKET, SO_PEERCRED, &other, &size) != 0)
         return 0;
-    return other.uid == geteuid() || FailWith(EACCES);
+    return other.uid == geteuid() || Sys_FailWith(EACCES);
 }
 
 // --- Listening ---
@@ -101,8 +82,8 @@ static int LockFolderOf(const char *path)
     while (fd >= 0 && flock(fd, LOCK_EX | LOCK_NB) != 0) {
         if (errno != EWOULDBLOCK)
             return fd; // no locks on this file system
-        if (TimeLeft(end) == 0) {
-            CloseQuietly(fd);
+        if (Sys_TimeLeft(end) == 0) {
+            Sys_CloseQuietly(fd);
             return -1;
         }
         poll(nullptr, 0, PAUSE);
@@ -136,11 +117,11 @@ static int ClearPath(const sockaddr_un *address)
     if (lstat(address->sun_path, &status) != 0)
         return errno == ENOENT;
     if (!S_ISSOCK(status.st_mode))
-        return FailWith(EEXIST);
+        return Sys_FailWith(EEXIST);
     if (status.st_uid != geteuid())
-        return FailWith(EACCES);
+        return Sys_FailWith(EACCES);
     if (IsServed(address))
-        return FailWith(EADDRINUSE);
+        return Sys_FailWith(EADDRINUSE);
     return unlink(address->sun_path) == 0;
 }
 
@@ -153,7 +134,7 @@ static int Bind(int socket, const sockaddr_un *address)
     if (listen(socket, SOMAXCONN) != 0 || lstat(address->sun_path, &status) != 0) {
         int reason = errno;
         unlink(address->sun_path);
-        return FailWith(reason);
+        return Sys_FailWith(reason);
     }
     Listeners.push_back({socket, status.st_dev, status.st_ino});
     return 1;
@@ -169,7 +150,7 @@ int Sys_ListenLocal(const char *path)
         return 0;
     int socket = ClearPath(&address) ? OpenSocket() : -1;
     if (socket >= 0 && !Bind(socket, &address)) {
-        CloseQuietly(socket);
+        Sys_CloseQuietly(socket);
         socket = -1;
     }
     UnlockFolder(folder);
@@ -224,8 +205,8 @@ static int Connect(int socket, const sockaddr_un *address, int milliseconds)
             continue;
         if (errno != EAGAIN)
             return 0;
-        if (TimeLeft(end) == 0)
-            return FailWith(ETIMEDOUT);
+        if (Sys_TimeLeft(end) == 0)
+            return Sys_FailWith(ETIMEDOUT);
         poll(nullptr, 0, PAUSE);
     }
     return 1;
@@ -241,7 +222,7 @@ int Sys_ConnectLocal(const char *path, int milliseconds)
         return 0;
     if (Connect(socket, &address, milliseconds) && IsOwnUser(socket))
         return socket;
-    CloseQuietly(socket);
+    Sys_CloseQuietly(socket);
     return 0;
 }
 
@@ -271,7 +252,7 @@ static int Wait(int socket, short events, int milliseconds)
     int32_t end = Sys_Milliseconds() + milliseconds;
     for (;;) {
         pollfd wait = {socket, events, 0};
-        int ready = poll(&wait, 1, TimeLeft(end));
+        int ready = poll(&wait, 1, Sys_TimeLeft(end));
         if (ready >= 0 || errno != EINTR)
             return ready > 0;
     }
@@ -292,13 +273,13 @@ int Sys_FinishSending(int socket, int milliseconds)
     char dropped[512];
     int32_t end = Sys_Milliseconds() + milliseconds;
     shutdown(socket, SHUT_WR);
-    while (Wait(socket, POLLIN, TimeLeft(end))) {
+    while (Wait(socket, POLLIN, Sys_TimeLeft(end))) {
         ssize_t got = recv(socket, dropped, sizeof dropped, MSG_DONTWAIT);
         if (got == 0)
             return 1;
         if (Outcome(got) < 0)
             return 0;
-        if (TimeLeft(end) == 0)
+        if (Sys_TimeLeft(end) == 0)
             break;
     }
     return -1;

@@ -152,6 +152,17 @@ class HandOver(InstanceTest):
         first.await_frame().wait_until_active()
         self.assertEqual(REFS_ROWS, first.rows())
 
+    def test_is_needless_when_the_first_ends_instead(self):
+        self.write_both()
+        first = self.start_first("refs")
+        first.process.send_signal(signal.SIGSTOP)
+        second = self.start(self.option, "more")
+        second.wait_for_log("SendCommand")
+        first.kill()
+        self.assertEqual(MORE_ROWS, second.ready().rows())
+        self.assert_carries_out(second, "refs")
+        self.assertEqual(REFS_ROWS, second.rows())
+
     def test_ends_with_a_message_when_nobody_answers(self):
         self.write("refs.bib", REFS)
         first = self.start_first("refs")
@@ -237,6 +248,17 @@ class Instances(InstanceTest):
         self.assert_carries_out(next_one, "more")
         self.assertEqual(MORE_ROWS, next_one.rows())
         self.assertEqual(0, next_one.close())
+
+    def test_run_alone_where_they_cannot_be_locked(self):
+        self.write_both()
+        self.assertEqual(0, self.start_first("more").close())
+        folder = os.path.join(self.home, "run", "quarlo")
+        lock, = [name for name in os.listdir(folder) if name.endswith(".lock")]
+        os.remove(os.path.join(folder, lock))
+        os.mkdir(os.path.join(folder, lock))
+        editor = self.start_first("refs")
+        self.assertIn("ERROR: No instance lock: Is a directory", editor.log())
+        self.assertEqual(REFS_ROWS, editor.rows())
 
     def test_leave_nothing_to_be_met_when_they_are_closed(self):
         self.write_both()

@@ -249,8 +249,10 @@ TEST_F(CommandServer, ServesThePrivatePathWhereTheNameIsTaken)
     server.reset(StartCommandServer(service.c_str(), frame));
     ASSERT_TRUE(server);
     EXPECT_EQ(
-        Lines({{"WARNING: DDE server can't listen at " + service + ": File exists", TNS_WARNING}}),
-        TakeLog("WARNING: "));
+        Lines({{"INFO: DDE server can't listen at " + service + ": File exists", TNS_LIFECYCLE},
+               {"INFO: DDE server started " + service, TNS_LIFECYCLE},
+               {"INFO: DDE server uses DDE", TNS_LIFECYCLE}}),
+        TakeLog("INFO: DDE server "));
     EXPECT_TRUE(IsServing());
     EXPECT_EQ("mine", folder.Read("service"));
 }
