@@ -34,7 +34,8 @@
 #include "ui/Theme.h"
 
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, COLUMN_GAP = 8, PANE_BORDER = 8, HELP_HEIGHT = 40 };
-enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window
+enum { SMALLEST_VALUE = 60, LABEL_WIDTH = 96 };       // in the narrowest window
+enum { LONGEST_TIP = 1000 };                          // characters
 static const char SashKey[] = "/MainWindow/Splitter"; // in the toolkit's configuration
 static const double LIST_SHARE = 0.35;                // of what the window grows or shrinks
 static const Colour HeadingColour = {0, 0, 100};
@@ -153,12 +154,14 @@ wxSizer *Cartulo::CreateFieldGrid()
     grid->AddSpacer(0);
     grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "Entry Type:"), labelPlace);
     m_type = new wxChoice(m_entryPane, ID_TYPE);
+    m_type->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
     m_type->Disable();
-    grid->Add(m_type);
+    grid->Add(m_type, wxSizerFlags().Expand());
     grid->AddSpacer(0);
     for (int i = 0; i < ROW_COUNT; ++i) {
         FieldRow &row = m_rows[i];
-        row.label = new wxStaticText(m_entryPane, wxID_ANY, "Field:");
+        row.label = new wxStaticText(m_entryPane, wxID_ANY, "Field:", wxDefaultPosition,
+                                     wxDefaultSize, wxST_ELLIPSIZE_END | wxST_NO_AUTORESIZE);
         row.value = new wxTextCtrl(m_entryPane, wxID_ANY, "FieldValue");
         row.value->SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
         row.value->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
@@ -211,6 +214,7 @@ void Cartulo::CreateEntryPane()
     column->Add(m_help, wxSizerFlags(place).Proportion(1));
     m_entryPane->SetSizer(column);
     m_entryPane->SetScrollRate(0, FromDIP(16));
+    m_entryPane->Bind(wxEVT_SIZE, &Cartulo::OnEntryPaneSize, this);
     m_entryPane->Hide();
 }
 
@@ -316,6 +320,16 @@ void Cartulo::KeepSashPosition()
 
 // --- Files ---
 
+// While files are opened, closed or saved a box may be open, and events that were queued before
+// still come in: no command may touch the files then.
+bool Cartulo::TryBefore(wxEvent &event)
+{
+    if (!m_busy || !event.IsCommandEvent())
+        return wxSplitterWindow::TryBefore(event);
+    ShowStatus(this, "Cartulo is still busy with the files: please try again.");
+    return true;
+}
+
 void Cartulo::ShowBox(void *owner, const char *caption, const char *text)
 {
     static_cast<Cartulo *>(owner)->ShowWarning(caption, PathText(text));
@@ -352,6 +366,8 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *)
         m_list->Update_Index(IsOpen(&m_set, file, path) ? entry : nullptr, m_search.c_str());
         Arrange();
     }
+    if (m_messages)
+        m_messages->Fill(&m_set);
     if (result.errors != 0) {
         TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
         GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, ID_MESSAGES));
@@ -603,10 +619,42 @@ void Cartulo::FillRow(int row, const BibField *field)
     wxString text = StoreText(field->value);
     m_rows[row].label->SetLabelText(StoreText(BibFieldTable[field->name]));
     value->ChangeValue(text);
-    if (value->GetValue() == text)
-        value->UnsetToolTip();
-    else
+    m_rows[row].isCut = value->GetValue() != text;
+}
+
+// The part of a long text that a tip can show.
+static wxString TipText(const wxString &text)
+{
+    return text.length() > LONGEST_TIP ? text.Left(LONGEST_TIP) + L"\x2026" : text;
+}
+
+static bool Fits(const wxTextCtrl *value)
+{
+    wxString text = value->GetValue();
+    return text.length() <= LONGEST_TIP &&
+           value->GetSizeFromTextSize(value->GetTextExtent(text)).x <= value->GetSize().x;
+}
+
+// What is too long for the row can be read in its tip.
+void Cartulo::FitRow(int row)
+{
+    wxStaticText *label = m_rows[row].label;
+    wxTextCtrl *value = m_rows[row].value;
+    int widest = std::max(FromDIP(LABEL_WIDTH), m_entryPane->GetClientSize().x / 3);
+    int width = label->GetTextExtent(label->GetLabelText()).x;
+    label->SetMinSize(wxSize(std::min(width, widest), -1));
+    label->SetToolTip(width > widest ? label->GetLabelText() : wxString());
+    if (m_rows[row].isCut)
         value->SetToolTip("This value is too long to be shown in full.");
+    else
+        value->SetToolTip(Fits(value) ? wxString() : TipText(value->GetValue()));
+}
+
+void Cartulo::OnEntryPaneSize(wxSizeEvent &event)
+{
+    for (int i = 0; i < ROW_COUNT && m_rows[i].value->IsShown(); ++i)
+        FitRow(i);
+    event.Skip();
 }
 
 // The choice leaves out the fixed types, which no entry has.
@@ -669,6 +717,8 @@ void Cartulo::ShowRows(int count)
         row.value->Enable(m_editMode);
         row.remove->Show(i < count);
         row.remove->Enable(m_editMode);
+        if (i < count)
+            FitRow(i);
     }
     m_entryPane->FitInside(); // the scroll bar follows the rows
     m_entryPane->Layout();

@@ -63,6 +63,7 @@ private:
         wxStaticText *label;
         wxTextCtrl *value;
         xBitmapButton *remove;
+        bool isCut; // the value is longer than the control can hold
     };
 
     void ReadSchema();
@@ -84,6 +85,7 @@ private:
     void ClearEntry();
     void FillTypes();
     void FillRow(int row, const BibField *field);
+    void FitRow(int row);
     void ShowMoreFields(int count);
     void ShowRows(int count);
     void UpdateSaveTool();
@@ -98,7 +100,9 @@ private:
     void OnInsertCite(wxCommandEvent &event);
     void OnUnavailable(wxCommandEvent &event);
     void OnSashMove(wxSplitterEvent &event);
+    void OnEntryPaneSize(wxSizeEvent &event);
     void OnPaint(wxPaintEvent &event);
+    bool TryBefore(wxEvent &event) override;
 
     BibFileSet m_set = {};
     CommandState *m_state;

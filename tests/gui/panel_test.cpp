@@ -120,7 +120,7 @@ TEST_F(EditorPanel, ScrollsTheEntryWhenTheWindowIsLow)
 
 TEST_F(EditorPanel, FitsIntoTheNarrowestWindow)
 {
-    Open(folder.Write("a.bib", OneEntry));
+    Open(folder.Write("a.bib", "@incollection{one, aVeryLongNameOfAFieldThatNobodyHas = {v}}\n"));
     ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
     frame->SetSize(frame->GetMinSize());
     ASSERT_TRUE(WaitFor([this] { return frame->GetSize() == frame->GetMinSize(); }));
@@ -128,6 +128,34 @@ TEST_F(EditorPanel, FitsIntoTheNarrowestWindow)
         return Panel()->FindWindow(ID_REMOVE_ROW)->GetRect().GetRight() <
                EntryPane()->GetClientSize().x;
     }));
+    for (wxWindow *child : EntryPane()->GetChildren())
+        EXPECT_TRUE(!child->IsShown() || child->GetSize().x > 25) << child->GetName();
+}
+
+// The tip of the first shown control of a kind.
+template <class Control> static wxString TipOf(wxWindow *pane, const wxString &text)
+{
+    for (wxWindow *child : pane->GetChildren()) {
+        Control *control = dynamic_cast<Control *>(child);
+        if (control && control->IsShown() && control->GetLabelText() == text)
+            return control->GetToolTipText();
+    }
+    return "no such control";
+}
+
+TEST_F(EditorPanel, TellsInTipsWhatFindsNoRoom)
+{
+    std::string name(80, 'n'), value(300, 'v'), huge(5000, 'h');
+    Open(folder.Write("a.bib", "@misc{one, " + name + " = {short}, note = {" + value +
+                                   "}, title = {" + huge + "}}\n"));
+    std::vector<wxString> tips;
+    for (wxWindow *child : EntryPane()->GetChildren())
+        if (child->IsShown() && dynamic_cast<wxTextCtrl *>(child))
+            tips.push_back(child->GetToolTipText());
+    tips.pop_back(); // that of the help text
+    EXPECT_EQ((std::vector<wxString>{"", value, wxString(huge).Left(1000) + L"\x2026"}), tips);
+    EXPECT_EQ(name, TipOf<wxStaticText>(EntryPane(), name));
+    EXPECT_EQ("", TipOf<wxStaticText>(EntryPane(), "note"));
 }
 
 // --- Tools ---

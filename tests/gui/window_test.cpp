@@ -9,6 +9,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <wx/uiaction.h>
 #include <wx/button.h>
 #include <wx/scrolwin.h>
 #include <wx/settings.h>
@@ -287,6 +288,39 @@ TEST_F(Window, StaysWhileItIsMade)
     ASSERT_TRUE(frame);
     EXPECT_TRUE(frame->IsShown());
     EXPECT_EQ((std::vector<wxString>{"one (b)"}), Rows());
+}
+
+// Commands that were queued before a box came up.
+TEST_F(Window, TouchesNoFilesWhileABoxIsOpen)
+{
+    std::string a = folder.Write("a.bib", OneEntry), taken = folder.Write("taken.bib", OneEntry);
+    Open(a + " " + folder.Write("b.bib", OneEntry));
+    OtherProgram other(taken);
+    WhileBoxIsOpen hook(
+        [this] {
+            EXPECT_TRUE(Panel()->IsBusy());
+            for (int id : {ID_OPEN, ID_SAVE, ID_CITE, ID_MESSAGES, ID_REMOVE_ENTRY})
+                Panel()->GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, id));
+            HandleQueuedEvents();
+            EXPECT_EQ("Cartulo is still busy with the files: please try again.", Status());
+        },
+        wxID_OK);
+    frame->TakeCommand((a + " " + taken).c_str());
+    EXPECT_EQ(1, hook.boxes); // no file dialog
+    EXPECT_EQ((std::vector<wxString>{"one (a)"}), Rows());
+}
+
+TEST_F(Window, PressesTheFocusedButtonWithEnter)
+{
+    std::string path = folder.Write("a.bib", OneEntry);
+    Open("");
+    Panel()->FindWindow(ID_OPEN)->SetFocus();
+    ASSERT_TRUE(WaitFor([this] { return Panel()->FindWindow(ID_OPEN)->HasFocus(); }));
+    AllowDialogs allow;
+    AnswerFileDialog answer(path);
+    wxUIActionSimulator().Char(WXK_RETURN);
+    EXPECT_TRUE(WaitFor([&] { return !Rows().empty(); }));
+    EXPECT_EQ("Open BIB file", answer.title);
 }
 
 // --- Messages ---
