@@ -1,5 +1,8 @@
 #include "app/MyFrame.h"
 
+#include <algorithm>
+
+#include <wx/button.h>
 #include <wx/config.h>
 #include <wx/display.h>
 #include <wx/menu.h>
@@ -23,6 +26,7 @@
 #include "ui/QListBox.h"
 
 enum { SMALLEST_WINDOW = 512, DEFAULT_PLACE = 50, TOOL_MARGIN = 4, SEARCH_WIDTH = 160 };
+enum { SMALLEST_SEARCH = 80 };
 enum { PLACING_TIME = 500 }; // milliseconds that a window manager may take
 
 // The first row that matches handles the event.
@@ -155,6 +159,8 @@ void MyFrame::OnSize(wxSizeEvent &event)
 {
     if (m_panel)
         m_panel->HoldSash(IsNew());
+    if (m_search)
+        FitSearch();
     CallAfter(&MyFrame::Correct);
     event.Skip();
 }
@@ -221,8 +227,19 @@ void MyFrame::CreateTools()
     AddTool(ID_HELP, "Help", "help-contents", "Help on using Cartulo");
     AddTool(ID_ABOUT, "About", "help-about", "About Cartulo");
     bar->Realize();
+    m_toolsWidth = bar->GetBestSize().x - m_search->GetSize().x;
+    FitSearch();
     UpdateCiteTool();
     m_panel->Update_Tools();
+}
+
+// In a narrow window the search field makes room for the tools: the bar hides what does not fit.
+void MyFrame::FitSearch()
+{
+    int room = GetClientSize().x - m_toolsWidth;
+    int width = std::clamp(room, FromDIP(SMALLEST_SEARCH), FromDIP(SEARCH_WIDTH));
+    if (width != m_search->GetSize().x)
+        m_search->SetSize(width, m_search->GetSize().y);
 }
 
 void MyFrame::UpdateCiteTool()
@@ -279,6 +296,10 @@ void MyFrame::TakeCommand(const char *commandLine)
 
 void MyFrame::OnFind(wxCommandEvent &)
 {
+    if (!Native_IsMapped(m_search)) { // keys would be lost in it
+        ShowStatusError(this, "The window is too narrow for the search field.");
+        return;
+    }
     m_search->SetFocus();
     m_search->SelectAll();
 }
@@ -328,6 +349,12 @@ static int KeyOf(const wxKeyEvent &event)
     }
 }
 
+// Enter presses the button that has the focus, as everywhere.
+static bool IsForButton(int key)
+{
+    return key == WXK_RETURN && dynamic_cast<wxButton *>(wxWindow::FindFocus());
+}
+
 void MyFrame::OnCharHook(wxKeyEvent &event)
 {
     if (GetStatusBar())
@@ -337,6 +364,10 @@ void MyFrame::OnCharHook(wxKeyEvent &event)
         return;
     bool alt = event.AltDown(), ctrl = event.ControlDown();
     int key = KeyOf(event);
+    if (IsForButton(key)) {
+        event.Skip();
+        return;
+    }
     int id = 0;
     key = Frame_ShortcutKey(key, event.GetUnicodeKey(), Native_LatinLetter(event), alt, ctrl);
     const Shortcut *row =

@@ -44,6 +44,7 @@ private:
     void CreateTools();
     void AddTool(int id, const char *label, const char *icon, const char *tip);
     void UpdateCiteTool();
+    void FitSearch();
     void OnQuit(wxCommandEvent &event);
     void OnHelp(wxCommandEvent &event);
     void OnAbout(wxCommandEvent &event);
@@ -64,6 +65,7 @@ private:
     std::unique_ptr<DialogCount> m_dialogs;
     Cartulo *m_panel = nullptr;       // child window; null until it is made and once this is closed
     wxSearchCtrl *m_search = nullptr; // child of the tool bar
+    int m_toolsWidth = 0;             // of the tool bar without the search field
     wxMenu *m_contextMenu = nullptr;  // nobody fills it yet
     bool m_autoSave = true;
     wxRect m_place;        // where the window shall open

@@ -46,6 +46,11 @@ void Native_BringForward(long handle)
         TNSMessage("WARNING: Native_BringForward ", "there is no such window", TNS_WARNING);
 }
 
+bool Native_IsMapped(wxWindow *window)
+{
+    return gtk_widget_get_mapped(GTK_WIDGET(window->GetHandle()));
+}
+
 int Native_LatinLetter(const wxKeyEvent &event)
 {
     // Codes of the three letter rows; every layout leaves them where they are.

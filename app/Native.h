@@ -11,6 +11,9 @@ long Native_WindowHandle(wxTopLevelWindow *window);
 // keyboard. Only asks: the window manager decides. Without such a window, a log line.
 void Native_BringForward(long handle);
 
+// False for a control that the tool bar hides, because there is no room for it.
+bool Native_IsMapped(wxWindow *window);
+
 // The Latin letter, in upper case, that is printed on the key, whatever the keyboard layout makes
 // of it; 0 for other keys.
 int Native_LatinLetter(const wxKeyEvent &event);

@@ -15,7 +15,9 @@
 #include "app/AboutDlg.h"
 #include "app/Companion.h"
 #include "app/Ids.h"
+#include "app/Native.h"
 #include "ui/Cartulo.h"
+#include "ui/QListBox.h"
 
 static const char OneEntry[] = "@book{one, title = {First}}\n";
 static const char Broken[] = "@book{one, title = {First}}\n@book{two\n";
@@ -155,6 +157,41 @@ TEST_F(Frame, HasSmallToolsOtherwise)
     Open("");
     EXPECT_EQ(wxSize(16, 16), frame->GetToolBar()->GetToolBitmapSize());
     EXPECT_TRUE(TakeLog("INFO: Cartulo toolbar size: ").empty());
+}
+
+// 1 when the tool bar shows the search field as a whole.
+static bool ShowsSearch(MyFrame *frame, wxWindow *search)
+{
+    return Native_IsMapped(search) &&
+           search->GetScreenRect().GetRight() <= frame->GetScreenRect().GetRight();
+}
+
+TEST_F(Frame, KeepsItsSearchFieldInTheNarrowestWindow)
+{
+    wxTEST_DIALOG(Open(folder.Write("a.bib", Broken)), // with the tool for messages
+                  ExpectMessages("There are errors in loading BIB files"));
+    ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
+    int width = Search()->GetSize().x;
+    frame->SetSize(frame->GetMinSize());
+    ASSERT_TRUE(WaitFor([this] { return frame->GetSize() == frame->GetMinSize(); }));
+    EXPECT_TRUE(WaitFor([this] { return ShowsSearch(frame, Search()); }));
+    EXPECT_LT(Search()->GetSize().x, width);
+    PressShortcut('F', true, false);
+    EXPECT_EQ("", Status());
+
+    frame->SetSize(900, 600);
+    EXPECT_TRUE(WaitFor([&] { return Search()->GetSize().x == width; }));
+}
+
+TEST_F(Frame, LeavesTheFocusWhereThereIsNoRoomForTheSearchField)
+{
+    ASSERT_EQ(0, mkdir(folder.Path("Cartulo").c_str(), 0700));
+    folder.Write("Cartulo/environment.ini", "[Common]\nTOOLSIZE=100\n");
+    Open(folder.Write("a.bib", OneEntry));
+    ASSERT_TRUE(WaitFor([this] { return !Native_IsMapped(Search()); }));
+    PressShortcut('F', true, false);
+    EXPECT_TRUE(List()->HasFocus());
+    EXPECT_EQ("The window is too narrow for the search field.", Status());
 }
 
 // --- Place and size ---
@@ -405,6 +442,29 @@ TEST_F(Frame, AddsTheMessagesOfACommandToThoseThatAreShown)
     Send(ID_MESSAGES);
     EXPECT_EQ(1, opened);
     EXPECT_TRUE(text.Contains("missing.bib' not found")) << text;
+}
+
+TEST_F(Frame, ShowsThatTheFilesOfTheMessagesAreClosed)
+{
+    std::string other = folder.Write("b.bib", OneEntry);
+    wxTEST_DIALOG(Open(folder.Write("a.bib", Broken)),
+                  ExpectMessages("There are errors in loading BIB files"));
+    AllowDialogs allow;
+    wxString before, after;
+    wxTheApp->CallAfter([&] {
+        Cartulo_Messages *messages = nullptr;
+        for (wxWindow *window : wxTopLevelWindows)
+            messages = messages ? messages : dynamic_cast<Cartulo_Messages *>(window);
+        ASSERT_TRUE(messages);
+        wxTextCtrl *text = dynamic_cast<wxTextCtrl *>(messages->FindWindow(6001));
+        before = text->GetValue();
+        frame->TakeCommand(other.c_str());
+        after = text->GetValue();
+        messages->EndModal(wxID_OK);
+    });
+    Send(ID_MESSAGES);
+    EXPECT_TRUE(before.Contains("a.bib")) << before;
+    EXPECT_FALSE(after.Contains("a.bib")) << after;
 }
 
 // --- Leaving and closing ---
