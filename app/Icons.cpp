@@ -131,13 +131,18 @@ static bool IsVisible(const wxBitmapBundle &picture)
     return false;
 }
 
+static wxBitmapBundle OrNothing(const wxBitmapBundle &picture)
+{
+    return IsVisible(picture) ? picture : wxBitmapBundle();
+}
+
 wxBitmapBundle Icon_LoadFile(const char *path, wxSize size)
 {
     wxString name = path ? wxString(path, *wxConvFileName) : wxString();
     if (name.empty())
         return {};
     wxBitmapBundle picture = HasEnding(name, "svg") ? LoadSvg(name, size) : LoadPixels(name, size);
-    return IsVisible(picture) ? picture : wxBitmapBundle();
+    return OrNothing(picture);
 }
 
 static wxBitmapBundle LoadIcon(const char *name, wxSize size)
@@ -152,8 +157,9 @@ wxBitmapBundle Icon_Load(const char *name, int size, const wxArtID &fallback)
 {
     wxBitmapBundle icon = LoadIcon(name, wxSize(size, size));
     if (!icon.IsOk() && !fallback.empty())
-        icon = wxArtProvider::GetBitmapBundle(fallback, wxART_TOOLBAR, wxSize(size, size));
-    return IsVisible(icon) ? icon : wxBitmapBundle::FromSVG(MISSING, wxSize(size, size));
+        icon =
+            OrNothing(wxArtProvider::GetBitmapBundle(fallback, wxART_TOOLBAR, wxSize(size, size)));
+    return icon.IsOk() ? icon : wxBitmapBundle::FromSVG(MISSING, wxSize(size, size));
 }
 
 wxIconBundle Icon_Program()

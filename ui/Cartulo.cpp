@@ -100,9 +100,6 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     m_list = new QListBox(this, this, ID_INDEX, wxDefaultPosition, wxDefaultSize, wxBORDER_STATIC);
     m_list->Update_Index(nullptr, m_search.c_str());
     CreateEntryPane();
-    m_openPane =
-        CreateBlankPane("To open TeX Bibliography file (BIB) click the button:", OpenButton);
-    m_newPane = CreateBlankPane("To add new enrty click the button:", AddButton);
     Arrange();
     ClearEntry();
     if (m_list->Item(0))
@@ -140,10 +137,11 @@ wxStaticText *Cartulo::CreateHeading(wxWindow *parent, const wxString &text)
     return heading;
 }
 
-// File, type, and the rows of the fields.
+// File, type, and the rows of the fields, as they are needed.
 wxSizer *Cartulo::CreateFieldGrid()
 {
     wxFlexGridSizer *grid = new wxFlexGridSizer(3, wxSize(FromDIP(COLUMN_GAP), 0));
+    m_fields = grid;
     grid->AddGrowableCol(1);
     wxSizerFlags labelPlace = wxSizerFlags().CentreVertical();
     grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "BIB File:"), labelPlace);
@@ -158,20 +156,35 @@ wxSizer *Cartulo::CreateFieldGrid()
     m_type->Disable();
     grid->Add(m_type, wxSizerFlags().Expand());
     grid->AddSpacer(0);
-    for (int i = 0; i < ROW_COUNT; ++i) {
-        FieldRow &row = m_rows[i];
-        row.label = new wxStaticText(m_entryPane, wxID_ANY, "Field:", wxDefaultPosition,
-                                     wxDefaultSize, wxST_ELLIPSIZE_END | wxST_NO_AUTORESIZE);
-        row.value = new wxTextCtrl(m_entryPane, wxID_ANY, "FieldValue");
-        row.value->SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
-        row.value->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
-        row.remove = new xBitmapButton(m_entryPane, ID_REMOVE_ROW + i, "&Delete", "list-remove");
-        row.remove->SetToolTip("Delete the field");
-        grid->Add(row.label, labelPlace);
-        grid->Add(row.value, wxSizerFlags().Expand());
-        grid->Add(row.remove, labelPlace);
-    }
     return grid;
+}
+
+void Cartulo::CreateRow(int index)
+{
+    FieldRow &row = m_rows[index];
+    row.label = new wxStaticText(m_entryPane, wxID_ANY, "Field:", wxDefaultPosition, wxDefaultSize,
+                                 wxST_ELLIPSIZE_END | wxST_NO_AUTORESIZE);
+    row.value = new wxTextCtrl(m_entryPane, wxID_ANY, "FieldValue");
+    row.value->SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
+    row.value->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
+    row.remove = new xBitmapButton(m_entryPane, ID_REMOVE_ROW + index, "&Delete", "list-remove");
+    row.remove->SetToolTip("Delete the field");
+    wxWindow *before = m_type;
+    if (index > 0)
+        before = m_rows[index - 1].remove;
+    row.label->MoveAfterInTabOrder(before);
+    row.value->MoveAfterInTabOrder(row.label);
+    row.remove->MoveAfterInTabOrder(row.value);
+    m_fields->Add(row.label, wxSizerFlags().CentreVertical());
+    m_fields->Add(row.value, wxSizerFlags().Expand());
+    m_fields->Add(row.remove, wxSizerFlags().CentreVertical());
+}
+
+// Most entries have few fields, and controls take their time.
+void Cartulo::CreateRows(int count)
+{
+    for (; m_rowCount < count; ++m_rowCount)
+        CreateRow(m_rowCount);
 }
 
 wxSizer *Cartulo::CreateNewFieldRow()
@@ -236,16 +249,19 @@ wxPanel *Cartulo::CreateBlankPane(const wxString &text, wxWindow *(*createButton
 
 // --- Panes ---
 
-wxWindow *Cartulo::PaneFor(int pane) const
+wxWindow *Cartulo::OpenPane()
 {
-    switch (pane) {
-    case PANE_OPEN:
-        return m_openPane;
-    case PANE_NEW:
-        return m_newPane;
-    default:
-        return m_entryPane;
-    }
+    if (!m_openPane)
+        m_openPane =
+            CreateBlankPane("To open TeX Bibliography file (BIB) click the button:", OpenButton);
+    return m_openPane;
+}
+
+wxWindow *Cartulo::NewPane()
+{
+    if (!m_newPane)
+        m_newPane = CreateBlankPane("To add new enrty click the button:", AddButton);
+    return m_newPane;
 }
 
 // The panes that fit what is open.
@@ -253,18 +269,18 @@ void Cartulo::Arrange()
 {
     int pane = Panel_Pane(m_set.count, int(m_list->GetItemCount()));
     if (pane == PANE_OPEN)
-        ShowAlone(m_openPane);
+        ShowAlone(OpenPane());
     else if (IsSplit())
-        ReplacePane(PaneFor(pane));
+        ReplacePane(pane == PANE_NEW ? NewPane() : m_entryPane);
     else
-        Split(PaneFor(pane));
+        Split(pane == PANE_NEW ? NewPane() : m_entryPane);
     Layout();
 }
 
 void Cartulo::RefreshPane()
 {
     if (IsSplit() && m_set.count > 0)
-        ReplacePane(PaneFor(Panel_Pane(m_set.count, int(m_list->GetItemCount()))));
+        Arrange();
 }
 
 void Cartulo::ShowAlone(wxWindow *pane)
@@ -274,7 +290,8 @@ void Cartulo::ShowAlone(wxWindow *pane)
         Unsplit();
     m_list->Hide();
     m_entryPane->Hide();
-    m_newPane->Hide();
+    if (m_newPane)
+        m_newPane->Hide();
     pane->Show();
     Initialize(pane);
     pane->SetFocus();
@@ -284,7 +301,8 @@ void Cartulo::Split(wxWindow *pane)
 {
     m_list->Show();
     m_list->SetFocus(); // before the button that has it is hidden
-    m_openPane->Hide();
+    if (m_openPane)
+        m_openPane->Hide();
     pane->Show();
     SplitVertically(m_list, pane, FromDIP(SashPosition()));
 }
@@ -652,7 +670,7 @@ void Cartulo::FitRow(int row)
 
 void Cartulo::OnEntryPaneSize(wxSizeEvent &event)
 {
-    for (int i = 0; i < ROW_COUNT && m_rows[i].value->IsShown(); ++i)
+    for (int i = 0; i < m_rowCount && m_rows[i].value->IsShown(); ++i)
         FitRow(i);
     event.Skip();
 }
@@ -678,6 +696,7 @@ void Cartulo::ShowEntry(BibEntry *entry, int file)
     FillTypes();
     m_type->SetSelection(std::max<int>(entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
     int shown = std::min<int>(entry->fieldCount, ROW_COUNT);
+    CreateRows(shown);
     for (int i = 0; i < shown; ++i)
         FillRow(i, &entry->fields[i]);
     ShowMoreFields(entry->fieldCount - shown);
@@ -710,7 +729,7 @@ void Cartulo::ShowMoreFields(int count)
 // Shows the first rows, as many as `count`.
 void Cartulo::ShowRows(int count)
 {
-    for (int i = 0; i < ROW_COUNT; ++i) {
+    for (int i = 0; i < m_rowCount; ++i) {
         FieldRow &row = m_rows[i];
         row.label->Show(i < count);
         row.value->Show(i < count);

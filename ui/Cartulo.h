@@ -69,10 +69,13 @@ private:
     void ReadSchema();
     void CreateEntryPane();
     wxSizer *CreateFieldGrid();
+    void CreateRow(int index);
+    void CreateRows(int count);
     wxSizer *CreateNewFieldRow();
     wxPanel *CreateBlankPane(const wxString &text, wxWindow *(*createButton)(wxWindow *parent));
     wxStaticText *CreateHeading(wxWindow *parent, const wxString &text);
-    wxWindow *PaneFor(int pane) const;
+    wxWindow *OpenPane();
+    wxWindow *NewPane();
     void Split(wxWindow *pane);
     void Arrange();
     void RefreshPane();
@@ -118,12 +121,14 @@ private:
 
     QListBox *m_list = nullptr; // child windows, made after the first files are loaded
     wxScrolledWindow *m_entryPane = nullptr;
-    wxPanel *m_openPane = nullptr;
+    wxPanel *m_openPane = nullptr; // these two when they are needed
     wxPanel *m_newPane = nullptr;
     Cartulo_Messages *m_messages = nullptr; // while it is open
     wxStaticText *m_fileName = nullptr;
     wxChoice *m_type = nullptr;
+    wxSizer *m_fields = nullptr; // of the rows
     FieldRow m_rows[ROW_COUNT] = {};
+    int m_rowCount = 0; // of those that are made
     wxStaticText *m_moreFields = nullptr; // how many fields found no row
     wxStaticText *m_newFieldLabel = nullptr;
     wxComboBox *m_newFieldKey = nullptr;
