@@ -211,7 +211,7 @@ static void SendCommands(const Victim &victim, const std::string &text)
 
 static void NameTheSameFile(const Victim &victim)
 {
-    SendCommands(victim, victim.library);
+    SendCommands(victim, victim.openFile);
 }
 
 static void NameNothing(const Victim &victim)

@@ -9,8 +9,8 @@
 
 struct Victim {
     std::string service;
-    std::string path;    // of its socket
-    std::string library; // a file that it has open
+    std::string path;     // of its socket
+    std::string openFile; // a file that it has open
 };
 
 struct Attack {
