@@ -20,7 +20,6 @@
 #include "app/Native.h"
 #include "app/PlainAnswer.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 #include "store/Sys.h"
 
 wxBEGIN_EVENT_TABLE(MyApp, wxApp)

@@ -20,7 +20,6 @@
 #include "app/Native.h"
 #include "store/Sys.h"
 #include "ui/Cartulo.h"
-#include "ui/DisplayText.h"
 #include "ui/Messages.h"
 #include "ui/MessagesText.h"
 #include "ui/QListBox.h"

@@ -180,11 +180,15 @@ void Cartulo::CreateRow(int index)
     m_fields->Add(row.remove, wxSizerFlags().CentreVertical());
 }
 
-// Most entries have few fields, and controls take their time.
+// Most entries have few fields, and controls take their time. GTK animates a button that is made in
+// a window on the screen into its shape, and tells sizes from amid that: all get that of the first,
+// which is made before.
 void Cartulo::CreateRows(int count)
 {
-    for (; m_rowCount < count; ++m_rowCount)
+    for (; m_rowCount < count; ++m_rowCount) {
         CreateRow(m_rowCount);
+        m_rows[m_rowCount].remove->SetMinSize(m_rows[0].remove->GetBestSize());
+    }
 }
 
 wxSizer *Cartulo::CreateNewFieldRow()
@@ -218,6 +222,7 @@ void Cartulo::CreateEntryPane()
     column->Add(CreateHeading(m_entryPane, "Records of currently selected bibliography entry"),
                 place);
     column->Add(CreateFieldGrid(), place);
+    CreateRows(1);
     m_moreFields = new wxStaticText(m_entryPane, wxID_ANY, "");
     column->Add(m_moreFields, place);
     column->Add(CreateNewFieldRow(), place);

@@ -94,6 +94,7 @@ TEST_F(EditorPanel, HasAButtonForEachField)
         EXPECT_EQ("Delete the field", button->GetToolTipText());
         EXPECT_TRUE(button->IsShown()) << i;
         EXPECT_FALSE(button->IsEnabled()) << i; // not while the list is in use
+        EXPECT_EQ(Panel()->FindWindow(ID_REMOVE_ROW)->GetSize(), button->GetSize()) << i;
     }
 }
 
