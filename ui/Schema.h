@@ -4,7 +4,11 @@
 // hold other things. Read afresh at each use: what the user changes in it counts at once.
 #pragma once
 
+#include <cstddef>
 #include <string>
+#include <vector>
+
+#include "ui/PanelRules.h"
 
 // "/usr/bin/cartulo" gives "/usr/bin/cartulo.ini": the ending of the file name is replaced.
 std::string Schema_IniPath(const char *modulePath);
@@ -18,3 +22,36 @@ std::string Schema_ApplicationName(const char *ini); // "Cartulo" unless the fil
 // Makes the entry types of the file known to the store. A type for which the store has no room is
 // left out, and logged.
 void Schema_RegisterTypes(const char *ini);
+
+// --- Fields ---
+
+enum FieldClass {
+    FIELD_CROSSREF, // `crossref` itself, and fields that the file marks like it
+    FIELD_UNKNOWN,  // not in the type's section
+    FIELD_MANDATORY,
+    FIELD_OPTIONAL
+};
+FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key);
+Colour Schema_FieldColour(FieldClass fieldClass); // of its label, on a light background
+
+// "Custom Entry Type" for a type without a section or description.
+std::string Schema_Description(const char *ini, const char *type);
+
+// The lines of a type's section as Bib_NewEntry wants them: at most 2048 bytes. Ends with two 0.
+void Schema_FieldSpecs(const char *ini, const char *type, char *buffer, size_t size);
+
+// A shown row, as far as the schema is concerned.
+struct SchemaRow {
+    std::string key;
+    bool inherited;
+};
+
+struct SchemaAdvice {
+    std::vector<std::string> proposals; // keys for "Add Field:", in the file's order
+    int selected;                       // index of the first missing one; -1 for none
+    std::string note;                   // "There is missed mandatory field: ...", or ""
+};
+SchemaAdvice Schema_Advise(const char *ini, const char *type, const std::vector<SchemaRow> &rows);
+
+// The help text of the entry pane (store text).
+std::string Schema_HelpText(const char *ini, const char *type, bool editMode);
