@@ -1,6 +1,9 @@
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include <cstdlib>
+#include <string>
+#include <vector>
 
 #include "store/BibStore.h"
 #include "tests/support/LogCapture.h"
@@ -68,4 +71,317 @@ TEST_F(SchemaFile, LeavesOutTypesWithoutRoom)
     Schema_RegisterTypes(ini.c_str());
     EXPECT_EQ(BIB_TYPE_LIMIT, BibTypeCount);
     EXPECT_NE(std::string::npos, log.find("ERROR: No room for the entry type: t124")) << log;
+}
+
+// --- Fields ---
+
+using testing::ElementsAre;
+using testing::IsEmpty;
+
+static const char *const Types = "[article]\n"
+                                 "* = a paper.\n"
+                                 "author = *\n"
+                                 "journal = *\n"
+                                 "volume =\n"
+                                 "doi = digits\n"
+                                 "crossref = *\n"
+                                 "xref = !\n"
+                                 "odd = # of it\n"
+                                 "quoted = \"*\"\n"
+                                 "[other]\n"
+                                 "number = *\n";
+
+class SchemaFieldClass : public SchemaFile
+{
+protected:
+    FieldClass Of(const char *key, const char *type = "article")
+    {
+        return Schema_FieldClass(ini.c_str(), type, key);
+    }
+
+    std::string ini = folder.Write("a.ini", Types);
+};
+
+TEST_F(SchemaFieldClass, FollowsTheFirstCharacterOfTheValue)
+{
+    EXPECT_EQ(FIELD_MANDATORY, Of("author"));
+    EXPECT_EQ(FIELD_OPTIONAL, Of("volume"));
+    EXPECT_EQ(FIELD_OPTIONAL, Of("doi"));
+    EXPECT_EQ(FIELD_CROSSREF, Of("xref"));
+    EXPECT_EQ(FIELD_UNKNOWN, Of("odd"));
+    EXPECT_EQ(FIELD_MANDATORY, Of("quoted"));
+}
+
+TEST_F(SchemaFieldClass, IsUnknownForWhatTheTypeDoesNotList)
+{
+    EXPECT_EQ(FIELD_UNKNOWN, Of("number"));
+    EXPECT_EQ(FIELD_MANDATORY, Of("number", "other"));
+    EXPECT_EQ(FIELD_UNKNOWN, Of("author", "other"));
+    EXPECT_EQ(FIELD_UNKNOWN, Of("author", "missing"));
+}
+
+TEST_F(SchemaFieldClass, IsItsOwnForCrossrefWhateverTheFileSays)
+{
+    EXPECT_EQ(FIELD_CROSSREF, Of("crossref"));
+    EXPECT_EQ(FIELD_CROSSREF, Of("CrossRef", "other"));
+    EXPECT_EQ(FIELD_CROSSREF, Of("crossref", "missing"));
+}
+
+TEST_F(SchemaFieldClass, IgnoresLetterCase)
+{
+    EXPECT_EQ(FIELD_MANDATORY, Of("AUTHOR", "Article"));
+}
+
+TEST_F(SchemaFieldClass, CountsAtOnceWhenTheFileChanges)
+{
+    EXPECT_EQ(FIELD_UNKNOWN, Of("note"));
+    folder.Write("a.ini", "[article]\nnote=\n");
+    EXPECT_EQ(FIELD_OPTIONAL, Of("note"));
+}
+
+TEST(SchemaFieldColour, TellsTheClassesApart)
+{
+    struct {
+        FieldClass fieldClass;
+        int red, green, blue;
+    } const cases[] = {{FIELD_CROSSREF, 128, 0, 0},
+                       {FIELD_UNKNOWN, 0, 128, 0},
+                       {FIELD_MANDATORY, 0, 0, 128},
+                       {FIELD_OPTIONAL, 0, 0, 255}};
+    for (const auto &c : cases) {
+        Colour colour = Schema_FieldColour(c.fieldClass);
+        EXPECT_THAT((std::vector<int>{colour.red, colour.green, colour.blue}),
+                    ElementsAre(c.red, c.green, c.blue));
+    }
+}
+
+TEST_F(SchemaFile, DescribesTypes)
+{
+    std::string ini = folder.Write("a.ini", Types);
+    EXPECT_EQ("a paper.", Schema_Description(ini.c_str(), "Article"));
+    EXPECT_EQ("Custom Entry Type", Schema_Description(ini.c_str(), "other"));
+    EXPECT_EQ("Custom Entry Type", Schema_Description(ini.c_str(), "missing"));
+    EXPECT_EQ("Custom Entry Type", Schema_Description("/no/such/file", "article"));
+}
+
+// The items of a buffer as Bib_NewEntry reads them.
+static std::vector<std::string> Items(const char *buffer)
+{
+    std::vector<std::string> items;
+    for (; *buffer; buffer += items.back().size() + 1)
+        items.push_back(buffer);
+    return items;
+}
+
+TEST_F(SchemaFile, HandsOutTheLinesOfAType)
+{
+    std::string ini = folder.Write("a.ini", "[a]\n*=x\nauthor = *editor\nword\nnote=\n[b]\n");
+    char buffer[2048];
+    Schema_FieldSpecs(ini.c_str(), "A", buffer, sizeof buffer);
+    EXPECT_THAT(Items(buffer), ElementsAre("*=x", "author=*editor", "word", "note="));
+    Schema_FieldSpecs(ini.c_str(), "b", buffer, sizeof buffer);
+    EXPECT_THAT(Items(buffer), IsEmpty());
+    Schema_FieldSpecs(ini.c_str(), "a", buffer, 10);
+    EXPECT_THAT(Items(buffer), ElementsAre("*=x", "auth"));
+}
+
+TEST_F(SchemaFile, HandsOutNoMoreThanTwoKiB)
+{
+    std::string text = "[a]\n";
+    for (int i = 0; i < 500; ++i)
+        text += "number" + std::to_string(100 + i) + "=*\n"; // 12 bytes as read
+    std::string ini = folder.Write("a.ini", text);
+    std::vector<char> buffer(4096, '~');
+    Schema_FieldSpecs(ini.c_str(), "a", buffer.data(), buffer.size());
+    std::vector<std::string> items = Items(buffer.data());
+    ASSERT_EQ(171u, items.size());
+    EXPECT_EQ("number269=*", items[169]);
+    EXPECT_EQ("number", items[170]);
+    EXPECT_EQ(std::string("\0\0~", 3), std::string(&buffer[2046], 3));
+}
+
+// --- Advice ---
+
+class SchemaAdvise : public SchemaFile
+{
+protected:
+    void Write(const std::string &section) { ini = folder.Write("a.ini", "[t]\n" + section); }
+
+    // Rows as "key", or "(key)" for an inherited one.
+    SchemaAdvice Of(const std::vector<std::string> &rows, const char *type = "t")
+    {
+        std::vector<SchemaRow> records;
+        for (const std::string &row : rows) {
+            bool inherited = row[0] == '(';
+            records.push_back({inherited ? row.substr(1, row.size() - 2) : row, inherited});
+        }
+        return Schema_Advise(ini.c_str(), type, records);
+    }
+
+    std::string Note(const std::vector<std::string> &rows) { return Of(rows).note; }
+
+    std::string ini = folder.Path("missing.ini");
+};
+
+TEST_F(SchemaAdvise, ProposesTheFieldsThatAreNotShownInTheFilesOrder)
+{
+    Write("*=x\nyear=*\nauthor=\n*note=*\nword\nxref=!\nvolume=1\n=*\n");
+    EXPECT_THAT(Of({}).proposals, ElementsAre("year", "author", "xref", "volume"));
+    EXPECT_THAT(Of({"Author", "other"}).proposals, ElementsAre("year", "xref", "volume"));
+    EXPECT_THAT(Of({"volume", "year", "xref", "author"}).proposals, IsEmpty());
+}
+
+TEST_F(SchemaAdvise, ProposesInheritedFieldsToo)
+{
+    Write("author=*\nyear=*\nnote=\n");
+    SchemaAdvice advice = Of({"author", "(year)", "(note)"});
+    EXPECT_THAT(advice.proposals, ElementsAre("year", "note"));
+    EXPECT_EQ("", advice.note);
+    EXPECT_EQ(-1, advice.selected);
+}
+
+TEST_F(SchemaAdvise, GoesByTheFirstRowOfAKey)
+{
+    Write("note=\n");
+    EXPECT_THAT(Of({"note", "(note)"}).proposals, IsEmpty());
+    EXPECT_THAT(Of({"(note)", "note"}).proposals, ElementsAre("note"));
+}
+
+TEST_F(SchemaAdvise, SelectsTheFirstMissingField)
+{
+    Write("doi=\nauthor=*\nyear=*\n");
+    EXPECT_EQ(1, Of({}).selected);
+    EXPECT_EQ(1, Of({"author"}).selected);
+    EXPECT_EQ(0, Of({"doi"}).selected);
+    EXPECT_EQ(2, Of({"(author)"}).selected);
+    EXPECT_EQ(-1, Of({"author", "year"}).selected);
+}
+
+TEST_F(SchemaAdvise, JoinsTheMissingFieldsToANote)
+{
+    Write("a=*\nb=*\nn=\nc=*\nd=*\n");
+    EXPECT_EQ("", Note({"a", "b", "c", "d"}));
+    EXPECT_EQ("There is missed mandatory field: `c'.", Note({"a", "b", "d"}));
+    EXPECT_EQ("There are missed mandatory fields: `a' and `d'.", Note({"b", "c"}));
+    EXPECT_EQ("There are missed mandatory fields: `a', `c', and `d'.", Note({"b"}));
+    EXPECT_EQ("There are missed mandatory fields: `a', `b', `c', and `d'.", Note({}));
+}
+
+TEST_F(SchemaAdvise, IsContentWithAnAlternative)
+{
+    Write("author=*editor\neditor=*author\n");
+    EXPECT_EQ("", Note({"editor"}));
+    EXPECT_EQ("", Note({"author"}));
+    EXPECT_EQ("", Note({"EDITOR"}));
+    EXPECT_EQ("", Note({"(author)"}));
+    EXPECT_THAT(Of({"editor"}).proposals, ElementsAre("author"));
+    EXPECT_THAT(Of({"(author)"}).proposals, ElementsAre("author", "editor"));
+}
+
+TEST_F(SchemaAdvise, CountsAPairOfAlternativesOnce)
+{
+    Write("author=*Editor\neditor=*AUTHOR\nyear=*\n");
+    SchemaAdvice advice = Of({"year"});
+    EXPECT_EQ("There is missed mandatory field: `author'/`editor'.", advice.note);
+    EXPECT_THAT(advice.proposals, ElementsAre("author", "editor"));
+    EXPECT_EQ(0, advice.selected);
+    EXPECT_EQ("There are missed mandatory fields: `author'/`editor' and `year'.", Note({}));
+}
+
+TEST_F(SchemaAdvise, CountsAlternativesTwiceWithAnotherMissingBetweenThem)
+{
+    Write("author=*editor\nyear=*\neditor=*author\n");
+    EXPECT_EQ("There is missed mandatory field: `author'/`editor'.", Note({"year"}));
+    EXPECT_EQ("There are missed mandatory fields: `author', `year', and `editor'.", Note({}));
+}
+
+TEST_F(SchemaAdvise, JoinsOnlyWhatNamesTheFieldBefore)
+{
+    Write("a=*b\nb=*\nc=*b\nd=*a\n");
+    EXPECT_EQ("There are missed mandatory fields: `a', `b'/`c', and `d'.", Note({}));
+    EXPECT_EQ("There is missed mandatory field: `b'.", Note({"a", "c"}));
+}
+
+TEST_F(SchemaAdvise, TakesAnAlternativeThatTheTypeDoesNotList)
+{
+    Write("year=*date\n");
+    EXPECT_EQ("", Note({"date"}));
+    EXPECT_EQ("There is missed mandatory field: `year'.", Note({}));
+}
+
+TEST_F(SchemaAdvise, HasNothingToSayOnATypeWithoutASection)
+{
+    for (const char *type : {"unknown", "t"}) { // there is no file yet
+        SchemaAdvice advice = Of({"author"}, type);
+        EXPECT_THAT(advice.proposals, IsEmpty());
+        EXPECT_EQ("", advice.note);
+        EXPECT_EQ(-1, advice.selected);
+    }
+    Write("author=*\n");
+    EXPECT_EQ("", Of({}, "unknown").note);
+    EXPECT_NE("", Of({}, "T").note);
+}
+
+TEST_F(SchemaAdvise, EndsWhereTheSectionIsCut)
+{
+    std::string filler = "* = " + std::string(2000, 'x') + "\n"; // 2003 bytes as read
+    Write(filler + "volume=\ntitle=*\npublisher=*\nyear=*\n");
+    SchemaAdvice advice = Of({});
+    EXPECT_THAT(advice.proposals, ElementsAre("volume", "title", "publisher", "year"));
+
+    filler.insert(4, 16, 'x'); // room for "publisher=*", not for what follows
+    Write(filler + "volume=\ntitle=*\npublisher=*editor\nyear=*\n");
+    advice = Of({});
+    EXPECT_THAT(advice.proposals, ElementsAre("volume", "title", "publisher"));
+    EXPECT_EQ("There are missed mandatory fields: `title' and `publisher'.", advice.note);
+    EXPECT_EQ(Of({"editor"}).note, advice.note) << "the alternative was cut off";
+
+    filler.insert(4, 2, 'x'); // no room for the sign
+    Write(filler + "volume=\ntitle=*\npublisher=*editor\nyear=*\n");
+    EXPECT_THAT(Of({}).proposals, ElementsAre("volume", "title"));
+}
+
+// --- Help ---
+
+TEST_F(SchemaFile, HelpsWithTheList)
+{
+    std::string ini = folder.Write("a.ini", Types);
+    EXPECT_EQ("<Entry List> Mode Accelerators:\n"
+              "\tAlt+E\tEdit an Entry (also ESC) - comes to <Entry Editing> mode,\n"
+              "\tAlt+A\tAdd New Entry\n"
+              "\tAlt+D\tDelete an Entry\n"
+              "\tAlt+N\tRename an Entry\n"
+              "\tAlt+S\tEdit Strings\n"
+              "\tAlt+P\tEdit Preamble\n"
+              "\tAlt+B\tSave Modified BIB files\n"
+              "\tEnter\tInsert proper \\cite command into your document.",
+              Schema_HelpText(ini.c_str(), "article", false));
+}
+
+static const std::string EditingHelp =
+    "<Entry Editing> mode Accelerators:\n"
+    "\tESC\tReturn to <Entry List> mode.\n"
+    "\tAlt+E\tEdits currently selected field in large window.\n"
+    "\tAlt+A\tAdd new Field with key name specified in bottom combo box.\n"
+    "\tAlt+D\tDelete currently selected field.\n"
+    "\tAlt+N\tRename currently selected field (change field key).\n"
+    "\tAlt+S\tEdit Strings. It is useful to insert into a field reference on string.\n"
+    "\tAlt+P\tEdit Preamble.\n"
+    "\tEnter\tInsert proper \\cite command into your document.\n";
+
+TEST_F(SchemaFile, HelpsWithEditing)
+{
+    std::string ini = folder.Write("a.ini", Types);
+    EXPECT_EQ(EditingHelp + "`Article' entry is for a paper.",
+              Schema_HelpText(ini.c_str(), "Article", true));
+    EXPECT_EQ(EditingHelp + "`talk' entry is for Custom Entry Type",
+              Schema_HelpText(ini.c_str(), "talk", true));
+}
+
+TEST_F(SchemaFile, CutsTheHelpWithEditing)
+{
+    std::string prose(2000, 'x');
+    std::string ini = folder.Write("a.ini", "[t]\n* = " + prose + "\n");
+    EXPECT_EQ((EditingHelp + "`t' entry is for " + prose).substr(0, 1023),
+              Schema_HelpText(ini.c_str(), "t", true));
 }

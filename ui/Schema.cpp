@@ -1,14 +1,23 @@
 #include "ui/Schema.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 
 #include "app/Log.h"
+#include "store/Ascii.h"
 #include "store/BibStore.h"
 #include "store/Profile.h"
 #include "store/Sys.h"
 
-enum { SECTION_NAMES_SIZE = 2046, NAME_SIZE = 256 };
+// Of buffers, in bytes with the end: what does not fit is not read.
+enum {
+    SECTION_NAMES_SIZE = 2046,
+    SECTION_SIZE = 2048,
+    VALUE_SIZE = 64,
+    NAME_SIZE = 256,
+    HELP_SIZE = 1024
+};
 
 // The length of the path up to the separator of its last name, with it.
 static size_t FolderLength(const std::string &path)
@@ -63,4 +72,178 @@ void Schema_RegisterTypes(const char *ini)
         else
             AppLog("ERROR: No room for the entry type: ", name);
     }
+}
+
+// --- Fields ---
+
+FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key)
+{
+    if (Ascii_Compare(key, "crossref") == 0)
+        return FIELD_CROSSREF;
+    char value[VALUE_SIZE];
+    Profile_GetString(type, key, "#", value, sizeof value, ini);
+    switch (*value) {
+    case '!':
+        return FIELD_CROSSREF;
+    case '#':
+        return FIELD_UNKNOWN;
+    case '*':
+        return FIELD_MANDATORY;
+    default:
+        return FIELD_OPTIONAL;
+    }
+}
+
+Colour Schema_FieldColour(FieldClass fieldClass)
+{
+    switch (fieldClass) {
+    case FIELD_CROSSREF:
+        return {128, 0, 0};
+    case FIELD_UNKNOWN:
+        return {0, 128, 0};
+    case FIELD_MANDATORY:
+        return {0, 0, 128};
+    case FIELD_OPTIONAL:
+        break;
+    }
+    return {0, 0, 255};
+}
+
+std::string Schema_Description(const char *ini, const char *type)
+{
+    char description[HELP_SIZE];
+    Profile_GetString(type, "*", "Custom Entry Type", description, sizeof description, ini);
+    return description;
+}
+
+void Schema_FieldSpecs(const char *ini, const char *type, char *buffer, size_t size)
+{
+    Profile_GetSection(type, buffer, std::min<size_t>(size, SECTION_SIZE), ini);
+}
+
+// --- Advice ---
+
+namespace
+{
+
+// A field of a type.
+struct FieldSpec {
+    std::string key;
+    bool mandatory;
+    std::string alternative; // the field that does instead; "" for none
+};
+
+} // namespace
+
+// False for a line that names no field.
+static bool ParseSpec(const char *line, FieldSpec *spec)
+{
+    const char *equals = strchr(line, '=');
+    if (*line == '*' || !equals || equals == line)
+        return false;
+    spec->key.assign(line, equals);
+    spec->mandatory = equals[1] == '*';
+    spec->alternative = spec->mandatory ? equals + 2 : "";
+    return true;
+}
+
+static const SchemaRow *FindRow(const std::vector<SchemaRow> &rows, const std::string &key)
+{
+    for (const SchemaRow &row : rows)
+        if (Ascii_Compare(row.key.c_str(), key.c_str()) == 0)
+            return &row;
+    return nullptr;
+}
+
+static std::string Quote(const std::string &key)
+{
+    return "`" + key + "'";
+}
+
+// Two fields of which one is enough count once when their lines follow each other.
+static void AddMissing(std::vector<std::string> *missing, const FieldSpec &spec)
+{
+    bool pair = !missing->empty() && !spec.alternative.empty() &&
+                Ascii_Compare(missing->back().c_str(), Quote(spec.alternative).c_str()) == 0;
+    if (pair)
+        missing->back() += "/" + Quote(spec.key);
+    else
+        missing->push_back(Quote(spec.key));
+}
+
+static void AdviseField(SchemaAdvice *advice, std::vector<std::string> *missing,
+                        const FieldSpec &spec, const std::vector<SchemaRow> &rows)
+{
+    const SchemaRow *row = FindRow(rows, spec.key);
+    if (row && !row->inherited)
+        return;
+    advice->proposals.push_back(spec.key);
+    if (row || !spec.mandatory)
+        return;
+    if (!spec.alternative.empty() && FindRow(rows, spec.alternative))
+        return;
+    if (missing->empty())
+        advice->selected = static_cast<int>(advice->proposals.size()) - 1;
+    AddMissing(missing, spec);
+}
+
+static std::string Note(const std::vector<std::string> &missing)
+{
+    if (missing.empty())
+        return "";
+    if (missing.size() == 1)
+        return "There is missed mandatory field: " + missing[0] + ".";
+    std::string note = "There are missed mandatory fields: " + missing[0];
+    if (missing.size() == 2)
+        return note + " and " + missing[1] + ".";
+    for (size_t i = 1; i + 1 < missing.size(); ++i)
+        note += ", " + missing[i];
+    return note + ", and " + missing.back() + ".";
+}
+
+SchemaAdvice Schema_Advise(const char *ini, const char *type, const std::vector<SchemaRow> &rows)
+{
+    char specs[SECTION_SIZE];
+    Schema_FieldSpecs(ini, type, specs, sizeof specs);
+    SchemaAdvice advice = {{}, -1, ""};
+    std::vector<std::string> missing;
+    FieldSpec spec;
+    for (const char *line = specs; *line; line += strlen(line) + 1)
+        if (ParseSpec(line, &spec))
+            AdviseField(&advice, &missing, spec, rows);
+    advice.note = Note(missing);
+    return advice;
+}
+
+// --- Help ---
+
+static const char ListHelp[] =
+    "<Entry List> Mode Accelerators:\n"
+    "\tAlt+E\tEdit an Entry (also ESC) - comes to <Entry Editing> mode,\n"
+    "\tAlt+A\tAdd New Entry\n"
+    "\tAlt+D\tDelete an Entry\n"
+    "\tAlt+N\tRename an Entry\n"
+    "\tAlt+S\tEdit Strings\n"
+    "\tAlt+P\tEdit Preamble\n"
+    "\tAlt+B\tSave Modified BIB files\n"
+    "\tEnter\tInsert proper \\cite command into your document.";
+
+static const char EditHelp[] =
+    "<Entry Editing> mode Accelerators:\n"
+    "\tESC\tReturn to <Entry List> mode.\n"
+    "\tAlt+E\tEdits currently selected field in large window.\n"
+    "\tAlt+A\tAdd new Field with key name specified in bottom combo box.\n"
+    "\tAlt+D\tDelete currently selected field.\n"
+    "\tAlt+N\tRename currently selected field (change field key).\n"
+    "\tAlt+S\tEdit Strings. It is useful to insert into a field reference on string.\n"
+    "\tAlt+P\tEdit Preamble.\n"
+    "\tEnter\tInsert proper \\cite command into your document.\n";
+
+std::string Schema_HelpText(const char *ini, const char *type, bool editMode)
+{
+    if (!editMode)
+        return ListHelp;
+    std::string text = EditHelp;
+    text.append("`").append(type).append("' entry is for ").append(Schema_Description(ini, type));
+    return text.substr(0, HELP_SIZE - 1);
 }
