@@ -53,3 +53,24 @@ int Bib_StripKeyChars(char *key)
     *out = 0;
     return 1;
 }
+
+static int IsReadable(char c) // as a part of a key
+{
+    int isControl = (c >= 0 && c < 32) || c == 127;
+    return !isControl && c != '\\' && !IsKeyChar(c);
+}
+
+int Bib_IsKey(const char *key)
+{
+    if (!*key)
+        return 0;
+    while (*key && IsReadable(*key))
+        ++key;
+    return *key == 0;
+}
+
+int Bib_IsName(const char *name)
+{
+    int startsWithDigit = *name >= '0' && *name <= '9';
+    return !startsWithDigit && Bib_IsKey(name);
+}

@@ -178,6 +178,12 @@ const char *Bib_CheckValue(const char *value);
 // Removes the characters that no key may hold, "\"#%'(),={} " , in place. Returns 1.
 int Bib_StripKeyChars(char *key);
 
+// 1 when the parser reads it back as it is written: a citation key; the name of a field or of an
+// abbreviation, which does not begin with a digit. Neither is empty or holds one of the characters
+// above, a control character or a backslash.
+int Bib_IsKey(const char *key);
+int Bib_IsName(const char *name);
+
 // --- Small system functions (Sys-posix.cpp) ---
 
 const char *Sys_LastErrorText();     // the system's text for the last error; static buffer
