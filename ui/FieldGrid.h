@@ -3,15 +3,16 @@
 //
 // A row belongs to the entry unless it is inherited: shown from the entry that `crossref` names,
 // for reading only. A row whose text is still what its control held after filling keeps the bytes
-// that are stored, whatever the code page can say of them.
+// that are stored, whatever the code page can say of them; so does a locked one.
+//
+// The grid reads `entry` and `target` as long as it shows them: clear or fill it before they go.
 #pragma once
 
 #include <string>
-#include <vector>
 
 #include "store/BibStore.h"
 
-enum { GRID_ROWS = 16 };
+enum { GRID_ROWS = 16, GRID_NEW_FIELD = -1 };
 
 struct GridRow {
     std::string key;     // store text
@@ -20,6 +21,8 @@ struct GridRow {
     std::wstring text;   // what the control holds now
     bool inherited;
     bool locked;      // the control cannot hold the whole value, so it is kept as stored
+    bool crossref;    // filled with the entry's `crossref`
+    int field;        // the entry's own field that it was filled with, or GRID_NEW_FIELD
     int32_t reserved; // travels with the field (BibField)
 };
 
@@ -42,46 +45,54 @@ const BibEntry *Grid_FindTarget(const BibEntry *entry);
 void Grid_Fill(FieldGrid *grid, const BibEntry *entry);
 void Grid_Clear(FieldGrid *grid);
 
-bool Grid_IsCrossref(const GridRow *row); // its value cannot be edited
+// The row that shows the entry's `crossref`: its value cannot be edited. Not one that the user has
+// added, whose value has to come from somewhere.
+bool Grid_IsCrossref(const GridRow *row);
 
 // --- Editing ---
 
 enum GridAdd { GRID_ADDED, GRID_OVERRIDDEN, GRID_FULL, GRID_EXISTS };
 
 // A row for a key: a new one at the end, or the inherited one, which becomes the entry's own.
-// `*row` is the row.
+// `*row` is that row; untouched when it is GRID_FULL or GRID_EXISTS, as for a field without a row.
 GridAdd Grid_Add(FieldGrid *grid, const char *key, int *row);
 
 enum GridRemove { GRID_REMOVED, GRID_INHERITED, GRID_NO_ROW };
 
 // Takes a row away; what follows moves up. Where the target has the field, the row turns back into
-// an inherited one. Only the first rows, as many as the entry has stored fields, can be removed.
+// an inherited one: it is filled anew, and again the window puts into `filled` and `text` what its
+// control holds. Only the first rows, as many as the entry has stored fields, can be removed.
 GridRemove Grid_Remove(FieldGrid *grid, int row);
 
-// 1 when the name may take the place of the row's key: no shown value reads like it.
+// 1 when the name may take the place of a row's key: no shown value reads like it.
 int Grid_MayRename(const FieldGrid *grid, const char *name);
 void Grid_Rename(FieldGrid *grid, int row, const char *name);
 
-// --- Committing ---
+// --- Committing: of a grid that shows an entry ---
 
 struct GridChanges {
     bool type;
     int added, modified, removed;
 };
 
-// What a commit would change. Adds no name to the tables.
+// What a commit would change. Each row of the entry's own stands for one field: the one that it was
+// filled with, or, under another key, the last one of that key that no other row stands for. Hidden
+// fields do not count. Adds no name to the tables.
 GridChanges Grid_Compare(const FieldGrid *grid, int type);
 bool Grid_HasChanges(const GridChanges *changes);
 
 std::string Grid_Question(const GridChanges *changes); // "There are changes in this entry: ..."
 
-// What a commit would lose, "" for nothing: for each changed row with such characters, its key and
-// the characters that the code page cannot represent, or guillemets, which would become the marks
-// of abbreviations where they do not stand for those.
+// The question before a commit that would lose something; "" when it would not. It names each
+// changed row with
+// - characters that the code page would not bring back;
+// - guillemets, when the value that the row was filled with has some that are text: those would
+//   become the marks of abbreviations. Which of them the user typed cannot be told, so that every
+//   such row asks. Without any in the file, guillemets are what the user types for an abbreviation.
 std::wstring Grid_Losses(const FieldGrid *grid);
 
-// Why a row's value cannot be written as BibTeX (static text); null when it can. Also null for an
-// inherited row.
+// Why a row's value cannot be written as BibTeX, or not be read back (static text); null when all
+// is well. Also null for an inherited row.
 const char *Grid_CheckRow(const FieldGrid *grid, int row);
 
 // 1 when the table of field names has room for the keys of all rows.

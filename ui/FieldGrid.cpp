@@ -1,0 +1,460 @@
+// ui/FieldGrid.cpp - filling, editing, comparing and building the rows of an entry.
+#include "ui/FieldGrid.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <cstring>
+
+#include "encoding/Encoding.h"
+#include "store/Ascii.h"
+
+static bool SameName(const char *a, const char *b)
+{
+    return Ascii_Compare(a, b) == 0;
+}
+
+static const char *NameOf(const BibField *field)
+{
+    return BibFieldTable[field->name];
+}
+
+static const BibField *FindField(const BibEntry *entry, const char *name)
+{
+    for (int i = 0; i < entry->fieldCount; ++i)
+        if (SameName(NameOf(&entry->fields[i]), name))
+            return &entry->fields[i];
+    return nullptr;
+}
+
+static int CountShown(const BibEntry *entry) // fields that get a row
+{
+    return std::min<int>(entry->fieldCount, GRID_ROWS);
+}
+
+// --- Showing ---
+
+const BibEntry *Grid_FindTarget(const BibEntry *entry)
+{
+    const BibField *crossref = FindField(entry, "crossref");
+    const BibEntry *target = crossref ? entry->next : nullptr;
+    while (target && !SameName(target->key, crossref->value))
+        target = target->next;
+    return target;
+}
+
+static void FillRow(GridRow *row, const char *key, const char *value)
+{
+    *row = {};
+    row->key = key;
+    row->stored = value;
+    row->text = Enc_ToUnicode(row->filled, value);
+    row->field = GRID_NEW_FIELD;
+}
+
+static void FillOwnRow(GridRow *row, const BibEntry *entry, int index)
+{
+    const BibField *field = &entry->fields[index];
+    FillRow(row, NameOf(field), field->value);
+    row->crossref = SameName(NameOf(field), "crossref");
+    row->field = index;
+    row->reserved = field->companion;
+}
+
+static void FillInheritedRow(GridRow *row, const BibField *field)
+{
+    FillRow(row, NameOf(field), field->value);
+    row->inherited = true;
+}
+
+static void FillInheritedRows(FieldGrid *grid)
+{
+    for (int i = 0; i < grid->target->fieldCount && grid->count < GRID_ROWS; ++i) {
+        const BibField *field = &grid->target->fields[i];
+        if (!FindField(grid->entry, NameOf(field)))
+            FillInheritedRow(&grid->rows[grid->count++], field);
+    }
+}
+
+void Grid_Fill(FieldGrid *grid, const BibEntry *entry)
+{
+    Grid_Clear(grid);
+    grid->entry = entry;
+    grid->target = Grid_FindTarget(entry);
+    grid->count = CountShown(entry);
+    grid->hidden = entry->fieldCount - grid->count;
+    for (int i = 0; i < grid->count; ++i)
+        FillOwnRow(&grid->rows[i], entry, i);
+    if (grid->target)
+        FillInheritedRows(grid);
+}
+
+void Grid_Clear(FieldGrid *grid)
+{
+    *grid = {};
+}
+
+bool Grid_IsCrossref(const GridRow *row)
+{
+    return row->crossref;
+}
+
+// --- Editing ---
+
+static bool IsHidden(const FieldGrid *grid, const char *key)
+{
+    for (int i = CountShown(grid->entry); i < grid->entry->fieldCount; ++i)
+        if (SameName(NameOf(&grid->entry->fields[i]), key))
+            return true;
+    return false;
+}
+
+static int FindLastRow(const FieldGrid *grid, const char *key)
+{
+    int row = grid->count - 1;
+    while (row >= 0 && !SameName(grid->rows[row].key.c_str(), key))
+        --row;
+    return row;
+}
+
+GridAdd Grid_Add(FieldGrid *grid, const char *key, int *row)
+{
+    int found = FindLastRow(grid, key);
+    if (found >= 0 && grid->rows[found].inherited) {
+        grid->rows[found].inherited = false;
+        *row = found;
+        return GRID_OVERRIDDEN;
+    }
+    if (found >= 0 || IsHidden(grid, key))
+        return GRID_EXISTS;
+    if (grid->count == GRID_ROWS)
+        return GRID_FULL;
+    *row = grid->count++;
+    FillRow(&grid->rows[*row], key, "");
+    return GRID_ADDED;
+}
+
+GridRemove Grid_Remove(FieldGrid *grid, int row)
+{
+    if (row < 0 || row >= grid->count || row >= grid->entry->fieldCount)
+        return GRID_NO_ROW;
+    const char *key = grid->rows[row].key.c_str();
+    const BibField *inherited = grid->target ? FindField(grid->target, key) : nullptr;
+    if (inherited) {
+        FillInheritedRow(&grid->rows[row], inherited);
+        return GRID_INHERITED;
+    }
+    std::move(grid->rows + row + 1, grid->rows + grid->count, grid->rows + row);
+    grid->rows[--grid->count] = {};
+    return GRID_REMOVED;
+}
+
+static bool SameLetter(wchar_t a, wchar_t b)
+{
+    auto lower = [](wchar_t c) { return c >= L'A' && c <= L'Z' ? c + (L'a' - L'A') : c; };
+    return lower(a) == lower(b);
+}
+
+int Grid_MayRename(const FieldGrid *grid, const char *name)
+{
+    std::wstring shown;
+    Enc_ToUnicode(shown, name);
+    for (int i = 0; i < grid->count; ++i) {
+        const std::wstring &text = grid->rows[i].text;
+        if (std::equal(text.begin(), text.end(), shown.begin(), shown.end(), SameLetter))
+            return 0;
+    }
+    return 1;
+}
+
+void Grid_Rename(FieldGrid *grid, int row, const char *name)
+{
+    grid->rows[row].key = name;
+}
+
+// --- What the rows amount to ---
+
+static bool IsChanged(const GridRow *row)
+{
+    return !row->inherited && !row->locked && row->text != row->filled;
+}
+
+static std::string ValueOf(const GridRow *row)
+{
+    if (!IsChanged(row))
+        return row->stored;
+    std::string value(row->text.size() + 1, 0);
+    value.resize(strlen(Enc_FromUnicode(value.data(), row->text.c_str())));
+    return value;
+}
+
+// A heap copy of that; null when memory is out.
+static char *CopyValue(const GridRow *row)
+{
+    if (!IsChanged(row))
+        return Bib_CopyText(row->stored.data(), row->stored.size());
+    char *buffer = static_cast<char *>(Bib_Alloc(row->text.size() + 1));
+    return buffer ? Enc_FromUnicode(buffer, row->text.c_str()) : nullptr;
+}
+
+static int CountOwnRows(const FieldGrid *grid)
+{
+    return static_cast<int>(std::count_if(grid->rows, grid->rows + grid->count,
+                                          [](const GridRow &row) { return !row.inherited; }));
+}
+
+// --- Comparing ---
+
+// Which field each row stands for, and which fields are taken.
+struct Match {
+    int fields[GRID_ROWS]; // by row; GRID_NEW_FIELD for none
+    bool taken[GRID_ROWS]; // by field
+};
+
+static void Take(Match *match, int row, int field)
+{
+    match->fields[row] = field;
+    if (field != GRID_NEW_FIELD)
+        match->taken[field] = true;
+}
+
+static bool IsNamed(const BibEntry *entry, int field, const GridRow *row)
+{
+    return SameName(NameOf(&entry->fields[field]), row->key.c_str());
+}
+
+static int FindFreeField(const BibEntry *entry, const Match *match, const GridRow *row)
+{
+    int field = CountShown(entry) - 1;
+    while (field >= 0 && (match->taken[field] || !IsNamed(entry, field, row)))
+        --field;
+    return field >= 0 ? field : GRID_NEW_FIELD;
+}
+
+// Rows that still have their key come first: they keep their field when it has a namesake.
+static Match MatchRows(const FieldGrid *grid)
+{
+    Match match = {};
+    for (int i = 0; i < grid->count; ++i) {
+        const GridRow *row = &grid->rows[i];
+        bool keepsKey = row->field != GRID_NEW_FIELD && IsNamed(grid->entry, row->field, row);
+        Take(&match, i, keepsKey ? row->field : GRID_NEW_FIELD);
+    }
+    for (int i = 0; i < grid->count; ++i)
+        if (match.fields[i] == GRID_NEW_FIELD && !grid->rows[i].inherited)
+            Take(&match, i, FindFreeField(grid->entry, &match, &grid->rows[i]));
+    return match;
+}
+
+GridChanges Grid_Compare(const FieldGrid *grid, int type)
+{
+    GridChanges changes = {};
+    changes.type = type != grid->entry->type;
+    Match match = MatchRows(grid);
+    for (int i = 0; i < grid->count; ++i) {
+        if (grid->rows[i].inherited)
+            continue;
+        int field = match.fields[i];
+        if (field == GRID_NEW_FIELD)
+            ++changes.added;
+        else if (ValueOf(&grid->rows[i]) != grid->entry->fields[field].value)
+            ++changes.modified;
+    }
+    changes.removed = CountShown(grid->entry) - CountOwnRows(grid) + changes.added;
+    return changes;
+}
+
+bool Grid_HasChanges(const GridChanges *changes)
+{
+    return changes->type || changes->added || changes->modified || changes->removed;
+}
+
+std::string Grid_Question(const GridChanges *changes)
+{
+    char text[256];
+    snprintf(text, sizeof text,
+             "There are changes in this entry:\n\n"
+             "\tmodified type: \t%s\n"
+             "\tadded fields: \t%d\n"
+             "\tmodified fields: \t%d\n"
+             "\tremoved fields: \t%d\n"
+             "\nDo you want to accept these changes ?",
+             changes->type ? "YES" : "NO", changes->added, changes->modified, changes->removed);
+    return text;
+}
+
+// --- Losses ---
+
+static bool IsGuillemet(uint32_t c)
+{
+    return c == 0xAB || c == 0xBB;
+}
+
+static bool HoldsGuillemets(const std::wstring &text)
+{
+    return std::any_of(text.begin(), text.end(),
+                       [](wchar_t c) { return IsGuillemet(static_cast<uint32_t>(c)); });
+}
+
+// As text, not as what marks are shown as.
+static bool StoresGuillemets(const std::string &value)
+{
+    const uint32_t *map = Enc_Current()->map;
+    return std::any_of(value.begin(), value.end(), [map](char c) {
+        return c != BIB_OPEN_ABBREVIATION && c != BIB_CLOSE_ABBREVIATION &&
+               IsGuillemet(map[static_cast<unsigned char>(c)]);
+    });
+}
+
+// Each once, in order.
+static std::wstring LostCharacters(const GridRow *row)
+{
+    std::wstring back, lost;
+    Enc_ToUnicode(back, ValueOf(row).c_str());
+    for (size_t i = 0; i < back.size(); ++i)
+        if (back[i] != row->text[i] && lost.find(row->text[i]) == lost.npos)
+            lost += row->text[i];
+    return lost;
+}
+
+static std::wstring Visible(wchar_t c)
+{
+    bool isControl = c < 32 || (c >= 127 && c < 160);
+    if (!isControl)
+        return std::wstring(1, c);
+    wchar_t name[16];
+    swprintf(name, sizeof name / sizeof *name, L"U+%04X", static_cast<unsigned>(c));
+    return name;
+}
+
+// The first of them, with blanks between.
+static std::wstring List(const std::wstring &characters)
+{
+    static const size_t most = 20;
+    std::wstring list;
+    for (size_t i = 0; i < characters.size() && i < most; ++i)
+        list += (i > 0 ? L" " : L"") + Visible(characters[i]);
+    return characters.size() > most ? list + L" ..." : list;
+}
+
+static std::wstring RowLosses(const GridRow *row)
+{
+    std::wstring key, page, text;
+    Enc_ToUnicode(key, row->key.c_str());
+    Enc_ToUnicode(page, Enc_Current()->name);
+    std::wstring lost = LostCharacters(row);
+    if (!lost.empty())
+        text += L"`" + key + L"': " + List(lost) + L" can't be stored in " + page + L".\n";
+    if (StoresGuillemets(row->stored) && HoldsGuillemets(row->text))
+        text += L"`" + key +
+                L"': \xAB and \xBB can't be stored as text, they would mark an "
+                L"abbreviation.\n";
+    return text;
+}
+
+std::wstring Grid_Losses(const FieldGrid *grid)
+{
+    std::wstring text;
+    for (int i = 0; i < grid->count; ++i)
+        if (IsChanged(&grid->rows[i]))
+            text += RowLosses(&grid->rows[i]);
+    return text.empty() ? text : text + L"\nDo you want to accept these changes nevertheless ?";
+}
+
+// --- Checking ---
+
+static bool HasReadableNames(const std::string &value)
+{
+    for (size_t open = value.find(BIB_OPEN_ABBREVIATION); open != value.npos;
+         open = value.find(BIB_OPEN_ABBREVIATION, open + 1)) {
+        size_t close = value.find(BIB_CLOSE_ABBREVIATION, open);
+        if (!Bib_IsName(value.substr(open + 1, close - open - 1).c_str()))
+            return false;
+    }
+    return true;
+}
+
+const char *Grid_CheckRow(const FieldGrid *grid, int row)
+{
+    const GridRow *checked = &grid->rows[row];
+    if (checked->inherited)
+        return nullptr;
+    std::string value = ValueOf(checked);
+    const char *reason = Bib_CheckValue(value.c_str());
+    if (!reason && IsChanged(checked) && !HasReadableNames(value))
+        reason = "The name of an abbreviation is missing, begins with a digit, or holds a "
+                 "backslash or a control character";
+    return reason;
+}
+
+static bool IsKnownName(const char *name)
+{
+    return std::any_of(BibFieldTable, BibFieldTable + BibFieldCount,
+                       [name](const char *known) { return SameName(known, name); });
+}
+
+// The key of row i is in the table already, or an earlier row brings it there.
+static bool NeedsNoRoom(const FieldGrid *grid, int i)
+{
+    const char *key = grid->rows[i].key.c_str();
+    return IsKnownName(key) || std::any_of(grid->rows, grid->rows + i, [key](const GridRow &row) {
+               return SameName(row.key.c_str(), key);
+           });
+}
+
+int Grid_HasRoom(const FieldGrid *grid)
+{
+    int names = BibFieldCount;
+    for (int i = 0; i < grid->count; ++i)
+        names += !NeedsNoRoom(grid, i);
+    return names <= BIB_FIELD_LIMIT;
+}
+
+// --- Building ---
+
+// 1, or 0 when memory is out: some values are null then.
+static int BuildFields(BibField *field, const FieldGrid *grid)
+{
+    int complete = 1;
+    for (int i = 0; i < grid->count; ++i) {
+        const GridRow *row = &grid->rows[i];
+        if (row->inherited)
+            continue;
+        *field = {Bib_FieldIndex(row->key.c_str()), row->reserved, CopyValue(row)};
+        complete &= field++->value != nullptr;
+    }
+    for (int i = CountShown(grid->entry); i < grid->entry->fieldCount; ++i) {
+        const BibField *hidden = &grid->entry->fields[i];
+        *field = {hidden->name, hidden->companion,
+                  Bib_CopyText(hidden->value, strlen(hidden->value))};
+        complete &= field++->value != nullptr;
+    }
+    return complete;
+}
+
+BibEntry *Grid_Build(const FieldGrid *grid, int type)
+{
+    BibEntry *entry = Bib_AllocEntry(CountOwnRows(grid) + grid->hidden);
+    if (!entry)
+        return nullptr;
+    entry->type = type;
+    entry->reserved = grid->entry->reserved;
+    entry->key = Bib_CopyText(grid->entry->key, strlen(grid->entry->key));
+    int complete = BuildFields(entry->fields, grid);
+    if (complete && entry->key)
+        return entry;
+    Bib_FreeEntry(entry);
+    return nullptr;
+}
+
+int Grid_Replace(BibFile *file, BibEntry *old, BibEntry *entry)
+{
+    BibEntry **link = &file->entries;
+    while (*link && *link != old)
+        link = &(*link)->next;
+    if (!*link)
+        return 0;
+    entry->next = old->next;
+    *link = entry;
+    Bib_FreeEntry(old);
+    return 1;
+}
