@@ -2,32 +2,63 @@
 #pragma once
 
 #include <string>
+#include <vector>
 
 #include "store/BibFileSet.h"
+#include "ui/EntryIndex.h"
+
+// --- Where a new entry may go ---
+
+// The indices of the files that may be written, in order; a record that is listed twice counts
+// once.
+std::vector<int> Entry_WritableFiles(const BibFileSet *set);
+
+// What tells a file from the others of `files`: its base name; with its path where that is not
+// enough (text of the system).
+std::string Entry_FileLabel(const BibFileSet *set, const std::vector<int> &files, int file);
+
+// 1 when it may become the parent of a new entry of its file: there is one (null: none), it has no
+// parent itself, and the file may be written.
+int Entry_MayBeParent(const BibFile *file, const BibEntry *entry);
+
+// --- Keys ---
 
 enum KeyVerdict {
     KEY_OK,
     KEY_EMPTY,
     KEY_BAD_CHARS,      // holds characters that no key may hold; Bib_StripKeyChars removes them
     KEY_UNWRITABLE,     // the parser would not read it back
+    KEY_NO_FILE,        // nowhere to put it
     KEY_SAME,           // the entry has it already
-    KEY_TAKEN,          // by another entry of the file
+    KEY_TAKEN,          // by an entry of the file; also by the renamed one, in other letter case
     KEY_TAKEN_ELSEWHERE // by an entry of another file: the user may want that
 };
 
-// A key as it was typed, without characters of code 32 and below.
-std::string Entry_TypedKey(const char *typed);
+// A key as it was typed, as store text without characters of code 32 and below.
+std::string Entry_TypedKey(const wchar_t *typed);
+
+// 0 when it holds characters that the selected code page lacks: Entry_TypedKey has others for them.
+int Entry_KeyFits(const wchar_t *typed);
 
 KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const char *key);
-KeyVerdict Entry_CheckRename(const BibFileSet *set, int file, const BibEntry *entry,
+KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const BibEntry *entry,
                              const char *key);
 
-// The first file of that base name, ignoring case; null for none.
-BibFile *Entry_FindFile(const BibFileSet *set, const char *baseName);
+// --- New entries ---
 
-// A new entry at the head of the file; `crossref` (null: none) is the key of its parent.
+// The fields of an entry that refers to another one, as Bib_NewEntry wants them.
+extern const char Entry_ChildSpecs[];
+
+// Why a new entry can't be of this type ("" for none) with the mandatory fields of `specs`; "" when
+// it can. Without this check, Entry_Create may end the process.
+std::string Entry_CheckType(const char *typeName, const char *specs);
+
+// A new entry at the head of the file. When its first field is `crossref`, that names `parent`
+// (null: none). Null when memory is out.
 BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, const char *specs,
-                       const char *crossref);
+                       const BibEntry *parent);
+
+// --- Changes ---
 
 // Renames the entry and the `crossref` fields of the entries before it in its file.
 void Entry_Rename(BibFile *file, BibEntry *entry, const char *key);
@@ -36,5 +67,9 @@ void Entry_Rename(BibFile *file, BibEntry *entry, const char *key);
 // for none.
 std::string Entry_Referrers(const BibFile *file, const BibEntry *entry);
 
-// Unlinks and frees. 0 when the entry is not of that file.
+// Unlinks and frees. 0, logged, when the entry is not of that file.
 int Entry_Remove(BibFile *file, BibEntry *entry);
+
+// The entry to select when that of `row` is gone: the one after it in the list, else the one
+// before it; null for none.
+BibEntry *Entry_NextInList(const IndexItem *index, int count, int row);

@@ -1,0 +1,410 @@
+#include "ui/EntryRules.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "encoding/Encoding.h"
+#include "store/Sys.h"
+#include "tests/support/LogWatch.h"
+#include "tests/support/TempFolder.h"
+#include "ui/Schema.h"
+
+using testing::ElementsAre;
+using testing::HasSubstr;
+using testing::IsEmpty;
+
+namespace
+{
+
+class EntryRules : public testing::Test
+{
+protected:
+    void SetUp() override { Bib_Initialize(); }
+    void TearDown() override { FileSet_Free(&set); }
+
+    BibFile *Open(const std::string &name, const std::string &text)
+    {
+        int errors = FileSet_Open(&set, folder.Write(name, text).c_str());
+        EXPECT_EQ(0, errors) << name;
+        return set.files[set.count - 1];
+    }
+
+    std::string Saved(BibFile *file, const std::string &name)
+    {
+        EXPECT_EQ(1, FileSet_SaveOne(&set, file));
+        return folder.Read(name);
+    }
+
+    static BibEntry *Find(const BibFile *file, const std::string &key)
+    {
+        for (BibEntry *entry = file->entries; entry; entry = entry->next)
+            if (key == entry->key)
+                return entry;
+        ADD_FAILURE() << "no entry " << key;
+        return nullptr;
+    }
+
+    static std::string Keys(const BibFile *file)
+    {
+        std::string keys;
+        for (const BibEntry *entry = file->entries; entry; entry = entry->next)
+            keys += std::string(entry->key) + " ";
+        return keys;
+    }
+
+    LogWatch log; // before anything is logged
+    TempFolder folder;
+    BibFileSet set = {};
+};
+
+using EntryFiles = EntryRules;
+using EntryKeys = EntryRules;
+using NewEntry = EntryRules;
+using RenamedEntry = EntryRules;
+using RemovedEntry = EntryRules;
+
+const std::string Talks = "@misc{Griske84, note = {Talk}}\n";
+const std::string Books = "@book{Ost77, title = {East}}\n";
+
+// Children before their parent, one child behind it, and one whose parent is another entry.
+const std::string Family = "@inbook{first, crossref = {PARENT}}\n"
+                           "@inbook{second, pages = {7}, crossref = {parent}}\n"
+                           "@inbook{stranger, crossref = {parents}}\n"
+                           "@book{lonely, title = {L}}\n"
+                           "@book{parent, title = {P}}\n"
+                           "@inbook{last, crossref = {parent}}\n";
+
+} // namespace
+
+// --- Files ---
+
+TEST_F(EntryFiles, AreTheWritableOnesInTheirOrder)
+{
+    Open("a.bib", Talks);
+    Open("b.bib", Books)->readOnly = 1;
+    Open("c.bib", "");
+    EXPECT_THAT(Entry_WritableFiles(&set), ElementsAre(0, 2));
+}
+
+TEST_F(EntryFiles, CountOnceWhereTheyAreListedTwice)
+{
+    BibFile *file = Open("a.bib", Talks);
+    FileSet_Append(&set, file);
+    EXPECT_THAT(Entry_WritableFiles(&set), ElementsAre(0));
+}
+
+TEST_F(EntryFiles, AreCalledByTheirBaseNames)
+{
+    Open("refs.bib", Talks);
+    Open("R&D.2020.bib", Books);
+    std::vector<int> files = Entry_WritableFiles(&set);
+    EXPECT_EQ("refs", Entry_FileLabel(&set, files, 0));
+    EXPECT_EQ("R&D", Entry_FileLabel(&set, files, 1));
+}
+
+TEST_F(EntryFiles, AreToldApartByTheirPathsWhereNeeded)
+{
+    Open("refs.2020.bib", Talks);
+    Open("Refs.2021.bib", Books);
+    Open(".bib", "");
+    std::vector<int> files = Entry_WritableFiles(&set);
+    EXPECT_EQ("refs (" + folder.Path("refs.2020.bib") + ")", Entry_FileLabel(&set, files, 0));
+    EXPECT_EQ("Refs (" + folder.Path("Refs.2021.bib") + ")", Entry_FileLabel(&set, files, 1));
+    EXPECT_EQ(" (" + folder.Path(".bib") + ")", Entry_FileLabel(&set, files, 2));
+}
+
+TEST_F(EntryFiles, HoldParentsThatHaveNoneThemselves)
+{
+    BibFile *file = Open("a.bib", Family);
+    EXPECT_TRUE(Entry_MayBeParent(file, Find(file, "parent")));
+    EXPECT_FALSE(Entry_MayBeParent(file, Find(file, "second")));
+    EXPECT_FALSE(Entry_MayBeParent(file, nullptr));
+    EXPECT_FALSE(Entry_MayBeParent(nullptr, nullptr));
+    file->readOnly = 1;
+    EXPECT_FALSE(Entry_MayBeParent(file, Find(file, "parent")));
+}
+
+// --- Keys ---
+
+TEST_F(EntryKeys, LoseBlanksAndControlCharacters)
+{
+    EXPECT_EQ("mykey", Entry_TypedKey(L" my key\t\n\x01"));
+    EXPECT_EQ("", Entry_TypedKey(L" \t "));
+    EXPECT_EQ("a{b}", Entry_TypedKey(L"a{b}"));
+    EXPECT_EQ("mark", Entry_TypedKey(L"\u00ABmark\u00BB")); // marks of abbreviations
+}
+
+TEST_F(EntryKeys, AreTextOfTheCodePage)
+{
+    EXPECT_EQ("M\xFCller", Entry_TypedKey(L"M\u00FCller"));
+    EXPECT_TRUE(Entry_KeyFits(L"M\u00FCller \u00FF"));
+    EXPECT_FALSE(Entry_KeyFits(L"\u0141ukasz"));
+    EXPECT_FALSE(Entry_KeyFits(L"a\U0001F600"));
+    Enc_Select("CP1250");
+    EXPECT_TRUE(Entry_KeyFits(L"\u0141ukasz"));
+    EXPECT_FALSE(Entry_KeyFits(L"\u00FF"));
+}
+
+TEST_F(EntryKeys, ForNewEntries)
+{
+    BibFile *talks = Open("talks.bib", Talks), *books = Open("books.bib", Books);
+    struct {
+        const char *key;
+        const BibFile *target;
+        KeyVerdict verdict;
+    } const rows[] = {{"new1", talks, KEY_OK},
+                      {"", talks, KEY_EMPTY},
+                      {"", nullptr, KEY_EMPTY},
+                      {"a{b", talks, KEY_BAD_CHARS},
+                      {"a#b", nullptr, KEY_BAD_CHARS},
+                      {"Griske84'", talks, KEY_BAD_CHARS},
+                      {"a\\b", talks, KEY_UNWRITABLE},
+                      {"a\x7F", talks, KEY_UNWRITABLE},
+                      {"84", talks, KEY_OK},
+                      {"M\xFCller", talks, KEY_OK},
+                      {"new1", nullptr, KEY_NO_FILE},
+                      {"Griske84", talks, KEY_TAKEN},
+                      {"gRISKE84", talks, KEY_TAKEN},
+                      {"Griske8", talks, KEY_OK},
+                      {"griske84", books, KEY_TAKEN_ELSEWHERE},
+                      {"ost77", talks, KEY_TAKEN_ELSEWHERE}};
+    for (const auto &row : rows)
+        EXPECT_EQ(row.verdict, Entry_CheckNewKey(&set, row.target, row.key)) << row.key;
+}
+
+TEST_F(EntryKeys, AreRefusedForEveryCharacterOfTheBlacklist)
+{
+    BibFile *file = Open("a.bib", "");
+    for (char c : std::string("\"#%'(),={} ")) {
+        std::string key = std::string("a") + c + "b";
+        EXPECT_EQ(KEY_BAD_CHARS, Entry_CheckNewKey(&set, file, key.c_str())) << key;
+        Bib_StripKeyChars(key.data());
+        EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, file, key.c_str())) << key;
+    }
+}
+
+TEST_F(EntryKeys, OfAFileThatIsListedTwiceAreNotTakenElsewhere)
+{
+    BibFile *file = Open("a.bib", Talks);
+    FileSet_Append(&set, file);
+    EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, file, "new1"));
+    EXPECT_EQ(KEY_TAKEN, Entry_CheckNewKey(&set, file, "Griske84"));
+}
+
+TEST_F(EntryKeys, ForRenamedEntries)
+{
+    BibFile *talks = Open("talks.bib", Talks + "@misc{other, note = {N}}\n");
+    Open("books.bib", Books);
+    const BibEntry *entry = Find(talks, "Griske84");
+    struct {
+        const char *key;
+        KeyVerdict verdict;
+    } const rows[] = {{"new1", KEY_OK},       {"", KEY_EMPTY},
+                      {"a=b", KEY_BAD_CHARS}, {"a\\b", KEY_UNWRITABLE},
+                      {"Griske84", KEY_SAME}, {"griske84", KEY_TAKEN},
+                      {"OTHER", KEY_TAKEN},   {"ost77", KEY_TAKEN_ELSEWHERE}};
+    for (const auto &row : rows)
+        EXPECT_EQ(row.verdict, Entry_CheckRename(&set, talks, entry, row.key)) << row.key;
+}
+
+// --- New entries ---
+
+TEST_F(NewEntry, HasTheMandatoryFieldsOfItsType)
+{
+    BibFile *file = Open("a.bib", Talks);
+    std::string ini = folder.Write("types.ini", "[talk]\n*=A talk\nauthor=*editor\neditor=*author\n"
+                                                "note=\nTitle=*\n");
+    char specs[2048];
+    Schema_FieldSpecs(ini.c_str(), "talk", specs, sizeof specs);
+    ASSERT_EQ("", Entry_CheckType("talk", specs));
+    BibEntry *entry = Entry_Create(file, "new1", "talk", specs, nullptr);
+    EXPECT_EQ(entry, file->entries);
+    EXPECT_EQ("@talk{new1,\n\tauthor = {},\n\teditor = {},\n\tTitle = {}\n}\n"
+              "@misc{Griske84,\n\tnote = {Talk}\n}\n",
+              Saved(file, "a.bib"));
+}
+
+TEST_F(NewEntry, HasNoFieldsWhereItsTypeIsNotDescribed)
+{
+    BibFile *file = Open("a.bib", Talks);
+    char specs[2048];
+    Schema_FieldSpecs(folder.Path("none.ini").c_str(), "misc", specs, sizeof specs);
+    ASSERT_EQ("", Entry_CheckType("misc", specs));
+    EXPECT_EQ(0, Entry_Create(file, "new1", "misc", specs, nullptr)->fieldCount);
+    EXPECT_EQ("new1 Griske84 ", Keys(file));
+}
+
+TEST_F(NewEntry, RefersToItsParent)
+{
+    BibFile *file = Open("a.bib", Family);
+    ASSERT_EQ("", Entry_CheckType("inbook", Entry_ChildSpecs));
+    BibEntry *entry = Entry_Create(file, "child", "inbook", Entry_ChildSpecs, Find(file, "parent"));
+    ASSERT_EQ(1, entry->fieldCount);
+    EXPECT_STREQ("crossref", BibFieldTable[entry->fields[0].name]);
+    EXPECT_STREQ("parent", entry->fields[0].value);
+    EXPECT_NE(Find(file, "parent")->key, entry->fields[0].value);
+    EXPECT_EQ("child first second stranger lonely parent last ", Keys(file));
+}
+
+TEST_F(NewEntry, RefersToNothingWhereItsFirstFieldIsAnother)
+{
+    BibFile *file = Open("a.bib", Talks);
+    const char specs[] = "title=*\0crossref=*\0";
+    BibEntry *entry = Entry_Create(file, "child", "misc", specs, file->entries);
+    EXPECT_STREQ("", entry->fields[0].value);
+    EXPECT_STREQ("", entry->fields[1].value);
+}
+
+TEST_F(NewEntry, NeedsAType)
+{
+    EXPECT_THAT(Entry_CheckType("", ""), HasSubstr("no type"));
+    EXPECT_THAT(Entry_CheckType("my type", ""), HasSubstr("`my type'"));
+    EXPECT_THAT(Entry_CheckType("1type", ""), HasSubstr("`1type'"));
+}
+
+TEST_F(NewEntry, NeedsFieldsThatCanBeWritten)
+{
+    EXPECT_THAT(Entry_CheckType("misc", "title=*\0end page=*\0"), HasSubstr("`end page'"));
+    EXPECT_EQ("", Entry_CheckType("misc", "title=*\0end page=\0*x y=*\0=*\0"));
+}
+
+TEST_F(NewEntry, NeedsRoomForTheNamesOfItsFields)
+{
+    const char specs[] = "new1=*\0new2=*\0F7=*\0note=\0";
+    for (int i = 0; i < BIB_FIELD_LIMIT - 2; ++i)
+        Bib_FieldIndex(("f" + std::to_string(i)).c_str());
+    EXPECT_EQ("", Entry_CheckType("misc", specs));
+    Bib_FieldIndex("one more");
+    EXPECT_THAT(Entry_CheckType("misc", specs), HasSubstr("too many different names"));
+    EXPECT_EQ("", Entry_CheckType("misc", "new1=*\0F7=*\0"));
+    EXPECT_EQ(BIB_FIELD_LIMIT - 1, BibFieldCount);
+}
+
+TEST_F(NewEntry, NeedsRoomForItsType)
+{
+    for (int i = BibTypeCount; i < BIB_TYPE_LIMIT; ++i)
+        Bib_TypeIndex(("t" + std::to_string(i)).c_str());
+    EXPECT_EQ("", Entry_CheckType("T100", ""));
+    EXPECT_THAT(Entry_CheckType("more", ""), HasSubstr("`more'"));
+}
+
+// --- Renaming ---
+
+TEST_F(RenamedEntry, TakesTheChildrenBeforeItAlong)
+{
+    BibFile *file = Open("a.bib", Family);
+    BibFile *other = Open("b.bib", "@inbook{away, crossref = {parent}}\n");
+    Entry_Rename(file, Find(file, "parent"), "mother");
+    EXPECT_EQ("@inbook{first,\n\tcrossref = {mother}\n}\n"
+              "@inbook{second,\n\tcrossref = {mother},\n\tpages = 7\n}\n"
+              "@inbook{stranger,\n\tcrossref = {parents}\n}\n"
+              "@book{lonely,\n\ttitle = {L}\n}\n"
+              "@book{mother,\n\ttitle = {P}\n}\n"
+              "@inbook{last,\n\tcrossref = {parent}\n}\n",
+              Saved(file, "a.bib"));
+    EXPECT_STREQ("parent", other->entries->fields[0].value);
+}
+
+TEST_F(RenamedEntry, LogsTheReferencesThatItLooksAt)
+{
+    BibFile *file = Open("a.bib", Family);
+    log.Lines();
+    Entry_Rename(file, Find(file, "parent"), "mother");
+    EXPECT_THAT(log.Lines(), ElementsAre("Fix crossref's on the entry: parent", "crossref= PARENT",
+                                         "crossref= parent", "crossref= parents"));
+}
+
+TEST_F(RenamedEntry, MayBeTheFirstOfItsFile)
+{
+    BibFile *file = Open("a.bib", Family);
+    Entry_Rename(file, file->entries, "firstborn");
+    EXPECT_EQ("firstborn second stranger lonely parent last ", Keys(file));
+    EXPECT_STREQ("PARENT", file->entries->fields[0].value);
+}
+
+// Loading puts the last one first.
+TEST_F(RenamedEntry, ChangesTheFirstReferenceOfAnEntryOnly)
+{
+    BibFile *file = Open("a.bib", "@misc{child, crossref = {a}, crossref = {b}}\n"
+                                  "@misc{a, note = 1}\n@misc{b, note = 1}\n");
+    const BibField *fields = file->entries->fields;
+    Entry_Rename(file, Find(file, "a"), "c");
+    EXPECT_STREQ("b", fields[0].value);
+    EXPECT_STREQ("a", fields[1].value);
+    Entry_Rename(file, Find(file, "b"), "d");
+    EXPECT_STREQ("d", fields[0].value);
+    EXPECT_STREQ("a", fields[1].value);
+}
+
+// --- Removing ---
+
+TEST_F(RemovedEntry, IsReferredToByTheEntriesBeforeIt)
+{
+    BibFile *file = Open("a.bib", Family);
+    Open("b.bib", "@inbook{away, crossref = {lonely}}\n");
+    EXPECT_EQ("`first', `second'", Entry_Referrers(file, Find(file, "parent")));
+    EXPECT_EQ("", Entry_Referrers(file, Find(file, "lonely")));
+    EXPECT_EQ("", Entry_Referrers(file, Find(file, "first")));
+}
+
+TEST_F(RemovedEntry, IsNotHeldByAReferenceOfItsOwn)
+{
+    BibFile *file = Open("a.bib", "@misc{self, crossref = {self}}\n");
+    EXPECT_EQ("", Entry_Referrers(file, file->entries));
+}
+
+TEST_F(RemovedEntry, LogsTheReferencesThatItLooksAt)
+{
+    BibFile *file = Open("a.bib", Family);
+    log.Lines();
+    Entry_Referrers(file, Find(file, "lonely"));
+    EXPECT_THAT(log.Lines(),
+                ElementsAre("crossref= PARENT", "crossref= parent", "crossref= parents"));
+}
+
+TEST_F(RemovedEntry, LeavesTheOthersAsTheyWere)
+{
+    BibFile *file = Open("a.bib", Family);
+    EXPECT_EQ(1, Entry_Remove(file, Find(file, "lonely")));
+    EXPECT_EQ("first second stranger parent last ", Keys(file));
+    EXPECT_EQ(1, Entry_Remove(file, Find(file, "first")));
+    EXPECT_EQ("second stranger parent last ", Keys(file));
+    EXPECT_EQ(1, Entry_Remove(file, Find(file, "last")));
+    EXPECT_EQ("@inbook{second,\n\tcrossref = {parent},\n\tpages = 7\n}\n"
+              "@inbook{stranger,\n\tcrossref = {parents}\n}\n"
+              "@book{parent,\n\ttitle = {P}\n}\n",
+              Saved(file, "a.bib"));
+}
+
+TEST_F(RemovedEntry, HasToBeOfTheFile)
+{
+    BibFile *file = Open("a.bib", Talks), *other = Open("b.bib", Books);
+    log.Lines();
+    EXPECT_EQ(0, Entry_Remove(file, other->entries));
+    EXPECT_THAT(log.Lines(), ElementsAre("DELETEENTRY: Current entry not found."));
+    EXPECT_EQ("Griske84 ", Keys(file));
+    EXPECT_EQ("Ost77 ", Keys(other));
+}
+
+TEST_F(RemovedEntry, LeavesTheSelectionToTheNextOrThePrevious)
+{
+    BibEntry a = {}, b = {}, c = {};
+    const IndexItem index[] = {{&a, 0}, {&b, 0}, {&c, 0}};
+    EXPECT_EQ(&b, Entry_NextInList(index, 3, 0));
+    EXPECT_EQ(&c, Entry_NextInList(index, 3, 1));
+    EXPECT_EQ(&b, Entry_NextInList(index, 3, 2));
+    EXPECT_EQ(nullptr, Entry_NextInList(index, 1, 0));
+}
+
+TEST_F(RemovedEntry, IsNotSelectedAgainByItsOtherRow)
+{
+    BibEntry a = {}, b = {};
+    const IndexItem index[] = {{&a, 0}, {&a, 1}, {&b, 0}, {&b, 1}};
+    EXPECT_EQ(&b, Entry_NextInList(index, 4, 0));
+    EXPECT_EQ(&a, Entry_NextInList(index, 4, 2));
+    EXPECT_EQ(nullptr, Entry_NextInList(index, 2, 0));
+}

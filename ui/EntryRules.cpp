@@ -1,0 +1,246 @@
+#include "ui/EntryRules.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <cstring>
+#include <cwchar>
+
+#include "app/Log.h"
+#include "encoding/Encoding.h"
+#include "store/Ascii.h"
+
+// --- Fields ---
+
+// The slot of the entry's first `crossref`; -1 for none.
+static int FindCrossref(const BibEntry *entry)
+{
+    for (int i = 0; i < entry->fieldCount; ++i)
+        if (Ascii_Compare(BibFieldTable[entry->fields[i].name], "crossref") == 0)
+            return i;
+    return -1;
+}
+
+static void Replace(char **text, const char *with)
+{
+    char *copy = Bib_CopyText(with, strlen(with));
+    if (!copy)
+        return;
+    free(*text);
+    *text = copy;
+}
+
+// --- Where a new entry may go ---
+
+static bool Lists(const BibFileSet *set, const std::vector<int> &files, const BibFile *file)
+{
+    return std::any_of(files.begin(), files.end(), [&](int i) { return set->files[i] == file; });
+}
+
+std::vector<int> Entry_WritableFiles(const BibFileSet *set)
+{
+    std::vector<int> files;
+    for (int i = 0; i < set->count; ++i)
+        if (!set->files[i]->readOnly && !Lists(set, files, set->files[i]))
+            files.push_back(i);
+    return files;
+}
+
+std::string Entry_FileLabel(const BibFileSet *set, const std::vector<int> &files, int file)
+{
+    std::string name = set->files[file]->baseName;
+    auto isNamesake = [&](int other) {
+        return other != file && Ascii_Compare(set->files[other]->baseName, name.c_str()) == 0;
+    };
+    if (!name.empty() && std::none_of(files.begin(), files.end(), isNamesake))
+        return name;
+    return name + " (" + set->files[file]->path + ")";
+}
+
+int Entry_MayBeParent(const BibFile *file, const BibEntry *entry)
+{
+    return file && entry && !file->readOnly && FindCrossref(entry) < 0;
+}
+
+// --- Keys ---
+
+std::string Entry_TypedKey(const wchar_t *typed)
+{
+    std::vector<char> narrow(wcslen(typed) + 1);
+    std::string key = Enc_FromUnicode(narrow.data(), typed);
+    key.erase(std::remove_if(key.begin(), key.end(), [](unsigned char c) { return c <= 32; }),
+              key.end());
+    return key;
+}
+
+int Entry_KeyFits(const wchar_t *typed)
+{
+    const unsigned char none = 255; // what stands for characters without a byte
+    for (; *typed; ++typed) {
+        const wchar_t character[] = {*typed, 0};
+        char byte[2];
+        Enc_FromUnicode(byte, character);
+        if (static_cast<unsigned char>(byte[0]) == none &&
+            Enc_Current()->map[none] != static_cast<uint32_t>(*typed))
+            return 0;
+    }
+    return 1;
+}
+
+static int HasKey(const BibFile *file, const char *key)
+{
+    for (const BibEntry *entry = file->entries; entry; entry = entry->next)
+        if (Ascii_Compare(entry->key, key) == 0)
+            return 1;
+    return 0;
+}
+
+static KeyVerdict CheckForm(const char *key)
+{
+    if (!*key)
+        return KEY_EMPTY;
+    std::string stripped = key;
+    Bib_StripKeyChars(stripped.data());
+    if (strcmp(stripped.c_str(), key) != 0)
+        return KEY_BAD_CHARS;
+    return Bib_IsKey(key) ? KEY_OK : KEY_UNWRITABLE;
+}
+
+static KeyVerdict CheckFree(const BibFileSet *set, const BibFile *file, const char *key)
+{
+    if (HasKey(file, key))
+        return KEY_TAKEN;
+    for (int i = 0; i < set->count; ++i)
+        if (set->files[i] != file && HasKey(set->files[i], key))
+            return KEY_TAKEN_ELSEWHERE;
+    return KEY_OK;
+}
+
+KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const char *key)
+{
+    KeyVerdict form = CheckForm(key);
+    if (form != KEY_OK)
+        return form;
+    return target ? CheckFree(set, target, key) : KEY_NO_FILE;
+}
+
+KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const BibEntry *entry,
+                             const char *key)
+{
+    KeyVerdict form = CheckForm(key);
+    if (form == KEY_EMPTY || form == KEY_BAD_CHARS)
+        return form;
+    if (strcmp(entry->key, key) == 0)
+        return KEY_SAME;
+    return form == KEY_OK ? CheckFree(set, file, key) : form;
+}
+
+// --- New entries ---
+
+const char Entry_ChildSpecs[] = "crossref=*\0";
+
+static int IsKnownField(const std::string &name)
+{
+    for (int i = 0; i < BibFieldCount; ++i)
+        if (Ascii_Compare(BibFieldTable[i], name.c_str()) == 0)
+            return 1;
+    return 0;
+}
+
+static std::vector<std::string> MandatoryFields(const char *specs)
+{
+    std::vector<std::string> names;
+    for (const char *item = specs; *item; item += strlen(item) + 1) {
+        const char *equals = strchr(item, '=');
+        if (*item != '*' && equals && equals != item && equals[1] == '*')
+            names.emplace_back(item, equals);
+    }
+    return names;
+}
+
+std::string Entry_CheckType(const char *typeName, const char *specs)
+{
+    if (!*typeName)
+        return "There is no type for the entry: the list of entry types can't be found.";
+    if (!Bib_IsName(typeName) || !Bib_HasTypeRoom(typeName))
+        return std::string("An entry of the type `") + typeName +
+               "' can't be written to a BIB file.";
+    int newNames = 0;
+    for (const std::string &name : MandatoryFields(specs)) {
+        if (!Bib_IsName(name.c_str()))
+            return std::string("The type `") + typeName + "' asks for the field `" + name +
+                   "', which can't be written to a BIB file.";
+        newNames += !IsKnownField(name);
+    }
+    if (newNames > BIB_FIELD_LIMIT - BibFieldCount)
+        return "There are too many different names of fields in all open files.\n\n"
+               "Close some of the files, or choose another type.";
+    return "";
+}
+
+BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, const char *specs,
+                       const BibEntry *parent)
+{
+    BibEntry *entry = Bib_NewEntry(file, key, typeName, specs, 0);
+    if (entry && parent && FindCrossref(entry) == 0)
+        Replace(&entry->fields[0].value, parent->key);
+    return entry;
+}
+
+// --- Changes ---
+
+// The slot of the `crossref` that names `key`; -1 when the entry does not refer to it.
+static int FindReference(const BibEntry *entry, const char *key)
+{
+    int crossref = FindCrossref(entry);
+    if (crossref < 0)
+        return -1;
+    const char *value = entry->fields[crossref].value;
+    AppLog("crossref= ", value);
+    return Ascii_Compare(value, key) == 0 ? crossref : -1;
+}
+
+void Entry_Rename(BibFile *file, BibEntry *entry, const char *key)
+{
+    AppLog("Fix crossref's on the entry: ", entry->key);
+    for (BibEntry *other = file->entries; other && other != entry; other = other->next) {
+        int reference = FindReference(other, entry->key);
+        if (reference >= 0)
+            Replace(&other->fields[reference].value, key);
+    }
+    Replace(&entry->key, key);
+}
+
+std::string Entry_Referrers(const BibFile *file, const BibEntry *entry)
+{
+    std::string keys;
+    for (const BibEntry *other = file->entries; other && other != entry; other = other->next)
+        if (FindReference(other, entry->key) >= 0)
+            keys += std::string(keys.empty() ? "`" : ", `") + other->key + "'";
+    return keys;
+}
+
+int Entry_Remove(BibFile *file, BibEntry *entry)
+{
+    BibEntry **link = &file->entries;
+    while (*link && *link != entry)
+        link = &(*link)->next;
+    if (!*link) {
+        AppLog("DELETEENTRY: ", "Current entry not found.");
+        return 0;
+    }
+    *link = entry->next;
+    Bib_FreeEntry(entry);
+    return 1;
+}
+
+// A file that is listed twice has two rows for each entry.
+BibEntry *Entry_NextInList(const IndexItem *index, int count, int row)
+{
+    for (int i = row + 1; i < count; ++i)
+        if (index[i].entry != index[row].entry)
+            return index[i].entry;
+    for (int i = row - 1; i >= 0; --i)
+        if (index[i].entry != index[row].entry)
+            return index[i].entry;
+    return nullptr;
+}
