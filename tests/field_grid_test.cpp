@@ -378,10 +378,22 @@ TEST_F(Grid, NamesSomeOfManyLostCharacters)
                                               "can't be stored in CP1252.\n"));
 }
 
+TEST_F(Grid, KeepsTheStoredValueOfALockedRow)
+{
+    Show("@misc{k, note = {very long}}", "k");
+    grid.rows[0].locked = true;
+    Type(0, "very");
+    GridChanges changes = Grid_Compare(&grid, grid.entry->type);
+    EXPECT_FALSE(Grid_HasChanges(&changes));
+    BibEntry *entry = Grid_Build(&grid, grid.entry->type);
+    EXPECT_STREQ("very long", entry->fields[0].value);
+    Bib_FreeEntry(entry);
+}
+
 TEST_F(Grid, ChecksNoInheritedRow)
 {
     Show("@inbook{k, crossref = {p}}\n@book{p, note = {a}}\n", "k");
-    Type(1, "}");
+    grid.rows[1].stored = "}";
     EXPECT_EQ(nullptr, Grid_CheckRow(&grid, 1));
     grid.rows[1].inherited = false;
     EXPECT_STREQ("Unbalanced braces (extra `}')", Grid_CheckRow(&grid, 1));

@@ -144,7 +144,7 @@ GridRemove Grid_Remove(FieldGrid *grid, int row)
         return GRID_INHERITED;
     }
     std::move(grid->rows + row + 1, grid->rows + grid->count, grid->rows + row);
-    grid->rows[--grid->count] = {};
+    --grid->count;
     return GRID_REMOVED;
 }
 
@@ -295,14 +295,12 @@ static bool HoldsGuillemets(const std::wstring &text)
                        [](wchar_t c) { return IsGuillemet(static_cast<uint32_t>(c)); });
 }
 
-// As text, not as what marks are shown as.
+// As text: a mark is not in the code page, only shown as one.
 static bool StoresGuillemets(const std::string &value)
 {
     const uint32_t *map = Enc_Current()->map;
-    return std::any_of(value.begin(), value.end(), [map](char c) {
-        return c != BIB_OPEN_ABBREVIATION && c != BIB_CLOSE_ABBREVIATION &&
-               IsGuillemet(map[static_cast<unsigned char>(c)]);
-    });
+    return std::any_of(value.begin(), value.end(),
+                       [map](char c) { return IsGuillemet(map[static_cast<unsigned char>(c)]); });
 }
 
 // Each once, in order.
