@@ -93,6 +93,14 @@ TEST(PanelTextColour, IsReadableOnDarkThemes)
     }
 }
 
+TEST(PanelTextColour, KeepsDarkAndBrightColoursApartOnDarkThemes)
+{
+    const Colour back = {53, 53, 53};
+    Colour dark = Panel_TextColour({0, 0, 128}, back, true);
+    Colour bright = Panel_TextColour({0, 0, 255}, back, true);
+    EXPECT_GE(Panel_Contrast(dark, bright), 1.4);
+}
+
 TEST(PanelTextColour, KeepsTheHueOnDarkThemes)
 {
     Colour blue = Panel_TextColour({0, 0, 100}, {45, 45, 45}, true);

@@ -65,10 +65,12 @@ Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme)
 {
     if (!darkTheme)
         return chosen;
+    // What stands out by its darkness on a light background does so by its lightness here.
+    double contrast = std::max({chosen.red, chosen.green, chosen.blue}) > 128 ? 4.5 : 7;
     Colour full = Saturate(chosen);
     for (int percent = 0; percent < 100; percent += 5) {
         Colour lighter = MixWithWhite(full, percent);
-        if (Panel_Contrast(lighter, background) >= 4.5)
+        if (Panel_Contrast(lighter, background) >= contrast)
             return lighter;
     }
     return {255, 255, 255};
