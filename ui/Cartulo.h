@@ -30,6 +30,9 @@ public:
     bool InEditMode() const { return m_editMode; }
     bool IsBusy() const { return m_busy; } // loading, saving or asking about it
 
+    // The button that closed the last window for adding or renaming an entry; 0 for none yet.
+    int DialogResult() const { return m_dialogResult; }
+
     // Carries out a command line: opens and closes files and rebuilds the list. `origin` says
     // where the line came from; it changes nothing. Returns 0. Call ShowOpenFiles after it.
     int ProcessCommand(const char *commandLine, const char *origin);
@@ -91,6 +94,8 @@ private:
     void FitRow(int row);
     void ShowMoreFields(int count);
     void ShowRows(int count);
+    void SelectInList(BibEntry *entry);
+    void RemoveEntry(int row);
     void UpdateSaveTool();
     void ShowRow(const char *handler);
     int AskToSave();
@@ -102,6 +107,9 @@ private:
     void OnShowMessages(wxCommandEvent &event);
     void OnInsertCite(wxCommandEvent &event);
     void OnUnavailable(wxCommandEvent &event);
+    void OnNewEntry(wxCommandEvent &event);
+    void OnRenameEntry(wxCommandEvent &event);
+    void OnRemoveEntry(wxCommandEvent &event);
     void OnSashMove(wxSplitterEvent &event);
     void OnEntryPaneSize(wxSizeEvent &event);
     void OnPaint(wxPaintEvent &event);
@@ -115,6 +123,7 @@ private:
     bool m_isPainted = false;
     bool m_editMode = false; // else the list is in use
     bool m_busy = false;     // saving or carrying out a command line
+    int m_dialogResult = 0;
     std::string m_ini;       // path of the INI file with the entry types
     std::string m_name;      // of the application, from there
     int m_sashPosition;      // of the split window, kept while it is not split

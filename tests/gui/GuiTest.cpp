@@ -106,6 +106,18 @@ wxString ExpectMessages::GetDefaultDescription() const
     return "messages window \"" + m_heading + "\"";
 }
 
+bool PressOK(wxDialog &dialog)
+{
+    dialog.Show();
+    wxCommandEvent event(wxEVT_BUTTON, wxID_OK);
+    event.SetEventObject(dialog.FindWindow(wxID_OK));
+    dialog.ProcessWindowEvent(event);
+    bool closed = !dialog.IsShown();
+    dialog.Hide();
+    dialog.SetReturnCode(closed ? wxID_OK : 0);
+    return closed;
+}
+
 // --- The log ---
 
 static std::vector<LogLine> logged;

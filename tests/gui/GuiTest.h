@@ -9,6 +9,7 @@
 #include <functional>
 #include <ostream>
 #include <string>
+#include <typeinfo>
 #include <vector>
 
 #include <wx/config.h>
@@ -64,6 +65,34 @@ private:
     wxString m_heading;
     wxString *m_text;
 };
+
+// A window of the program: `steps` use it instead of a user, and `result` is what it returns then,
+// or 0 for what the last PressOK in it came to.
+template <class Dialog> class UseDialog : public wxExpectModalBase<Dialog, UseDialog<Dialog>>
+{
+public:
+    explicit UseDialog(std::function<void(Dialog &)> steps, int result = 0)
+        : m_steps(steps), m_result(result)
+    {
+    }
+
+protected:
+    int OnInvoked(Dialog *dialog) const override
+    {
+        m_steps(*dialog);
+        int result = m_result ? m_result : dialog->GetReturnCode();
+        return result ? result : int(wxID_CANCEL);
+    }
+
+    wxString GetDefaultDescription() const override { return typeid(Dialog).name(); }
+
+private:
+    std::function<void(Dialog &)> m_steps;
+    int m_result;
+};
+
+// In a dialog that is not modal; true when that closes it.
+bool PressOK(wxDialog &dialog);
 
 // While one lives, dialogs of the program are really shown.
 class AllowDialogs

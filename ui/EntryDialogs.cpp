@@ -1,0 +1,278 @@
+#include "ui/EntryDialogs.h"
+
+#include <algorithm>
+
+#include <wx/checkbox.h>
+#include <wx/choice.h>
+#include <wx/dcclient.h>
+#include <wx/msgdlg.h>
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+
+#include "app/Companion.h"
+#include "encoding/Encoding.h"
+#include "ui/DisplayText.h"
+#include "ui/Schema.h"
+
+enum { DIALOG_BORDER = 12, COLUMN_GAP = 8, KEY_WIDTH = 280, LONGEST_ITEM = 400 };
+enum { SPECS_SIZE = 2048 };
+
+// --- What both windows have ---
+
+EntryDialog::EntryDialog(wxWindow *parent, const EntryPlace &current, const Texts &texts)
+    : wxDialog(parent, wxID_ANY, texts.title, wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
+      m_current(current), m_files(Entry_WritableFiles(current.set)), m_texts(texts)
+{
+    SetFont(wxFontInfo(10));
+    m_rows = new wxFlexGridSizer(2, FromDIP(wxSize(COLUMN_GAP, COLUMN_GAP)));
+    m_rows->AddGrowableCol(1);
+    m_file = new wxChoice(this, ID_ENTRY_FILE);
+    m_key = new wxTextCtrl(this, ID_ENTRY_KEY);
+    m_key->SetMinSize(FromDIP(wxSize(KEY_WIDTH, -1)));
+    m_type = new wxChoice(this, ID_ENTRY_TYPE);
+    FillFiles();
+    FillTypes();
+    AddRow(texts.fileLabel, m_file);
+    AddRow(texts.keyLabel, m_key);
+    AddRow("Entry Type:", m_type);
+}
+
+void EntryDialog::AddRow(const char *label, wxWindow *control)
+{
+    m_rows->Add(new wxStaticText(this, wxID_ANY, label), wxSizerFlags().CentreVertical());
+    m_rows->Add(control, wxSizerFlags().Expand());
+}
+
+void EntryDialog::AddButtons()
+{
+    const int border = FromDIP(DIALOG_BORDER);
+    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
+    column->Add(m_rows, wxSizerFlags(1).Expand().Border(wxALL, border));
+    column->Add(CreateStdDialogButtonSizer(wxOK | wxCANCEL),
+                wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
+    SetSizerAndFit(column);
+    CentreOnParent();
+    m_key->SetFocus();
+}
+
+// A choice is as wide as its longest item.
+wxString EntryDialog::Shorten(const wxString &text) const
+{
+    wxClientDC dc(m_file);
+    dc.SetFont(GetFont());
+    return wxControl::Ellipsize(text, dc, wxELLIPSIZE_MIDDLE, FromDIP(LONGEST_ITEM),
+                                wxELLIPSIZE_FLAGS_NONE);
+}
+
+void EntryDialog::FillFiles()
+{
+    for (int file : m_files)
+        m_file->Append(Shorten(PathText(Entry_FileLabel(m_current.set, m_files, file).c_str())));
+}
+
+// The fixed types, which no entry has, are not offered.
+void EntryDialog::FillTypes()
+{
+    for (int i = BIB_FIXED_TYPES; i < BibTypeCount; ++i)
+        m_type->Append(Shorten(StoreText(BibTypeTable[i])));
+    if (m_current.entry)
+        m_type->SetSelection(std::max<int>(m_current.entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
+}
+
+// The item of the current file; wxNOT_FOUND when that can't be written.
+int EntryDialog::CurrentChoice() const
+{
+    for (size_t i = 0; m_current.file >= 0 && i < m_files.size(); ++i)
+        if (m_current.set->files[m_files[i]] == m_current.set->files[m_current.file])
+            return int(i);
+    return wxNOT_FOUND;
+}
+
+std::string EntryDialog::Key() const
+{
+    return Entry_TypedKey(m_key->GetValue().ToStdWstring().c_str());
+}
+
+void EntryDialog::Refuse(const wxString &text)
+{
+    wxMessageBox(text, m_texts.caption, wxOK | wxICON_EXCLAMATION, this);
+    m_key->SetFocus();
+}
+
+void EntryDialog::ReplaceBadChars(std::string key)
+{
+    int answer = wxMessageBox("The key includes invalid characters.\n"
+                              "We will remove them from key and continue.",
+                              m_texts.caption, wxOK | wxCANCEL | wxICON_EXCLAMATION, this);
+    m_key->SetFocus();
+    if (answer != wxOK)
+        return;
+    Bib_StripKeyChars(key.data());
+    m_key->ChangeValue(StoreText(key.c_str()));
+}
+
+bool EntryDialog::Accept(KeyVerdict verdict, std::string key)
+{
+    if (!Entry_KeyFits(m_key->GetValue().ToStdWstring().c_str())) {
+        Refuse(wxString::Format("The key includes characters that can't be stored in %s.",
+                                Enc_Current()->name));
+        return false;
+    }
+    switch (verdict) {
+    case KEY_OK:
+        return true;
+    case KEY_EMPTY:
+        Refuse(m_texts.emptyKey);
+        return false;
+    case KEY_BAD_CHARS:
+        ReplaceBadChars(key);
+        return false;
+    case KEY_UNWRITABLE:
+        Refuse("An entry with this key can't be written to a BIB file.");
+        return false;
+    case KEY_NO_FILE:
+        Refuse("I can't locate selected bibliography file.");
+        return false;
+    case KEY_SAME:
+        return false;
+    case KEY_TAKEN:
+        Refuse(m_texts.takenKey);
+        return false;
+    case KEY_TAKEN_ELSEWHERE:
+        break;
+    }
+    return wxMessageBox("Specified Key is already present in another BIB files.\n"
+                        "Are you shure that you want to add duplication in your BIB-File ?",
+                        m_texts.caption, wxYES_NO | wxICON_QUESTION, this) == wxYES;
+}
+
+void EntryDialog::SetChanged(BibEntry *entry, int file)
+{
+    m_changed = entry;
+    m_changedFile = file;
+}
+
+// --- A new entry ---
+
+wxBEGIN_EVENT_TABLE(Cartulo_NewEntry, EntryDialog)
+    EVT_BUTTON(wxID_OK, Cartulo_NewEntry::OnOK)
+wxEND_EVENT_TABLE()
+
+Cartulo_NewEntry::Cartulo_NewEntry(wxWindow *parent, const EntryPlace &current,
+                                   const std::string &ini)
+    : EntryDialog(parent, current,
+                  {"Creating New Bibliography Entry", "Add Entry to BIB-file:", "Entry Key:",
+                   "Adding New Entry", "Please enter key of the new bibliography entry.",
+                   "Specified Key is already present in the BIB file."}),
+      m_ini(ini)
+{
+    SelectFile();
+    if (m_type->GetSelection() == wxNOT_FOUND && !m_type->IsEmpty())
+        m_type->SetSelection(0);
+    m_child = new wxCheckBox(this, ID_ENTRY_CHILD, "");
+    const BibFile *file = current.file >= 0 ? current.set->files[current.file] : nullptr;
+    m_child->Enable(Entry_MayBeParent(file, current.entry));
+    AddRow("Create 'crossref':", m_child);
+    AddButtons();
+}
+
+// The line is logged for a file that was found, too.
+void Cartulo_NewEntry::SelectFile()
+{
+    int current = CurrentChoice();
+    if (current == wxNOT_FOUND && !m_files.empty()) {
+        m_file->SetSelection(0);
+        return;
+    }
+    m_file->SetSelection(current);
+    TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR);
+}
+
+// -1 for none. The entry that a new one refers to has to be in the same file.
+int Cartulo_NewEntry::TargetFile() const
+{
+    if (m_child->GetValue())
+        return m_current.file;
+    int item = m_file->GetSelection();
+    return item == wxNOT_FOUND ? -1 : m_files[item];
+}
+
+void Cartulo_NewEntry::OnOK(wxCommandEvent &event)
+{
+    std::string key = Key();
+    int file = TargetFile();
+    const BibFile *target = file >= 0 ? m_current.set->files[file] : nullptr;
+    KeyVerdict verdict = Entry_CheckNewKey(m_current.set, target, key.c_str());
+    if (Accept(verdict, key) && Create(file, key))
+        event.Skip(); // closes
+}
+
+bool Cartulo_NewEntry::Create(int file, const std::string &key)
+{
+    int item = m_type->GetSelection();
+    const char *type = item == wxNOT_FOUND ? "" : BibTypeTable[BIB_FIXED_TYPES + item];
+    const bool child = m_child->GetValue();
+    char section[SPECS_SIZE];
+    Schema_FieldSpecs(m_ini.c_str(), type, section, sizeof section);
+    const char *specs = child ? Entry_ChildSpecs : section;
+    std::string reason = Entry_CheckType(type, specs);
+    if (!reason.empty()) {
+        Refuse(StoreText(reason.c_str()));
+        return false;
+    }
+    BibEntry *entry = Entry_Create(m_current.set->files[file], key.c_str(), type, specs,
+                                   child ? m_current.entry : nullptr);
+    if (!entry) {
+        Refuse("There is not enough memory for a new entry.");
+        return false;
+    }
+    SetChanged(entry, file);
+    return true;
+}
+
+// --- Another key ---
+
+wxBEGIN_EVENT_TABLE(Cartulo_RenameEntry, EntryDialog)
+    EVT_BUTTON(wxID_OK, Cartulo_RenameEntry::OnOK)
+wxEND_EVENT_TABLE()
+
+Cartulo_RenameEntry::Cartulo_RenameEntry(wxWindow *parent, const EntryPlace &current)
+    : EntryDialog(parent, current,
+                  {"Renaming Bibliography Entry", "Entry in BIB-file:", "New Key for the Entry:",
+                   "Renaming Entry", "Please enter new key for the bibliography entry.",
+                   "Specified New Key is already present in the BIB file."})
+{
+    m_file->SetSelection(CurrentChoice());
+    m_file->Disable();
+    m_type->Disable();
+    if (current.entry)
+        m_key->ChangeValue(StoreText(current.entry->key));
+    AddButtons();
+}
+
+bool Cartulo_RenameEntry::MayRename() const
+{
+    return m_current.entry && m_current.file >= 0 &&
+           !m_current.set->files[m_current.file]->readOnly;
+}
+
+// An empty key closes the window as well.
+void Cartulo_RenameEntry::OnOK(wxCommandEvent &event)
+{
+    if (!MayRename()) {
+        event.Skip();
+        return;
+    }
+    std::string key = Key();
+    BibFile *file = m_current.set->files[m_current.file];
+    KeyVerdict verdict = Entry_CheckRename(m_current.set, file, m_current.entry, key.c_str());
+    if (Accept(verdict, key)) {
+        Entry_Rename(file, m_current.entry, key.c_str());
+        SetChanged(m_current.entry, m_current.file);
+    } else if (verdict != KEY_EMPTY) {
+        return; // stays open
+    }
+    event.Skip();
+}

@@ -1,0 +1,100 @@
+// ui/EntryDialogs.h - the windows that add an entry and rename one.
+//
+// Their OK handlers change the store. The list, the entry that is shown and the mark of the file as
+// modified are up to the caller, who asks for Changed() when the window is closed.
+#pragma once
+
+#include <wx/dialog.h>
+
+#include <string>
+#include <vector>
+
+#include "ui/EntryRules.h"
+
+class wxCheckBox;
+class wxChoice;
+class wxFlexGridSizer;
+class wxTextCtrl;
+
+enum { ID_ENTRY_FILE = 6001, ID_ENTRY_KEY, ID_ENTRY_TYPE, ID_ENTRY_CHILD };
+
+// What the panel shows. The set and the entry outlive the dialog.
+struct EntryPlace {
+    const BibFileSet *set;
+    int file;        // -1 for none
+    BibEntry *entry; // of that file; null for none
+};
+
+// What both windows have: a file, a key and a type.
+class EntryDialog : public wxDialog
+{
+public:
+    BibEntry *Changed() const { return m_changed; } // the entry; null when nothing was changed
+    int ChangedFile() const { return m_changedFile; }
+
+protected:
+    struct Texts {
+        const char *title, *fileLabel, *keyLabel;
+        const char *caption; // of the boxes
+        const char *emptyKey, *takenKey;
+    };
+
+    EntryDialog(wxWindow *parent, const EntryPlace &current, const Texts &texts);
+
+    void AddRow(const char *label, wxWindow *control);
+    void AddButtons(); // and the final size; the key gets the focus
+    int CurrentChoice() const;
+    std::string Key() const; // as it was typed, as store text
+
+    // False when it can't be the key; the user knows why then, or has one without bad characters.
+    bool Accept(KeyVerdict verdict, std::string key);
+    void Refuse(const wxString &text);
+    void SetChanged(BibEntry *entry, int file);
+
+    EntryPlace m_current;
+    std::vector<int> m_files; // the index in the set for each item of the choice
+    wxChoice *m_file;         // child windows
+    wxTextCtrl *m_key;
+    wxChoice *m_type;
+
+private:
+    wxString Shorten(const wxString &text) const;
+    void FillFiles();
+    void FillTypes();
+    void ReplaceBadChars(std::string key);
+
+    Texts m_texts;
+    wxFlexGridSizer *m_rows;
+    BibEntry *m_changed = nullptr;
+    int m_changedFile = -1;
+};
+
+class Cartulo_NewEntry : public EntryDialog
+{
+public:
+    // `ini` describes the entry types.
+    Cartulo_NewEntry(wxWindow *parent, const EntryPlace &current, const std::string &ini);
+
+private:
+    void SelectFile();
+    int TargetFile() const;
+    void OnOK(wxCommandEvent &event);
+    bool Create(int file, const std::string &key);
+
+    std::string m_ini;
+    wxCheckBox *m_child; // child window
+
+    wxDECLARE_EVENT_TABLE();
+};
+
+class Cartulo_RenameEntry : public EntryDialog
+{
+public:
+    Cartulo_RenameEntry(wxWindow *parent, const EntryPlace &current);
+
+private:
+    bool MayRename() const;
+    void OnOK(wxCommandEvent &event);
+
+    wxDECLARE_EVENT_TABLE();
+};
