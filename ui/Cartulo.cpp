@@ -34,8 +34,7 @@
 #include "ui/Theme.h"
 
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, COLUMN_GAP = 8, PANE_BORDER = 8, HELP_HEIGHT = 40 };
-enum { SMALLEST_VALUE = 60, LABEL_WIDTH = 96 };       // in the narrowest window
-enum { LONGEST_TIP = 1000 };                          // characters
+enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window
 static const char SashKey[] = "/MainWindow/Splitter"; // in the toolkit's configuration
 static const double LIST_SHARE = 0.35;                // of what the window grows or shrinks
 static const Colour HeadingColour = {0, 0, 100};
@@ -53,8 +52,9 @@ wxBEGIN_EVENT_TABLE(Cartulo, wxSplitterWindow)
     ON_COMMAND(ID_NEW_ENTRY, Cartulo::OnNewEntry)
     ON_COMMAND(ID_REMOVE_ENTRY, Cartulo::OnRemoveEntry)
     ON_COMMAND(ID_RENAME_ENTRY, Cartulo::OnRenameEntry)
-    ON_COMMAND(ID_EDIT_ENTRY, Cartulo::OnUnavailable)
-    ON_COMMAND(ID_COMMIT_ENTRY, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_EDIT_ENTRY, Cartulo::OnEditEntry)
+    ON_COMMAND(ID_COMMIT_ENTRY, Cartulo::OnCommitEntry)
+    EVT_CHOICE(ID_TYPE, Cartulo::OnChangeType)
     ON_COMMAND(ID_NEW_FIELD, Cartulo::OnUnavailable)
     ON_COMMAND(ID_RENAME_FIELD, Cartulo::OnUnavailable)
     ON_COMMAND(ID_REMOVE_FIELD, Cartulo::OnUnavailable)
@@ -104,6 +104,7 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     ClearEntry();
     if (m_list->Item(0))
         ShowRow("OnIndexChanged");
+    UpdateHelpText();
 }
 
 Cartulo::~Cartulo()
@@ -566,9 +567,11 @@ void Cartulo::OnSearch(wxCommandEvent &event)
     m_search = Enc_FromUnicode(narrow.data(), text.c_str());
     TNSMessage("INFO: Cartulo::OnSearch ", StoreText(m_search.c_str()).utf8_str(), TNS_ACTION);
     m_list->Update_Index(m_entry, m_search.c_str());
-    RefreshPane();
     bool found = m_list->GetItemCount() > 0 || m_search.empty();
     ShowStatus(this, found ? "" : "No entry holds this text.");
+    if (m_editMode)
+        return; // the entry that is edited stays, found or not
+    RefreshPane();
     ShowSelection();
 }
 
@@ -631,119 +634,4 @@ void Cartulo::OnSashMove(wxSplitterEvent &event)
                    .utf8_str(),
                TNS_ACTION);
     event.Skip();
-}
-
-// --- The entry pane ---
-
-// A text control holds no more than 65,534 bytes, and nothing behind a NUL.
-void Cartulo::FillRow(int row, const BibField *field)
-{
-    wxTextCtrl *value = m_rows[row].value;
-    wxString text = StoreText(field->value);
-    m_rows[row].label->SetLabelText(StoreText(BibFieldTable[field->name]));
-    value->ChangeValue(text);
-    m_rows[row].isCut = value->GetValue() != text;
-}
-
-// The part of a long text that a tip can show.
-static wxString TipText(const wxString &text)
-{
-    return text.length() > LONGEST_TIP ? text.Left(LONGEST_TIP) + L"\x2026" : text;
-}
-
-static bool Fits(const wxTextCtrl *value)
-{
-    wxString text = value->GetValue();
-    return text.length() <= LONGEST_TIP &&
-           value->GetSizeFromTextSize(value->GetTextExtent(text)).x <= value->GetSize().x;
-}
-
-// What is too long for the row can be read in its tip.
-void Cartulo::FitRow(int row)
-{
-    wxStaticText *label = m_rows[row].label;
-    wxTextCtrl *value = m_rows[row].value;
-    int widest = std::max(FromDIP(LABEL_WIDTH), m_entryPane->GetClientSize().x / 3);
-    int width = label->GetTextExtent(label->GetLabelText()).x;
-    label->SetMinSize(wxSize(std::min(width, widest), -1));
-    label->SetToolTip(width > widest ? label->GetLabelText() : wxString());
-    if (m_rows[row].isCut)
-        value->SetToolTip("This value is too long to be shown in full.");
-    else
-        value->SetToolTip(Fits(value) ? wxString() : TipText(value->GetValue()));
-}
-
-void Cartulo::OnEntryPaneSize(wxSizeEvent &event)
-{
-    for (int i = 0; i < m_rowCount && m_rows[i].value->IsShown(); ++i)
-        FitRow(i);
-    event.Skip();
-}
-
-// The choice leaves out the fixed types, which no entry has.
-void Cartulo::FillTypes()
-{
-    int known = BibTypeCount - BIB_FIXED_TYPES;
-    for (int i = int(m_type->GetCount()); i < known; ++i)
-        m_type->Append(StoreText(BibTypeTable[BIB_FIXED_TYPES + i]));
-}
-
-void Cartulo::ShowEntry(BibEntry *entry, int file)
-{
-    if (!entry)
-        return;
-    m_entry = entry;
-    m_file = file;
-    wxString path = PathText(m_set.files[file]->path);
-    m_entryPane->Freeze();
-    m_fileName->SetLabelText(path);
-    m_fileName->SetToolTip(path);
-    FillTypes();
-    m_type->SetSelection(std::max<int>(entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
-    int shown = std::min<int>(entry->fieldCount, ROW_COUNT);
-    CreateRows(shown);
-    for (int i = 0; i < shown; ++i)
-        FillRow(i, &entry->fields[i]);
-    ShowMoreFields(entry->fieldCount - shown);
-    ShowRows(shown);
-    m_entryPane->Thaw();
-    Update_Tools();
-}
-
-void Cartulo::ClearEntry()
-{
-    m_entry = nullptr;
-    m_file = -1;
-    m_fileName->SetLabelText("");
-    m_fileName->UnsetToolTip();
-    m_type->SetSelection(wxNOT_FOUND);
-    ShowMoreFields(0);
-    ShowRows(0);
-    Update_Tools();
-}
-
-// Nobody shall take an entry with more fields than rows for one with that many fields.
-void Cartulo::ShowMoreFields(int count)
-{
-    m_moreFields->SetLabelText(count == 1
-                                   ? wxString("1 more field is not shown.")
-                                   : wxString::Format("%d more fields are not shown.", count));
-    m_moreFields->Show(count > 0);
-}
-
-// Shows the first rows, as many as `count`.
-void Cartulo::ShowRows(int count)
-{
-    for (int i = 0; i < m_rowCount; ++i) {
-        FieldRow &row = m_rows[i];
-        row.label->Show(i < count);
-        row.value->Show(i < count);
-        row.value->Enable(m_editMode);
-        row.remove->Show(i < count);
-        row.remove->Enable(m_editMode);
-        if (i < count)
-            FitRow(i);
-    }
-    m_entryPane->FitInside(); // the scroll bar follows the rows
-    m_entryPane->Layout();
 }

@@ -8,6 +8,7 @@
 
 #include "app/CommandLine.h"
 #include "store/BibFileSet.h"
+#include "ui/FieldGrid.h"
 
 class Cartulo_Messages;
 class QListBox;
@@ -55,18 +56,18 @@ public:
 
     void Update_Tools();                         // enables the tools that apply now
     void ShowEntry(BibEntry *entry, int file);   // fills the entry pane; null changes nothing
+    void Update_Field_Colors(const char *type);  // of the labels that are shown
+    void CheckMandatoryFields(int last);         // proposes fields; rows up to this one count
+    void UpdateHelpText();                       // for the mode and the type
     void OnSearch(wxCommandEvent &event);        // takes the text of a search field
     void OnIndexChanged(wxCommandEvent &event);  // a row was selected
     void OnIndexActivate(wxCommandEvent &event); // a row was double-clicked
 
 private:
-    enum { ROW_COUNT = 16 };
-
     struct FieldRow {
         wxStaticText *label;
         wxTextCtrl *value;
         xBitmapButton *remove;
-        bool isCut; // the value is longer than the control can hold
     };
 
     void ReadSchema();
@@ -90,10 +91,24 @@ private:
     void ShowSelection();
     void ClearEntry();
     void FillTypes();
-    void FillRow(int row, const BibField *field);
+    void FillRows();
     void FitRow(int row);
+    void ReadRows();
+    void WriteRow(int row);
+    void WriteRows();
+    void HideRow(int row);
     void ShowMoreFields(int count);
-    void ShowRows(int count);
+    void ShowEditControls();
+    void LayOutEntry();
+    void SetEditMode(bool on);
+    void FocusForMode();
+    void LeaveEditing();
+    int ChosenType() const;
+    bool Commit();
+    int Ask(const wxString &text, int buttons);
+    bool AcceptLosses();
+    bool CheckRows();
+    bool ReplaceEntry(int type);
     void SelectInList(BibEntry *entry);
     void RemoveEntry(int row);
     void UpdateSaveTool();
@@ -110,6 +125,9 @@ private:
     void OnNewEntry(wxCommandEvent &event);
     void OnRenameEntry(wxCommandEvent &event);
     void OnRemoveEntry(wxCommandEvent &event);
+    void OnEditEntry(wxCommandEvent &event);
+    void OnChangeType(wxCommandEvent &event);
+    void OnCommitEntry(wxCommandEvent &event);
     void OnSashMove(wxSplitterEvent &event);
     void OnEntryPaneSize(wxSizeEvent &event);
     void OnPaint(wxPaintEvent &event);
@@ -119,14 +137,15 @@ private:
     CommandState *m_state;
     BibEntry *m_entry = nullptr; // owned by its file; null whenever that may be freed
     int m_file = -1;             // index of the file that holds m_entry
+    std::string m_typeName;      // of the current entry, as it is chosen now
     std::string m_search;        // store text
     bool m_isPainted = false;
     bool m_editMode = false; // else the list is in use
     bool m_busy = false;     // saving or carrying out a command line
     int m_dialogResult = 0;
-    std::string m_ini;       // path of the INI file with the entry types
-    std::string m_name;      // of the application, from there
-    int m_sashPosition;      // of the split window, kept while it is not split
+    std::string m_ini;  // path of the INI file with the entry types
+    std::string m_name; // of the application, from there
+    int m_sashPosition; // of the split window, kept while it is not split
 
     QListBox *m_list = nullptr; // child windows, made after the first files are loaded
     wxScrolledWindow *m_entryPane = nullptr;
@@ -136,8 +155,9 @@ private:
     wxStaticText *m_fileName = nullptr;
     wxChoice *m_type = nullptr;
     wxSizer *m_fields = nullptr; // of the rows
-    FieldRow m_rows[ROW_COUNT] = {};
-    int m_rowCount = 0; // of those that are made
+    FieldRow m_rows[GRID_ROWS] = {};
+    int m_rowCount = 0;                   // of those that are made
+    FieldGrid m_grid = {};                // what they show
     wxStaticText *m_moreFields = nullptr; // how many fields found no row
     wxStaticText *m_newFieldLabel = nullptr;
     wxComboBox *m_newFieldKey = nullptr;

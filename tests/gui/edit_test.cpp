@@ -1,0 +1,301 @@
+// Editing an entry in its pane: the two modes, inherited fields, the commit.
+
+#include "tests/gui/EditTest.h"
+
+#include "app/Companion.h"
+
+using Lines = std::vector<LogLine>;
+
+// --- The modes ---
+
+TEST_F(Edit, ChangesBetweenTheModes)
+{
+    OpenText(Article);
+    StartEditing();
+    EXPECT_FALSE(List()->IsEnabled());
+    EXPECT_TRUE(Type()->IsEnabled());
+    EXPECT_TRUE(Value("title")->IsEnabled());
+    EXPECT_TRUE(Remover(0)->IsEnabled());
+    EXPECT_TRUE(IsShowing(ID_COMMIT_ENTRY));
+    EXPECT_TRUE(WaitFor([this] { return Type()->HasFocus(); }));
+    for (int id : {ID_NEW_ENTRY, ID_REMOVE_ENTRY, ID_RENAME_ENTRY, ID_EDIT_ENTRY})
+        EXPECT_FALSE(ToolEnabled(id));
+    Send(ID_COMMIT_ENTRY); // nothing changed: no question
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_TRUE(List()->IsEnabled());
+    EXPECT_FALSE(Value("title")->IsEnabled());
+    EXPECT_FALSE(IsShowing(ID_COMMIT_ENTRY));
+    EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+}
+
+TEST_F(Edit, StartsAndEndsWithEscape)
+{
+    OpenText(Article);
+    PressShortcut(WXK_ESCAPE, false, false);
+    EXPECT_TRUE(Panel()->InEditMode());
+    PressShortcut(WXK_ESCAPE, false, false);
+    EXPECT_FALSE(Panel()->InEditMode());
+}
+
+TEST_F(Edit, RefusesAReadOnlyFile)
+{
+    wxTEST_DIALOG(Open(folder.Write("a.bib", std::string(Article) + "@book{two\n")),
+                  ExpectMessages("There are errors in loading BIB files"));
+    Send(ID_EDIT_ENTRY);
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_EQ("ERROR: You can't edit records in readonly BIB-file", Status());
+    EXPECT_EQ((Lines{{"WARNING: Cartulo::OnEditEntry locked editing file opened in of readonly "
+                      "mode.",
+                      TNS_WARNING}}),
+              TakeLog("WARNING: Cartulo::OnEditEntry"));
+}
+
+TEST_F(Edit, WarnsWithoutASelection)
+{
+    OpenText("");
+    ForgetLog();
+    Send(ID_EDIT_ENTRY);
+    EXPECT_EQ((Lines{{"WARNING: Cartulo::OnEditEntry no selection in index", TNS_WARNING}}),
+              TakeLog("WARNING: Cartulo::OnEditEntry"));
+    Send(ID_COMMIT_ENTRY);
+    EXPECT_FALSE(Panel()->InEditMode());
+}
+
+TEST_F(Edit, DropsEditsWhenTheEditCommandIsGivenAgain)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "Changed");
+    Send(ID_EDIT_ENTRY);
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_EQ("T", Value("title")->GetValue());
+    EXPECT_FALSE(SaveEnabled());
+}
+
+// A menu command leads into the editing of a read-only file, and "Done" out of it again.
+TEST_F(Edit, CommitsNothingToAReadOnlyFile)
+{
+    wxTEST_DIALOG(Open(folder.Write("a.bib", std::string(Article) + "@book{two\n")),
+                  ExpectMessages("There are errors in loading BIB files"));
+    Send(ID_COMMIT_ENTRY);
+    ASSERT_TRUE(Panel()->InEditMode());
+    SetValue("title", "Changed");
+    Send(ID_COMMIT_ENTRY);
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_EQ("T", Value("title")->GetValue());
+}
+
+TEST_F(Edit, ExplainsTheKeysOfTheMode)
+{
+    OpenText(Article);
+    auto help = [this] {
+        for (wxWindow *child : EntryPane()->GetChildren()) {
+            wxTextCtrl *text = dynamic_cast<wxTextCtrl *>(child);
+            if (text && text->IsMultiLine())
+                return text->GetValue();
+        }
+        return wxString();
+    };
+    EXPECT_TRUE(help().StartsWith("<Entry List> Mode Accelerators:\n")) << help();
+    StartEditing();
+    EXPECT_TRUE(help().StartsWith("<Entry Editing> mode Accelerators:\n")) << help();
+    EXPECT_TRUE(help().EndsWith("`article' entry is for a paper")) << help();
+    Choose("book");
+    EXPECT_TRUE(help().EndsWith("`book' entry is for Custom Entry Type")) << help();
+}
+
+// --- The commit ---
+
+TEST_F(Edit, StoresAChangedValue)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_EQ("New Title", Value("title")->GetValue());
+    EXPECT_TRUE(SaveEnabled());
+    EXPECT_NE(std::string::npos, Saved().find("New Title"));
+    ASSERT_NE(nullptr, Panel()->CurrentEntry());
+    EXPECT_EQ(1u, Rows().size());
+}
+
+TEST_F(Edit, DropsTheEditsOnNo)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_NO));
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_EQ("T", Value("title")->GetValue());
+    EXPECT_FALSE(SaveEnabled());
+}
+
+TEST_F(Edit, GoesOnOnCancel)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_CANCEL));
+    EXPECT_TRUE(Panel()->InEditMode());
+    EXPECT_EQ("New Title", Value("title")->GetValue());
+    Send(ID_EDIT_ENTRY);
+}
+
+TEST_F(Edit, AsksNothingWhenAValueIsAsItWas)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    SetValue("title", "T");
+    Send(ID_COMMIT_ENTRY);
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_FALSE(SaveEnabled());
+}
+
+TEST_F(Edit, ChangesTheTypeAlone)
+{
+    OpenText(Article);
+    StartEditing();
+    Choose("book");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("YES", 0, 0, 0, wxID_YES));
+    EXPECT_EQ("book", TextAfter("Entry Type:"));
+    EXPECT_NE(std::string::npos, Saved().find("@book{one,"));
+}
+
+static wxString WrongSyntax(const char *field, const char *message)
+{
+    return wxString::Format("Wrong syntax of value in the field: `%s':\n\n%s\n\nIn this reason "
+                            "modification of entire entry can't be accepted.\nFix an error and "
+                            "try again.",
+                            field, message);
+}
+
+TEST_F(Edit, RefusesEachValueThatCannotBeWritten)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("author", "{open");
+    SetValue("title", "{open too");
+    wxString message = Bib_CheckValue("{open"), other = Bib_CheckValue("{open too");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 2, 0, wxID_YES),
+                  ExpectBox(CommitTitle, WrongSyntax("author", message.utf8_str()), wxID_OK),
+                  ExpectBox(CommitTitle, WrongSyntax("title", other.utf8_str()), wxID_OK));
+    EXPECT_TRUE(Panel()->InEditMode());
+    EXPECT_EQ("{open", Value("author")->GetValue());
+    EXPECT_FALSE(SaveEnabled());
+    Send(ID_EDIT_ENTRY);
+}
+
+TEST_F(Edit, AsksBeforeItLosesCharacters)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", L"\u0141\u00F3d\u017A");
+    wxString asked;
+    class Losses : public wxExpectModalBase<wxMessageDialog, Losses>
+    {
+    public:
+        Losses(wxString *asked, int button) : m_asked(asked), m_button(button) {}
+
+    protected:
+        int OnInvoked(wxMessageDialog *dialog) const override
+        {
+            EXPECT_EQ(CommitTitle, dialog->GetTitle());
+            *m_asked = dialog->GetMessage();
+            return m_button;
+        }
+
+    private:
+        wxString *m_asked;
+        int m_button;
+    };
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
+                  Losses(&asked, wxID_NO));
+    EXPECT_TRUE(asked.Contains("can't be stored in CP1252")) << asked;
+    EXPECT_TRUE(asked.Contains("title")) << asked;
+    EXPECT_TRUE(asked.Contains(L"\u0141")) << asked;
+    EXPECT_FALSE(asked.Contains(L"\u00F3")) << asked;
+    EXPECT_TRUE(Panel()->InEditMode());
+    EXPECT_EQ(L"\u0141\u00F3d\u017A", Value("title")->GetValue());
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
+                  Losses(&asked, wxID_YES));
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_NE(std::string::npos, Saved().find("\xFF\xF3"
+                                              "d\xFF"));
+}
+
+TEST_F(Edit, KeepsBytesThatNobodyTouched)
+{
+    OpenText("@article{one,\n  author = {\xABquoted\xBB},\n  title = {T},\n  year = {1999}\n}\n");
+    StartEditing();
+    SetValue("title", "New");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_NE(std::string::npos, Saved().find("\xABquoted\xBB"));
+}
+
+TEST_F(Edit, KeepsAValueThatItsControlCannotHold)
+{
+    std::string text(70000, 'x');
+    OpenText("@article{one, author = {" + text + "}, title = {T}}\n");
+    StartEditing();
+    EXPECT_FALSE(Value("author")->IsEnabled());
+    SetValue("title", "New");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_NE(std::string::npos, Saved().find(text));
+}
+
+TEST_F(Edit, CarriesFieldsOverThatFoundNoRow)
+{
+    std::string text = "@article{one";
+    for (int i = 0; i < 18; ++i)
+        text += ", f" + std::to_string(i) + " = {v" + std::to_string(i) + "}";
+    OpenText(text + "}\n");
+    StartEditing();
+    SetValue("f0", "New");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    std::string saved = Saved();
+    EXPECT_NE(std::string::npos, saved.find("v17"));
+    EXPECT_NE(std::string::npos, saved.find("New"));
+    EXPECT_EQ(18, Panel()->CurrentEntry()->fieldCount);
+}
+
+// --- Inherited fields ---
+
+TEST_F(Edit, ShowsInheritedFieldsForReading)
+{
+    OpenText(Child);
+    EXPECT_EQ((std::vector<Field>{{"crossref", "parent"}, {"title", "T"}, {"year", "1999"}}),
+              ShownFields());
+    StartEditing();
+    EXPECT_FALSE(Value("crossref")->IsEnabled());
+    EXPECT_FALSE(Remover(0)->IsShown());
+    EXPECT_TRUE(Value("title")->IsEnabled());
+    EXPECT_FALSE(Value("year")->IsEnabled());
+    EXPECT_FALSE(Remover(2)->IsEnabled());
+}
+
+TEST_F(Edit, LetsACrossrefWithoutTargetBeRemoved)
+{
+    OpenText("@book{parent, title = {P}, year = {1999}}\n@article{child, crossref = {parent}}\n");
+    ASSERT_STREQ("child", Panel()->CurrentEntry()->key);
+    StartEditing();
+    EXPECT_TRUE(Remover(0)->IsShown());
+    EXPECT_EQ(1u, ShownFields().size());
+}
+
+// --- What may not cost an edit ---
+
+TEST_F(Edit, LeavesTheListOnASearchThatTheEntryNoLongerMatches)
+{
+    OpenText(Article);
+    SearchFor("1999");
+    StartEditing();
+    SetValue("year", "2001");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_TRUE(IsShowing(ID_NEW_ENTRY));
+    EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+    SearchFor("");
+    EXPECT_EQ("2001", Value("year")->GetValue());
+}

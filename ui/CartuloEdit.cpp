@@ -1,0 +1,394 @@
+// ui/CartuloEdit.cpp - the entry pane: showing an entry, editing it, committing what was edited.
+#include "ui/Cartulo.h"
+
+#include <algorithm>
+#include <vector>
+
+#include <wx/button.h>
+#include <wx/choice.h>
+#include <wx/combobox.h>
+#include <wx/msgdlg.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+
+#include "app/Companion.h"
+#include "app/Icons.h"
+#include "app/Log.h"
+#include "ui/DisplayText.h"
+#include "ui/QListBox.h"
+#include "ui/Schema.h"
+#include "ui/Theme.h"
+
+enum { LABEL_WIDTH = 96 };   // in the narrowest window
+enum { LONGEST_TIP = 1000 }; // characters
+static const char CommitTitle[] = "Commit of Bibliography Entry - Question";
+
+// --- Rows and their controls ---
+
+// The choice leaves out the fixed types, which no entry has.
+void Cartulo::FillTypes()
+{
+    int known = BibTypeCount - BIB_FIXED_TYPES;
+    for (int i = int(m_type->GetCount()); i < known; ++i)
+        m_type->Append(StoreText(BibTypeTable[BIB_FIXED_TYPES + i]));
+}
+
+// The part of a long text that a tip can show.
+static wxString TipText(const wxString &text)
+{
+    return text.length() > LONGEST_TIP ? text.Left(LONGEST_TIP) + L"\x2026" : text;
+}
+
+static bool Fits(const wxTextCtrl *value)
+{
+    wxString text = value->GetValue();
+    return text.length() <= LONGEST_TIP &&
+           value->GetSizeFromTextSize(value->GetTextExtent(text)).x <= value->GetSize().x;
+}
+
+// What is too long for the row can be read in its tip.
+void Cartulo::FitRow(int row)
+{
+    wxStaticText *label = m_rows[row].label;
+    wxTextCtrl *value = m_rows[row].value;
+    int widest = std::max(FromDIP(LABEL_WIDTH), m_entryPane->GetClientSize().x / 3);
+    int width = label->GetTextExtent(label->GetLabelText()).x;
+    label->SetMinSize(wxSize(std::min(width, widest), -1));
+    label->SetToolTip(width > widest ? label->GetLabelText() : wxString());
+    if (m_grid.rows[row].locked)
+        value->SetToolTip("This value is too long to be shown in full.");
+    else
+        value->SetToolTip(Fits(value) ? wxString() : TipText(value->GetValue()));
+}
+
+void Cartulo::OnEntryPaneSize(wxSizeEvent &event)
+{
+    for (int i = 0; i < std::min(m_rowCount, m_grid.count); ++i)
+        FitRow(i);
+    event.Skip();
+}
+
+// A text control holds no more than 65,534 bytes, and nothing behind a NUL: what it cannot hold is
+// not to be edited in it.
+void Cartulo::FillRows()
+{
+    CreateRows(m_grid.count);
+    for (int i = 0; i < m_grid.count; ++i) {
+        GridRow &row = m_grid.rows[i];
+        m_rows[i].value->ChangeValue(wxString(row.filled));
+        std::wstring held = m_rows[i].value->GetValue().ToStdWstring();
+        row.locked = held != row.filled;
+        row.filled = row.text = held;
+    }
+    WriteRows();
+}
+
+// What the user typed, into the rows.
+void Cartulo::ReadRows()
+{
+    for (int i = 0; i < m_grid.count; ++i)
+        m_grid.rows[i].text = m_rows[i].value->GetValue().ToStdWstring();
+}
+
+void Cartulo::WriteRow(int index)
+{
+    const GridRow &row = m_grid.rows[index];
+    FieldRow &controls = m_rows[index];
+    bool own = m_editMode && !row.inherited;
+    bool isCrossref = Grid_IsCrossref(&row);
+    controls.label->SetLabelText(StoreText(row.key.c_str()));
+    if (controls.value->GetValue().ToStdWstring() != row.text)
+        controls.value->ChangeValue(wxString(row.text));
+    controls.value->Enable(own && !isCrossref && !row.locked);
+    controls.remove->Enable(own);
+    controls.label->Show();
+    controls.value->Show();
+    controls.remove->Show(!isCrossref || !m_grid.target);
+    FitRow(index);
+}
+
+void Cartulo::HideRow(int index)
+{
+    m_rows[index].label->Hide();
+    m_rows[index].value->Hide();
+    m_rows[index].remove->Hide();
+}
+
+// A control that is hidden or disabled must not keep the focus: keys would be lost.
+void Cartulo::WriteRows()
+{
+    CreateRows(m_grid.count);
+    for (int i = 0; i < m_rowCount; ++i) {
+        bool hadFocus = m_rows[i].value->HasFocus();
+        if (hadFocus && i >= m_grid.count)
+            FocusForMode();
+        if (i < m_grid.count)
+            WriteRow(i);
+        else
+            HideRow(i);
+        if (hadFocus && !m_rows[i].value->IsEnabled())
+            FocusForMode();
+    }
+    ShowMoreFields(m_grid.hidden);
+}
+
+// Nobody shall take an entry with more fields than rows for one with that many fields.
+void Cartulo::ShowMoreFields(int count)
+{
+    m_moreFields->SetLabelText(count == 1
+                                   ? wxString("1 more field is not shown.")
+                                   : wxString::Format("%d more fields are not shown.", count));
+    m_moreFields->Show(count > 0);
+}
+
+void Cartulo::LayOutEntry()
+{
+    m_entryPane->FitInside(); // the scroll bar follows the rows
+    m_entryPane->Layout();
+}
+
+// --- Showing ---
+
+void Cartulo::ShowEntry(BibEntry *entry, int file)
+{
+    if (!entry)
+        return;
+    m_entry = entry;
+    m_file = file;
+    m_typeName = BibTypeTable[entry->type];
+    wxString path = PathText(m_set.files[file]->path);
+    m_entryPane->Freeze();
+    m_fileName->SetLabelText(path);
+    m_fileName->SetToolTip(path);
+    FillTypes();
+    m_type->SetSelection(std::max<int>(entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
+    m_type->Enable(m_editMode);
+    Grid_Fill(&m_grid, entry);
+    FillRows();
+    Update_Tools();
+    if (m_editMode)
+        CheckMandatoryFields(m_grid.count - 1);
+    else
+        Update_Field_Colors(m_typeName.c_str());
+    ShowEditControls();
+    LayOutEntry();
+    m_entryPane->Thaw();
+}
+
+void Cartulo::ClearEntry()
+{
+    m_entry = nullptr;
+    m_file = -1;
+    m_typeName.clear();
+    m_fileName->SetLabelText("");
+    m_fileName->UnsetToolTip();
+    m_type->SetSelection(wxNOT_FOUND);
+    Grid_Clear(&m_grid);
+    WriteRows();
+    Update_Tools();
+    ShowEditControls();
+    LayOutEntry();
+}
+
+void Cartulo::ShowEditControls()
+{
+    for (wxWindow *control : std::initializer_list<wxWindow *>{m_missingFields, m_newFieldLabel,
+                                                               m_newFieldKey, m_newField, m_done})
+        control->Show(m_editMode);
+}
+
+void Cartulo::Update_Field_Colors(const char *type)
+{
+    TNSMessage("INFO: Update_Field_Colors for ", type, TNS_LIFECYCLE);
+    for (int i = 0; i < m_grid.count; ++i) {
+        FieldClass fieldClass = Schema_FieldClass(m_ini.c_str(), type, m_grid.rows[i].key.c_str());
+        Theme_SetTextColour(m_rows[i].label, Schema_FieldColour(fieldClass));
+    }
+}
+
+void Cartulo::CheckMandatoryFields(int last)
+{
+    std::vector<SchemaRow> rows;
+    for (int i = 0; i <= last && i < m_grid.count; ++i)
+        rows.push_back({m_grid.rows[i].key, m_grid.rows[i].inherited});
+    Update_Field_Colors(m_typeName.c_str());
+    SchemaAdvice advice = Schema_Advise(m_ini.c_str(), m_typeName.c_str(), rows);
+    m_newFieldKey->Clear();
+    for (const std::string &key : advice.proposals)
+        m_newFieldKey->Append(StoreText(key.c_str()));
+    if (advice.selected >= 0)
+        m_newFieldKey->SetSelection(advice.selected);
+    wxString note = StoreText(advice.note.c_str());
+    m_missingFields->SetLabelText(note);
+    m_missingFields->SetToolTip(note);
+}
+
+void Cartulo::UpdateHelpText()
+{
+    std::string text = Schema_HelpText(m_ini.c_str(), m_typeName.c_str(), m_editMode);
+    m_help->ChangeValue(StoreText(text.c_str()));
+}
+
+// --- The mode ---
+
+void Cartulo::FocusForMode()
+{
+    if (m_editMode)
+        m_type->SetFocus();
+    else if (m_list->IsShown())
+        m_list->SetFocus();
+}
+
+// The list is enabled before it gets the focus, and disabled after it lost it.
+void Cartulo::SetEditMode(bool on)
+{
+    m_editMode = on;
+    if (!on)
+        m_list->Enable();
+    m_type->Enable(on);
+    FocusForMode();
+    m_list->Enable(!on);
+}
+
+void Cartulo::OnEditEntry(wxCommandEvent &)
+{
+    int row = m_list->GetSelection();
+    const IndexItem *item = m_list->Item(row);
+    if (!item) {
+        TNSMessage("WARNING: Cartulo::OnEditEntry ", "no selection in index", TNS_WARNING);
+        return;
+    }
+    TNSMessage("INFO: Cartulo::OnEditEntry to ", m_list->GetItemText(row).utf8_str(), TNS_ACTION);
+    if (m_set.files[item->file]->readOnly) {
+        ShowStatusError(this, "ERROR: You can't edit records in readonly BIB-file");
+        TNSMessage("WARNING: Cartulo::OnEditEntry ",
+                   "locked editing file opened in of readonly mode.", TNS_WARNING);
+        return;
+    }
+    SetEditMode(!m_editMode);
+    ShowEntry(item->entry, item->file);
+    UpdateHelpText();
+}
+
+void Cartulo::OnChangeType(wxCommandEvent &)
+{
+    TNSMessage("INFO: Cartulo::OnChangeType to ", "...", TNS_ACTION);
+    int type = m_type->GetSelection() + BIB_FIXED_TYPES;
+    if (type < BIB_FIXED_TYPES || type >= BibTypeCount)
+        return;
+    TNSMessage("INFO: Cartulo::OnChangeType to ", BibTypeTable[type], TNS_ACTION);
+    if (m_typeName != BibTypeTable[type]) {
+        m_typeName = BibTypeTable[type];
+        CheckMandatoryFields(m_grid.count - 1);
+        LayOutEntry();
+    }
+    UpdateHelpText();
+}
+
+// --- Committing ---
+
+void Cartulo::OnCommitEntry(wxCommandEvent &)
+{
+    TNSMessage("INFO: Cartulo::OnCommitEntry", "", TNS_ACTION);
+    bool nothingToShow = !m_entry && !m_editMode;
+    if (!nothingToShow && Commit())
+        LeaveEditing();
+}
+
+// The type that is chosen; the entry's own where none is.
+int Cartulo::ChosenType() const
+{
+    int type = m_type->GetSelection() + BIB_FIXED_TYPES;
+    return type >= BIB_FIXED_TYPES && type < BibTypeCount ? type : m_entry->type;
+}
+
+// Takes the edits over or drops them, as the user says. False when the editing goes on.
+bool Cartulo::Commit()
+{
+    if (!m_entry || !m_editMode || m_set.files[m_file]->readOnly)
+        return true;
+    ReadRows();
+    int type = ChosenType();
+    GridChanges changes = Grid_Compare(&m_grid, type);
+    if (!Grid_HasChanges(&changes))
+        return true;
+    int answer = Ask(StoreText(Grid_Question(&changes).c_str()), wxYES_NO | wxCANCEL);
+    if (answer != wxYES)
+        return answer == wxNO;
+    bool onlyType = changes.added == 0 && changes.modified == 0 && changes.removed == 0;
+    if (!onlyType)
+        return AcceptLosses() && CheckRows() && ReplaceEntry(type);
+    m_entry->type = type;
+    SetModified(m_file);
+    return true;
+}
+
+// A question about the commit. wxYES, wxNO or wxCANCEL.
+int Cartulo::Ask(const wxString &text, int buttons)
+{
+    m_busy = true; // another program may be activated meanwhile
+    int answer =
+        wxMessageBox(text, CommitTitle, buttons | wxICON_QUESTION, wxGetTopLevelParent(this));
+    m_busy = false;
+    return answer;
+}
+
+bool Cartulo::AcceptLosses()
+{
+    std::wstring losses = Grid_Losses(&m_grid);
+    return losses.empty() || Ask(wxString(losses), wxYES_NO) == wxYES;
+}
+
+// One box for each value that cannot be written; false when there is one.
+bool Cartulo::CheckRows()
+{
+    bool good = true;
+    for (int i = 0; i < m_grid.count; ++i) {
+        const char *reason = Grid_CheckRow(&m_grid, i);
+        if (!reason)
+            continue;
+        good = false;
+        ShowWarning(CommitTitle, "Wrong syntax of value in the field: `" +
+                                     StoreText(m_grid.rows[i].key.c_str()) + "':\n\n" +
+                                     StoreText(reason) +
+                                     "\n\nIn this reason modification of entire entry can't be "
+                                     "accepted.\nFix an error and try again.");
+    }
+    return good;
+}
+
+// Puts the entry as it was edited in the place of the old one. False when it cannot be built.
+bool Cartulo::ReplaceEntry(int type)
+{
+    if (!Grid_HasRoom(&m_grid)) {
+        ShowWarning(CommitTitle, "There are too many different names of fields in all open files."
+                                 "\n\nClose some of the files, or use known names.");
+        return false;
+    }
+    BibEntry *entry = Grid_Build(&m_grid, type);
+    if (!entry) {
+        AppLog("ERROR: Not enought memory for allocating new entry");
+        return false;
+    }
+    m_list->Drop_Index(); // its rows refer to the old entry
+    if (Grid_Replace(m_set.files[m_file], m_entry, entry)) {
+        m_entry = entry;
+        SetModified(m_file);
+        return true;
+    }
+    AppLog("ERROR: Can't locate our entry inside BIB-file data");
+    Bib_FreeEntry(entry);
+    return true;
+}
+
+// Back to the list, with the entry as it is in the store now. From the list, it is the way in.
+void Cartulo::LeaveEditing()
+{
+    SetEditMode(!m_editMode);
+    Grid_Clear(&m_grid); // the old entry may be gone
+    m_list->Update_Index(m_entry, m_search.c_str());
+    RefreshPane();
+    ShowEntry(m_entry, m_file);
+    FocusForMode();
+    UpdateHelpText();
+}
