@@ -247,9 +247,9 @@ void MyServer::RunNextCommand()
     if (!m_frame->MayTakeCommand())
         return; // the timer brings the next turn
     std::string command = m_commands.front();
-    m_commands.pop_front();
     m_running = true;
-    m_frame->TakeCommand(command.c_str());
+    if (m_frame->TakeCommand(command.c_str()))
+        m_commands.pop_front();
     m_running = false;
     if (!m_commands.empty())
         m_timer.StartOnce(TICK_NEXT);

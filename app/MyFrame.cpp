@@ -250,7 +250,8 @@ void MyFrame::UpdateCiteTool()
 
 void MyFrame::OnQuit(wxCommandEvent &)
 {
-    Close(true);
+    if (!m_panel || m_panel->FinishEditing())
+        Close(true);
 }
 
 void MyFrame::OnHelp(wxCommandEvent &)
@@ -283,14 +284,19 @@ void MyFrame::OnContextMenu(wxCommandEvent &)
 
 bool MyFrame::MayTakeCommand() const
 {
-    return m_dialogs->Open() == 0 && m_panel && !m_panel->IsBusy();
+    return m_dialogs->Open() == 0 && m_panel && !m_panel->IsBusy() &&
+           !(m_commandWaits && m_panel->InEditMode());
 }
 
-void MyFrame::TakeCommand(const char *commandLine)
+bool MyFrame::TakeCommand(const char *commandLine)
 {
+    m_commandWaits = !m_panel->FinishEditing();
+    if (m_commandWaits || !m_panel) // closed while it asked
+        return false;
     m_panel->ProcessCommand(commandLine, "Pellion");
     m_panel->ShowOpenFiles();
     UpdateCiteTool();
+    return true;
 }
 
 void MyFrame::OnFind(wxCommandEvent &)
@@ -394,7 +400,12 @@ void MyFrame::OnClose(wxCloseEvent &event)
             event.Veto();
         return; // a box about a file is open, and the constructor waits for it
     }
-    if (!MayClose(event.CanVeto())) {
+    bool mayVeto = event.CanVeto();
+    if (!m_panel->FinishEditing() && mayVeto) {
+        event.Veto();
+        return;
+    }
+    if (!MayClose(mayVeto)) {
         event.Veto();
         return;
     }

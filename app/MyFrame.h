@@ -36,7 +36,10 @@ public:
     // Command lines of other programs: only while nothing is being asked, loaded or saved. The
     // messages window and the About box may be open.
     bool MayTakeCommand() const;
-    void TakeCommand(const char *commandLine);
+
+    // False when the user wants to go on with the entry that is edited: the command waits until
+    // that is done.
+    bool TakeCommand(const char *commandLine);
 
 private:
     void Place();
@@ -68,9 +71,10 @@ private:
     int m_toolsWidth = 0;             // of the tool bar without the search field
     wxMenu *m_contextMenu = nullptr;  // nobody fills it yet
     bool m_autoSave = true;
-    wxRect m_place;        // where the window shall open
-    int m_corrections = 2; // tries that are left to put it there
-    int32_t m_shownAt = 0; // Sys_Milliseconds
+    bool m_commandWaits = false; // for the end of editing
+    wxRect m_place;              // where the window shall open
+    int m_corrections = 2;       // tries that are left to put it there
+    int32_t m_shownAt = 0;       // Sys_Milliseconds
 
     wxDECLARE_EVENT_TABLE();
 };

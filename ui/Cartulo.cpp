@@ -410,6 +410,8 @@ void Cartulo::ShowOpenFiles()
 
 void Cartulo::OnOpen(wxCommandEvent &)
 {
+    if (!FinishEditing())
+        return;
     wxFileDialog dialog(wxGetTopLevelParent(this), "Open BIB file", "", "",
                         "BIB files (*.bib)|*.bib;*.BIB", wxFD_OPEN | wxFD_FILE_MUST_EXIST);
     if (dialog.ShowModal() == wxID_OK)

@@ -34,6 +34,10 @@ public:
     // The button that closed the last window for adding or renaming an entry; 0 for none yet.
     int DialogResult() const { return m_dialogResult; }
 
+    // Ends editing as "Done" does: asks about changes. False when the user wants to go on with it,
+    // or has to. Whatever may take the entry away asks this first.
+    bool FinishEditing();
+
     // Carries out a command line: opens and closes files and rebuilds the list. `origin` says
     // where the line came from; it changes nothing. Returns 0. Call ShowOpenFiles after it.
     int ProcessCommand(const char *commandLine, const char *origin);

@@ -295,6 +295,15 @@ void Cartulo::OnCommitEntry(wxCommandEvent &)
         LeaveEditing();
 }
 
+bool Cartulo::FinishEditing()
+{
+    if (!m_editMode)
+        return true;
+    wxCommandEvent event;
+    OnCommitEntry(event);
+    return !m_editMode;
+}
+
 // The type that is chosen; the entry's own where none is.
 int Cartulo::ChosenType() const
 {

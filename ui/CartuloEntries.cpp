@@ -11,6 +11,8 @@
 
 void Cartulo::OnNewEntry(wxCommandEvent &)
 {
+    if (!FinishEditing())
+        return;
     if (Entry_WritableFiles(&m_set).empty()) {
         ShowStatus(this, "ERROR: You can't add entries to readonly BIB-files.", true);
         return;
@@ -29,6 +31,8 @@ void Cartulo::OnNewEntry(wxCommandEvent &)
 
 void Cartulo::OnRenameEntry(wxCommandEvent &)
 {
+    if (!FinishEditing())
+        return;
     if (m_file >= 0 && m_set.files[m_file]->readOnly) {
         ShowStatusError(this, "ERROR: You can't rename entry of ReadOnly file.");
         return;
@@ -53,6 +57,8 @@ void Cartulo::SelectInList(BibEntry *entry)
 void Cartulo::OnRemoveEntry(wxCommandEvent &)
 {
     TNSMessage("INFO: Cartulo::OnRemoveEntry ", "", TNS_ACTION);
+    if (!FinishEditing())
+        return;
     int row = m_list->GetSelection();
     if (row == wxNOT_FOUND) {
         TNSMessage("WARNING: Cartulo::OnRemoveEntry ", "no selection in index", TNS_WARNING);

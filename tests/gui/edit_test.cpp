@@ -286,6 +286,87 @@ TEST_F(Edit, LetsACrossrefWithoutTargetBeRemoved)
 
 // --- What may not cost an edit ---
 
+TEST_F(Edit, IsFinishedBeforeTheWindowCloses)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    wxTEST_DIALOG(frame->Close(), Question("NO", 0, 1, 0, wxID_CANCEL));
+    DeleteClosedWindows();
+    ASSERT_TRUE(frame);
+    EXPECT_TRUE(Panel()->InEditMode());
+    wxTEST_DIALOG(Close(), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_NE(std::string::npos, folder.Read("a.bib").find("New Title"));
+}
+
+TEST_F(Edit, IsFinishedBeforeTheQuitCommand)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    wxCommandEvent event(wxEVT_MENU, ID_EXIT);
+    wxTEST_DIALOG(frame->ProcessWindowEvent(event), Question("NO", 0, 1, 0, wxID_CANCEL));
+    DeleteClosedWindows();
+    ASSERT_TRUE(frame);
+    wxTEST_DIALOG(frame->ProcessWindowEvent(event), Question("NO", 0, 1, 0, wxID_NO));
+    DeleteClosedWindows();
+    EXPECT_FALSE(frame);
+    EXPECT_EQ(std::string::npos, folder.Read("a.bib").find("New Title"));
+}
+
+TEST_F(Edit, KeepsACommandWaiting)
+{
+    std::string other = folder.Write("b.bib", "@misc{two, note = {Second}}\n");
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    wxTEST_DIALOG(EXPECT_FALSE(frame->TakeCommand(other.c_str())),
+                  Question("NO", 0, 1, 0, wxID_CANCEL));
+    EXPECT_FALSE(frame->MayTakeCommand()); // asked once
+    EXPECT_EQ("New Title", Value("title")->GetValue());
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_TRUE(frame->MayTakeCommand());
+    EXPECT_TRUE(frame->TakeCommand(other.c_str()));
+    EXPECT_NE(std::string::npos, folder.Read("a.bib").find("New Title"));
+    EXPECT_EQ((std::vector<wxString>{"two (b)"}), Rows());
+}
+
+// Commands of the list reach the panel while an entry is edited when their keys were quicker.
+TEST_F(Edit, IsFinishedBeforeTheCommandsOnEntries)
+{
+    OpenText(Article);
+    for (int id : {ID_NEW_ENTRY, ID_RENAME_ENTRY, ID_REMOVE_ENTRY, ID_OPEN}) {
+        StartEditing();
+        SetValue("title", "New Title");
+        wxTEST_DIALOG(Send(id), Question("NO", 0, 1, 0, wxID_CANCEL));
+        EXPECT_TRUE(Panel()->InEditMode()) << id;
+        EXPECT_EQ("New Title", Value("title")->GetValue()) << id;
+        Send(ID_EDIT_ENTRY);
+    }
+    StartEditing();
+    SetValue("title", "New Title");
+    wxTEST_DIALOG(Send(ID_REMOVE_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
+                  ExpectBox("Removing Entry", "one (a)", wxID_NO));
+    EXPECT_FALSE(Panel()->InEditMode());
+    EXPECT_EQ("New Title", Value("title")->GetValue());
+}
+
+TEST_F(Edit, OutlivesASearch)
+{
+    OpenText(std::string(Article) + "@book{two, title = {Second}}\n");
+    StartEditing();
+    SetValue("title", "New Title");
+    for (const char *text : {"Second", "in no entry"}) {
+        SearchFor(text);
+        EXPECT_TRUE(Panel()->InEditMode());
+        EXPECT_EQ("New Title", Value("title")->GetValue());
+        EXPECT_TRUE(EntryPane()->IsShownOnScreen());
+    }
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_TRUE(IsShowing(ID_NEW_ENTRY));
+    EXPECT_NE(std::string::npos, Saved().find("New Title"));
+}
+
 TEST_F(Edit, LeavesTheListOnASearchThatTheEntryNoLongerMatches)
 {
     OpenText(Article);
