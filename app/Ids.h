@@ -28,7 +28,8 @@ enum {
     ID_REMOVE_FIELD,
     ID_EDIT_FIELD,
     ID_CONTEXT_MENU,
-    ID_REMOVE_ROW = 6023, // the first row's; one each
+    ID_REMOVE_ROW = 6023,     // the first row's; one each
+    ID_REMOVE_ROW_END = 6039, // behind the last row's
     ID_COMMAND_LAST = 6040
 };
 

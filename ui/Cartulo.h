@@ -106,6 +106,7 @@ private:
     void LayOutEntry();
     void SetEditMode(bool on);
     void FocusForMode();
+    int FocusedRow() const;
     void LeaveEditing();
     int ChosenType() const;
     bool Commit();
@@ -113,6 +114,8 @@ private:
     bool AcceptLosses();
     bool CheckRows();
     bool ReplaceEntry(int type);
+    void AddField(const std::string &key);
+    void RemoveRow(int row);
     void SelectInList(BibEntry *entry);
     void RemoveEntry(int row);
     void UpdateSaveTool();
@@ -132,6 +135,10 @@ private:
     void OnEditEntry(wxCommandEvent &event);
     void OnChangeType(wxCommandEvent &event);
     void OnCommitEntry(wxCommandEvent &event);
+    void OnNewField(wxCommandEvent &event);
+    void OnEditField(wxCommandEvent &event);
+    void OnRenameField(wxCommandEvent &event);
+    void OnRemoveField(wxCommandEvent &event);
     void OnSashMove(wxSplitterEvent &event);
     void OnEntryPaneSize(wxSizeEvent &event);
     void OnPaint(wxPaintEvent &event);

@@ -6,6 +6,7 @@
 #include <wx/button.h>
 #include <wx/choice.h>
 #include <wx/combobox.h>
+#include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "app/Ids.h"
@@ -68,14 +69,27 @@ protected:
     }
 
     void SetValue(const wxString &key, const wxString &text) { Value(key)->SetValue(text); }
+
+    // What is said of missing fields.
+    wxString Note() const
+    {
+        wxString last;
+        for (wxWindow *child : EntryPane()->GetChildren())
+            if (wxStaticText *text = dynamic_cast<wxStaticText *>(child))
+                last = text->GetLabelText();
+        return last;
+    }
+
     wxButton *Remover(int row) const
     {
         return dynamic_cast<wxButton *>(Panel()->FindWindow(ID_REMOVE_ROW + row));
     }
+
     wxComboBox *NewKey() const
     {
         return dynamic_cast<wxComboBox *>(Panel()->FindWindow(ID_NEW_FIELD_KEY));
     }
+
     wxChoice *Type() const { return dynamic_cast<wxChoice *>(Panel()->FindWindow(ID_TYPE)); }
 
     void Choose(const wxString &type)
@@ -85,6 +99,8 @@ protected:
         event.SetEventObject(Type());
         Type()->ProcessWindowEvent(event);
     }
+
+    void PressRemover(int row) { Press(ID_REMOVE_ROW + row); }
 
     void AddField(const wxString &key)
     {
@@ -106,7 +122,7 @@ protected:
                                           "\tmodified fields: \t%d\n\tremoved fields: \t%d\n"
                                           "\nDo you want to accept these changes ?",
                                           type, added, modified, removed),
-                         button);
+                         button, wxYES_NO | wxCANCEL | wxICON_QUESTION);
     }
 
     std::string Saved()

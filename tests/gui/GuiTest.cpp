@@ -61,8 +61,8 @@ protected:
     }
 };
 
-ExpectBox::ExpectBox(const wxString &caption, const wxString &text, int button)
-    : m_caption(caption), m_text(text), m_button(button)
+ExpectBox::ExpectBox(const wxString &caption, const wxString &text, int button, long style)
+    : m_caption(caption), m_text(text), m_button(button), m_style(style)
 {
 }
 
@@ -70,6 +70,10 @@ int ExpectBox::OnInvoked(wxMessageDialog *dialog) const
 {
     EXPECT_EQ(m_caption, dialog->GetTitle());
     EXPECT_EQ(m_text, dialog->GetMessage());
+    const long looks = wxOK | wxCANCEL | wxYES_NO | wxNO_DEFAULT | wxICON_MASK;
+    if (m_style != 0) {
+        EXPECT_EQ(m_style, dialog->GetMessageDialogStyle() & looks);
+    }
     return m_button;
 }
 

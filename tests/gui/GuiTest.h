@@ -36,11 +36,12 @@ protected:
     void ReportFailure(const wxString &message) override;
 };
 
-// A message box with this caption and text; `button` closes it.
+// A message box with this caption and text; `button` closes it. `style`, unless it is 0, tells its
+// buttons and icon.
 class ExpectBox : public wxExpectModalBase<wxMessageDialog, ExpectBox>
 {
 public:
-    ExpectBox(const wxString &caption, const wxString &text, int button);
+    ExpectBox(const wxString &caption, const wxString &text, int button, long style = 0);
 
 protected:
     int OnInvoked(wxMessageDialog *dialog) const override;
@@ -49,6 +50,7 @@ protected:
 private:
     wxString m_caption, m_text;
     int m_button;
+    long m_style;
 };
 
 // The loading-messages window with this heading; `text` (may be null) receives its text.

@@ -23,27 +23,6 @@ using Lines = std::vector<LogLine>;
 namespace
 {
 
-// A message box whose buttons and icon count, too.
-class ExpectStyledBox : public ExpectBox
-{
-public:
-    ExpectStyledBox(const wxString &caption, const wxString &text, long style, int button)
-        : ExpectBox(caption, text, button), m_style(style)
-    {
-    }
-
-protected:
-    int OnInvoked(wxMessageDialog *dialog) const override
-    {
-        EXPECT_EQ(m_style, dialog->GetMessageDialogStyle() &
-                               (wxOK | wxCANCEL | wxYES_NO | wxNO_DEFAULT | wxICON_MASK));
-        return ExpectBox::OnInvoked(dialog);
-    }
-
-private:
-    long m_style;
-};
-
 using UseNew = UseDialog<Cartulo_NewEntry>;
 using UseRename = UseDialog<Cartulo_RenameEntry>;
 
@@ -325,9 +304,9 @@ TEST_F(NewEntry, StaysOpenOnAnEmptyKey)
 {
     Open(folder.Write("a.bib", Talks));
     auto press = [](Cartulo_NewEntry &dialog) { EXPECT_FALSE(PressOK(dialog, " \t ")); };
-    wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(press),
-                  ExpectStyledBox(Adding, "Please enter key of the new bibliography entry.",
-                                  Refusal, wxID_OK));
+    wxTEST_DIALOG(
+        Run(ID_NEW_ENTRY), UseNew(press),
+        ExpectBox(Adding, "Please enter key of the new bibliography entry.", wxID_OK, Refusal));
     EXPECT_EQ(1u, Rows().size());
     EXPECT_EQ(0, Modified(0));
 }
@@ -351,9 +330,8 @@ TEST_F(NewEntry, OffersToTakeBadCharactersOut)
         EXPECT_EQ("ab", KeyOf(dialog)->GetValue());
         EXPECT_TRUE(PressOK(dialog, KeyOf(dialog)->GetValue()));
     };
-    wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(press),
-                  ExpectStyledBox(Adding, BadChars, Offer, wxID_CANCEL),
-                  ExpectStyledBox(Adding, BadChars, Offer, wxID_OK));
+    wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(press), ExpectBox(Adding, BadChars, wxID_CANCEL, Offer),
+                  ExpectBox(Adding, BadChars, wxID_OK, Offer));
     EXPECT_EQ("ab (a)", Selected());
 }
 
@@ -367,11 +345,10 @@ TEST_F(NewEntry, RefusesKeysThatCantBeStored)
         EXPECT_TRUE(PressOK(dialog, wxString(L"M\u00FCller")));
     };
     wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(press),
-                  ExpectStyledBox(Adding,
-                                  "The key includes characters that can't be stored in CP1252.",
-                                  Refusal, wxID_OK),
-                  ExpectStyledBox(Adding, "An entry with this key can't be written to a BIB file.",
-                                  Refusal, wxID_OK));
+                  ExpectBox(Adding, "The key includes characters that can't be stored in CP1252.",
+                            wxID_OK, Refusal),
+                  ExpectBox(Adding, "An entry with this key can't be written to a BIB file.",
+                            wxID_OK, Refusal));
     EXPECT_STREQ("M\xFCller", Panel()->CurrentEntry()->key);
 }
 
@@ -382,9 +359,9 @@ TEST_F(NewEntry, RefusesKeysOfTheFile)
         EXPECT_FALSE(PressOK(dialog, "gRISKE84"));
         EXPECT_EQ("gRISKE84", KeyOf(dialog)->GetValue());
     };
-    wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(press),
-                  ExpectStyledBox(Adding, "Specified Key is already present in the BIB file.",
-                                  Refusal, wxID_OK));
+    wxTEST_DIALOG(
+        Run(ID_NEW_ENTRY), UseNew(press),
+        ExpectBox(Adding, "Specified Key is already present in the BIB file.", wxID_OK, Refusal));
     EXPECT_EQ(1u, Rows().size());
 }
 
@@ -397,10 +374,9 @@ TEST_F(NewEntry, AsksAboutKeysOfOtherFiles)
         EXPECT_FALSE(PressOK(dialog, "ost77"));
         EXPECT_TRUE(PressOK(dialog, "ost77"));
     };
-    wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(press),
-                  ExpectStyledBox(Adding, Elsewhere, Question, wxID_NO),
-                  ExpectStyledBox(Adding, Elsewhere, Question, wxID_CANCEL),
-                  ExpectStyledBox(Adding, Elsewhere, Question, wxID_YES));
+    wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(press), ExpectBox(Adding, Elsewhere, wxID_NO, Question),
+                  ExpectBox(Adding, Elsewhere, wxID_CANCEL, Question),
+                  ExpectBox(Adding, Elsewhere, wxID_YES, Question));
     EXPECT_EQ("ost77 (a)", Selected());
     EXPECT_EQ(3u, Rows().size());
 }
@@ -439,13 +415,12 @@ TEST_F(NewEntry, RefusesTypesWithFieldsThatCantBeWritten)
 {
     Open(folder.Write("a.bib", Books));
     folder.Write("Cartulo/cartulo.ini", "[book]\nend page=*\n");
-    wxTEST_DIALOG(
-        Run(ID_NEW_ENTRY),
-        UseNew([](Cartulo_NewEntry &dialog) { EXPECT_FALSE(PressOK(dialog, "new1")); }),
-        ExpectStyledBox(Adding,
-                        "The type `book' asks for the field `end page', which can't be written "
-                        "to a BIB file.",
-                        Refusal, wxID_OK));
+    wxTEST_DIALOG(Run(ID_NEW_ENTRY),
+                  UseNew([](Cartulo_NewEntry &dialog) { EXPECT_FALSE(PressOK(dialog, "new1")); }),
+                  ExpectBox(Adding,
+                            "The type `book' asks for the field `end page', which can't be written "
+                            "to a BIB file.",
+                            wxID_OK, Refusal));
     EXPECT_EQ(0, Modified(0));
 }
 
@@ -559,9 +534,9 @@ TEST_F(RenameEntry, ClosesOnAnEmptyKey)
 {
     Open(folder.Write("a.bib", Talks));
     auto press = [](Cartulo_RenameEntry &dialog) { EXPECT_TRUE(PressOK(dialog, " ")); };
-    wxTEST_DIALOG(Run(ID_RENAME_ENTRY), UseRename(press),
-                  ExpectStyledBox(Renaming, "Please enter new key for the bibliography entry.",
-                                  Refusal, wxID_OK));
+    wxTEST_DIALOG(
+        Run(ID_RENAME_ENTRY), UseRename(press),
+        ExpectBox(Renaming, "Please enter new key for the bibliography entry.", wxID_OK, Refusal));
     EXPECT_EQ("Griske84 (a)", Selected());
     EXPECT_EQ(0, Modified(0));
 }
@@ -586,9 +561,9 @@ TEST_F(RenameEntry, RefusesKeysOfTheFile)
         EXPECT_FALSE(PressOK(dialog, "OST77"));
         EXPECT_EQ("OST77", KeyOf(dialog)->GetValue());
     };
-    ExpectStyledBox taken(Renaming, "Specified New Key is already present in the BIB file.",
-                          Refusal, wxID_OK);
-    ExpectStyledBox again = taken;
+    ExpectBox taken(Renaming, "Specified New Key is already present in the BIB file.", wxID_OK,
+                    Refusal);
+    ExpectBox again = taken;
     wxTEST_DIALOG(Run(ID_RENAME_ENTRY), UseRename(press), taken, again);
     EXPECT_STREQ("Griske84", Panel()->CurrentEntry()->key);
 }
@@ -605,11 +580,10 @@ TEST_F(RenameEntry, OffersToTakeBadCharactersOut)
         EXPECT_TRUE(PressOK(dialog, "ab"));
     };
     wxTEST_DIALOG(Run(ID_RENAME_ENTRY), UseRename(press),
-                  ExpectStyledBox(Renaming, BadChars, Offer, wxID_CANCEL),
-                  ExpectStyledBox(Renaming, BadChars, Offer, wxID_OK),
-                  ExpectStyledBox(Renaming,
-                                  "An entry with this key can't be written to a BIB file.", Refusal,
-                                  wxID_OK));
+                  ExpectBox(Renaming, BadChars, wxID_CANCEL, Offer),
+                  ExpectBox(Renaming, BadChars, wxID_OK, Offer),
+                  ExpectBox(Renaming, "An entry with this key can't be written to a BIB file.",
+                            wxID_OK, Refusal));
     EXPECT_EQ("ab (a)", Selected());
 }
 
@@ -621,8 +595,8 @@ TEST_F(RenameEntry, AsksAboutKeysOfOtherFiles)
         EXPECT_TRUE(PressOK(dialog, "ost77"));
     };
     wxTEST_DIALOG(Run(ID_RENAME_ENTRY), UseRename(press),
-                  ExpectStyledBox(Renaming, Elsewhere, Question, wxID_NO),
-                  ExpectStyledBox(Renaming, Elsewhere, Question, wxID_YES));
+                  ExpectBox(Renaming, Elsewhere, wxID_NO, Question),
+                  ExpectBox(Renaming, Elsewhere, wxID_YES, Question));
     EXPECT_EQ("ost77 (a)", Selected());
 }
 
@@ -650,7 +624,7 @@ TEST_F(RemoveEntry, AsksFirst)
     Open(folder.Write("R&D.bib", Talks));
     // The icon is the toolkit's own for a box without one.
     wxTEST_DIALOG(Run(ID_REMOVE_ENTRY),
-                  ExpectStyledBox("Removing Entry", "Griske84 (R&D)", Question, wxID_NO));
+                  ExpectBox("Removing Entry", "Griske84 (R&D)", wxID_NO, Question));
     EXPECT_EQ(1u, Rows().size());
     EXPECT_EQ(0, Modified(0));
 }
@@ -710,10 +684,10 @@ TEST_F(RemoveEntry, IsRefusedWhereEntriesBeforeItReferToIt)
     Open(folder.Write("a.bib", Family));
     Select("parent (a)");
     wxTEST_DIALOG(Run(ID_REMOVE_ENTRY), ExpectBox("Removing Entry", "parent (a)", wxID_YES),
-                  ExpectStyledBox("Removing Bibliography Entry",
-                                  "The entry `parent' can't be removed, because following "
-                                  "entries:\n\n`first', `second'.\n\nrefer it in `crossref' field.",
-                                  Refusal, wxID_OK));
+                  ExpectBox("Removing Bibliography Entry",
+                            "The entry `parent' can't be removed, because following "
+                            "entries:\n\n`first', `second'.\n\nrefer it in `crossref' field.",
+                            wxID_OK, Refusal));
     EXPECT_EQ(4u, Rows().size());
     EXPECT_EQ(0, Modified(0));
     EXPECT_STREQ("parent", Panel()->CurrentEntry()->key);

@@ -1,0 +1,44 @@
+// ui/FieldDialogs.h - the windows for a field of the entry that is edited: its value, its name.
+#pragma once
+
+#include <wx/dialog.h>
+
+#include "ui/FieldGrid.h"
+
+class wxComboBox;
+class wxTextCtrl;
+
+class Cartulo_EditField : public wxDialog
+{
+public:
+    Cartulo_EditField(wxWindow *parent, const wxString &key, const wxString &value);
+
+    wxString Value() const;
+
+private:
+    void OnOK(wxCommandEvent &event);
+
+    wxTextCtrl *m_value; // child window
+
+    wxDECLARE_EVENT_TABLE();
+};
+
+class Cartulo_RenameField : public wxDialog
+{
+public:
+    // `grid` outlives the dialog; `proposals` are the keys of the type's fields.
+    Cartulo_RenameField(wxWindow *parent, const FieldGrid *grid, const wxString &key,
+                        const wxArrayString &proposals, const wxString &proposal);
+
+    std::string NewName() const { return m_newName; } // store text; "" when nothing is to change
+
+private:
+    void OnOK(wxCommandEvent &event);
+    void Refuse(const wxString &text);
+
+    const FieldGrid *m_grid;
+    wxComboBox *m_name; // child window
+    std::string m_newName;
+
+    wxDECLARE_EVENT_TABLE();
+};
