@@ -65,3 +65,10 @@ int Native_LatinLetter(const wxKeyEvent &event)
     }
     return 0;
 }
+
+int Native_HeightForWidth(const wxWindow *window, int width)
+{
+    int least, natural;
+    gtk_widget_get_preferred_height_for_width(window->GetHandle(), width, &least, &natural);
+    return natural;
+}

@@ -17,3 +17,6 @@ bool Native_IsMapped(wxWindow *window);
 // The Latin letter, in upper case, that is printed on the key, whatever the keyboard layout makes
 // of it; 0 for other keys.
 int Native_LatinLetter(const wxKeyEvent &event);
+
+// The height of a text that is wrapped to this width.
+int Native_HeightForWidth(const wxWindow *window, int width);

@@ -33,7 +33,8 @@
 #include "ui/Schema.h"
 #include "ui/Theme.h"
 
-enum { SASH_POSITION = 300, SMALLEST_PANE = 20, COLUMN_GAP = 8, PANE_BORDER = 8, HELP_HEIGHT = 40 };
+enum { SASH_POSITION = 300, SMALLEST_PANE = 20, HELP_HEIGHT = 40 };
+enum { NEW_KEY_WIDTH = 120 };
 enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window
 static const char SashKey[] = "/MainWindow/Splitter"; // in the toolkit's configuration
 static const double LIST_SHARE = 0.35;                // of what the window grows or shrinks
@@ -199,20 +200,20 @@ wxSizer *Cartulo::CreateNewFieldRow()
     m_newFieldKey = new wxComboBox(m_entryPane, ID_NEW_FIELD_KEY);
     m_newField = new xBitmapButton(m_entryPane, ID_NEW_FIELD, "&Add", "list-add");
     m_newField->SetToolTip("Add new fields to the Entry with specified key (Alt+A)");
+    m_newFieldKey->SetMinSize(FromDIP(wxSize(NEW_KEY_WIDTH, -1)));
     m_missingFields = new wxStaticText(m_entryPane, wxID_ANY, "(no comment)");
     m_done = new wxButton(m_entryPane, ID_COMMIT_ENTRY, "Done");
     m_done->SetToolTip("Finish editing the entry.");
-    wxBoxSizer *row = new wxBoxSizer(wxHORIZONTAL);
+    m_newFieldRow = new wxBoxSizer(wxHORIZONTAL);
     wxSizerFlags place = wxSizerFlags().CentreVertical().Border(wxRIGHT, FromDIP(COLUMN_GAP));
-    for (wxWindow *control : std::initializer_list<wxWindow *>{m_newFieldLabel, m_newFieldKey,
-                                                               m_newField, m_missingFields}) {
-        row->Add(control, place);
-        control->Hide(); // until an entry is edited
-    }
-    row->AddStretchSpacer();
-    row->Add(m_done);
-    m_done->Hide();
-    return row;
+    m_newFieldRow->Add(m_newFieldLabel, place);
+    m_newFieldRow->Add(m_newFieldKey, place);
+    m_newFieldRow->Add(m_newField, place);
+    m_newFieldRow->Add(m_missingFields, place);
+    m_newFieldRow->AddStretchSpacer();
+    m_newFieldRow->Add(m_done, wxSizerFlags().CentreVertical());
+    ShowEditControls();
+    return m_newFieldRow;
 }
 
 void Cartulo::CreateEntryPane()
@@ -228,13 +229,15 @@ void Cartulo::CreateEntryPane()
     m_moreFields = new wxStaticText(m_entryPane, wxID_ANY, "");
     column->Add(m_moreFields, place);
     column->Add(CreateNewFieldRow(), place);
+    m_noteLine = new wxBoxSizer(wxVERTICAL);
+    column->Add(m_noteLine, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, FromDIP(PANE_BORDER)));
     m_help = new wxTextCtrl(m_entryPane, wxID_ANY, "Ctrl+F1 to help", wxDefaultPosition,
                             wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY | wxTE_NO_VSCROLL);
     m_help->SetMinSize(FromDIP(wxSize(-1, HELP_HEIGHT)));
     column->Add(m_help, wxSizerFlags(place).Proportion(1));
     m_entryPane->SetSizer(column);
     m_entryPane->SetScrollRate(0, FromDIP(16));
-    m_entryPane->Bind(wxEVT_SIZE, &Cartulo::OnEntryPaneSize, this);
+    m_entryPane->Bind(wxEVT_SIZE, &Cartulo::OnEntrySize, this);
     m_entryPane->Hide();
 }
 

@@ -68,6 +68,8 @@ public:
     void OnIndexActivate(wxCommandEvent &event); // a row was double-clicked
 
 private:
+    enum { COLUMN_GAP = 8, PANE_BORDER = 8 }; // of the entry pane
+
     struct FieldRow {
         wxStaticText *label;
         wxTextCtrl *value;
@@ -104,6 +106,7 @@ private:
     void ShowMoreFields(int count);
     void ShowEditControls();
     void LayOutEntry();
+    void PlaceNote();
     void SetEditMode(bool on);
     void FocusForMode();
     int FocusedRow() const;
@@ -139,8 +142,8 @@ private:
     void OnEditField(wxCommandEvent &event);
     void OnRenameField(wxCommandEvent &event);
     void OnRemoveField(wxCommandEvent &event);
+    void OnEntrySize(wxSizeEvent &event);
     void OnSashMove(wxSplitterEvent &event);
-    void OnEntryPaneSize(wxSizeEvent &event);
     void OnPaint(wxPaintEvent &event);
     bool TryBefore(wxEvent &event) override;
 
@@ -176,6 +179,8 @@ private:
     wxStaticText *m_missingFields = nullptr;
     wxButton *m_done = nullptr;
     wxTextCtrl *m_help = nullptr;
+    wxSizer *m_newFieldRow = nullptr; // of the entry pane, as is
+    wxSizer *m_noteLine = nullptr;    // the place for a long note on missing fields
 
     wxDECLARE_EVENT_TABLE();
 };

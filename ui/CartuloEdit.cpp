@@ -8,12 +8,14 @@
 #include <wx/choice.h>
 #include <wx/combobox.h>
 #include <wx/msgdlg.h>
+#include <wx/sizer.h>
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "app/Companion.h"
 #include "app/Icons.h"
 #include "app/Log.h"
+#include "app/Native.h"
 #include "ui/DisplayText.h"
 #include "ui/QListBox.h"
 #include "ui/Schema.h"
@@ -21,6 +23,9 @@
 
 enum { LABEL_WIDTH = 96 };   // in the narrowest window
 enum { LONGEST_TIP = 1000 }; // characters
+enum { LONGEST_TYPE = 300 }; // what is shown of one
+enum { NOTE_INDEX = 3 };     // of the note on missing fields in its row
+
 static const char CommitTitle[] = "Commit of Bibliography Entry - Question";
 
 // --- Rows and their controls ---
@@ -30,7 +35,8 @@ void Cartulo::FillTypes()
 {
     int known = BibTypeCount - BIB_FIXED_TYPES;
     for (int i = int(m_type->GetCount()); i < known; ++i)
-        m_type->Append(StoreText(BibTypeTable[BIB_FIXED_TYPES + i]));
+        m_type->Append(
+            ShortText(m_type, StoreText(BibTypeTable[BIB_FIXED_TYPES + i]), LONGEST_TYPE));
 }
 
 // The part of a long text that a tip can show.
@@ -59,13 +65,6 @@ void Cartulo::FitRow(int row)
         value->SetToolTip("This value is too long to be shown in full.");
     else
         value->SetToolTip(Fits(value) ? wxString() : TipText(value->GetValue()));
-}
-
-void Cartulo::OnEntryPaneSize(wxSizeEvent &event)
-{
-    for (int i = 0; i < std::min(m_rowCount, m_grid.count); ++i)
-        FitRow(i);
-    event.Skip();
 }
 
 // A text control holds no more than 65,534 bytes, and nothing behind a NUL: what it cannot hold is
@@ -110,8 +109,11 @@ void Cartulo::WriteRow(int index)
 void Cartulo::HideRow(int index)
 {
     m_rows[index].label->Hide();
-    m_rows[index].value->Hide();
-    m_rows[index].remove->Hide();
+    for (wxWindow *control :
+         std::initializer_list<wxWindow *>{m_rows[index].value, m_rows[index].remove}) {
+        control->Hide();
+        control->Disable();
+    }
 }
 
 // A control that is hidden or disabled must not keep the focus: keys would be lost.
@@ -145,6 +147,43 @@ void Cartulo::LayOutEntry()
 {
     m_entryPane->FitInside(); // the scroll bar follows the rows
     m_entryPane->Layout();
+    PlaceNote();
+}
+
+// The note on missing fields stands beside the button that adds one where there is room for it in
+// one line, else below, in as many lines as it takes: sizers know nothing of those.
+void Cartulo::PlaceNote()
+{
+    if (!m_missingFields->IsShown())
+        return;
+    const int width = m_entryPane->GetClientSize().x - 2 * FromDIP(PANE_BORDER);
+    int room = width - 4 * FromDIP(COLUMN_GAP);
+    for (const wxWindow *control : std::initializer_list<const wxWindow *>{
+             m_newFieldLabel, m_newFieldKey, m_newField, m_done})
+        room -= control->GetEffectiveMinSize().x;
+    const bool beside = m_missingFields->GetBestSize().x <= room;
+    wxSize size = wxDefaultSize;
+    if (!beside)
+        size = wxSize(1, Native_HeightForWidth(m_missingFields, width));
+    wxSizer *place = beside ? m_newFieldRow : m_noteLine;
+    if (m_missingFields->GetContainingSizer() == place && m_missingFields->GetMinSize() == size)
+        return;
+    m_missingFields->GetContainingSizer()->Detach(m_missingFields);
+    m_missingFields->SetMinSize(size);
+    if (beside)
+        place->Insert(NOTE_INDEX, m_missingFields, wxSizerFlags().CentreVertical());
+    else
+        place->Add(m_missingFields, wxSizerFlags().Expand());
+    m_entryPane->FitInside();
+    m_entryPane->Layout();
+}
+
+void Cartulo::OnEntrySize(wxSizeEvent &event)
+{
+    event.Skip();
+    for (int i = 0; i < std::min(m_rowCount, m_grid.count); ++i)
+        FitRow(i);
+    CallAfter(&Cartulo::PlaceNote); // when the sizers have done their work
 }
 
 // --- Showing ---

@@ -1,5 +1,7 @@
 #include "ui/DisplayText.h"
 
+#include <wx/control.h>
+#include <wx/dcclient.h>
 #include <wx/strconv.h>
 
 #include "encoding/Encoding.h"
@@ -23,4 +25,12 @@ std::wstring PathTextWide(const char *text)
 std::string PathBytes(const wxString &path)
 {
     return std::string(path.fn_str());
+}
+
+wxString ShortText(const wxWindow *control, const wxString &text, int width)
+{
+    wxClientDC dc(const_cast<wxWindow *>(control));
+    dc.SetFont(control->GetFont());
+    return wxControl::Ellipsize(text, dc, wxELLIPSIZE_MIDDLE, control->FromDIP(width),
+                                wxELLIPSIZE_FLAGS_NONE);
 }

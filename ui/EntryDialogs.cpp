@@ -4,7 +4,6 @@
 
 #include <wx/checkbox.h>
 #include <wx/choice.h>
-#include <wx/dcclient.h>
 #include <wx/msgdlg.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
@@ -57,26 +56,18 @@ void EntryDialog::AddButtons()
     m_key->SetFocus();
 }
 
-// A choice is as wide as its longest item.
-wxString EntryDialog::Shorten(const wxString &text) const
-{
-    wxClientDC dc(m_file);
-    dc.SetFont(GetFont());
-    return wxControl::Ellipsize(text, dc, wxELLIPSIZE_MIDDLE, FromDIP(LONGEST_ITEM),
-                                wxELLIPSIZE_FLAGS_NONE);
-}
-
 void EntryDialog::FillFiles()
 {
     for (int file : m_files)
-        m_file->Append(Shorten(PathText(Entry_FileLabel(m_current.set, m_files, file).c_str())));
+        m_file->Append(ShortText(
+            m_file, PathText(Entry_FileLabel(m_current.set, m_files, file).c_str()), LONGEST_ITEM));
 }
 
 // The fixed types, which no entry has, are not offered.
 void EntryDialog::FillTypes()
 {
     for (int i = BIB_FIXED_TYPES; i < BibTypeCount; ++i)
-        m_type->Append(Shorten(StoreText(BibTypeTable[i])));
+        m_type->Append(ShortText(m_type, StoreText(BibTypeTable[i]), LONGEST_ITEM));
     if (m_current.entry)
         m_type->SetSelection(std::max<int>(m_current.entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
 }

@@ -58,7 +58,6 @@ protected:
     wxChoice *m_type;
 
 private:
-    wxString Shorten(const wxString &text) const;
     void FillFiles();
     void FillTypes();
     void ReplaceBadChars(std::string key);

@@ -71,14 +71,15 @@ protected:
     void SetValue(const wxString &key, const wxString &text) { Value(key)->SetValue(text); }
 
     // What is said of missing fields.
-    wxString Note() const
+    wxStaticText *NoteText() const
     {
-        wxString last;
+        wxStaticText *last = nullptr;
         for (wxWindow *child : EntryPane()->GetChildren())
             if (wxStaticText *text = dynamic_cast<wxStaticText *>(child))
-                last = text->GetLabelText();
+                last = text;
         return last;
     }
+    wxString Note() const { return NoteText()->GetLabelText(); }
 
     wxButton *Remover(int row) const
     {

@@ -3,6 +3,7 @@
 #include "tests/gui/EditTest.h"
 
 #include "app/Companion.h"
+#include "app/Native.h"
 
 using Lines = std::vector<LogLine>;
 
@@ -102,6 +103,27 @@ TEST_F(Edit, ExplainsTheKeysOfTheMode)
     EXPECT_TRUE(help().EndsWith("`article' entry is for a paper")) << help();
     Choose("book");
     EXPECT_TRUE(help().EndsWith("`book' entry is for Custom Entry Type")) << help();
+}
+
+// Wherever the window leaves room for it, the note is whole, and "Done" can be reached.
+TEST_F(Edit, NotesMissingFieldsInFull)
+{
+    OpenText("@article{one, note = {N}}\n");
+    StartEditing();
+    ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
+    wxWindow *done = Panel()->FindWindow(ID_COMMIT_ENTRY);
+    auto fits = [&] {
+        const int width = EntryPane()->GetClientSize().x;
+        const wxStaticText *note = NoteText();
+        int height = Native_HeightForWidth(note, note->GetSize().x);
+        return note->GetRect().GetRight() < width && done->GetRect().GetRight() < width &&
+               note->GetSize().y >= height && !note->GetRect().Intersects(done->GetRect());
+    };
+    for (int width : {512, 800, 1200}) {
+        frame->SetSize(frame->FromDIP(wxSize(width, 600)));
+        ASSERT_TRUE(WaitFor([&] { return frame->GetSize().x == frame->FromDIP(width); })) << width;
+        EXPECT_TRUE(WaitFor(fits)) << width;
+    }
 }
 
 // --- The commit ---

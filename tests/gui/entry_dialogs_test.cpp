@@ -102,21 +102,10 @@ class EntryCommands : public CartuloWindow
 protected:
     void SetUp() override
     {
-        const char *old = getenv("XDG_CONFIG_HOME");
-        m_config = old ? old : "";
         setenv("XDG_CONFIG_HOME", folder.Path().c_str(), 1);
         std::filesystem::create_directory(folder.Path("Cartulo"));
         folder.Write("Cartulo/cartulo.ini",
                      "[misc]\nnote=\n[book]\nauthor=*editor\neditor=*author\ntitle=*\nyear=\n");
-    }
-
-    void TearDown() override
-    {
-        CartuloWindow::TearDown();
-        if (m_config.empty())
-            unsetenv("XDG_CONFIG_HOME");
-        else
-            setenv("XDG_CONFIG_HOME", m_config.c_str(), 1);
     }
 
     void Run(int command)
@@ -180,9 +169,6 @@ protected:
     }
 
     wxUIActionSimulator keys;
-
-private:
-    std::string m_config;
 };
 
 using NewEntry = EntryCommands;
@@ -295,7 +281,6 @@ TEST_F(NewEntry, ShortensLongNames)
     };
     wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(look));
     EXPECT_EQ("new (" + name + ")", Selected());
-    EXPECT_EQ(wxString('t', 300), TextAfter("Entry Type:"));
 }
 
 // --- Its key ---

@@ -325,7 +325,7 @@ TEST_F(Frame, NamesTheCommandOfAKeyInTheLog)
 {
     Open(folder.Write("a.bib", OneEntry));
     ForgetLog();
-    PressShortcut('d', true, false);
+    wxTEST_DIALOG(PressShortcut('d', true, false), ExpectBox("Removing Entry", "one (a)", wxID_NO));
     EXPECT_EQ((Lines{{"INFO: MyFrame::OnCharHook Key=100(d),Mod=1", TNS_LIFECYCLE},
                      {"INFO: MyFrame::OnCharHook Delete Entry ...", TNS_LIFECYCLE}}),
               TakeLog("INFO: MyFrame::OnCharHook"));
