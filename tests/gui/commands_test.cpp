@@ -135,13 +135,16 @@ protected:
             bool asks = (box->GetMessageDialogStyle() & wxYES_NO) != 0;
             return !m_accept ? wxID_CANCEL : asks ? wxID_YES : wxID_OK;
         }
-        if (wxFileDialog *files = dynamic_cast<wxFileDialog *>(dialog)) {
-            files->SetPath(m_path);
-            return m_accept ? wxID_OK : wxID_CANCEL;
-        }
-        dialog->CallAfter([dialog] {
-            WaitFor([dialog] { return dialog->IsShownOnScreen() && dialog->IsActive(); });
-            dialog->EndModal(wxID_CANCEL);
+        wxFileDialog *files = dynamic_cast<wxFileDialog *>(dialog);
+        if (files && !m_accept)
+            return wxID_CANCEL;
+        dialog->CallAfter([this, dialog, files] {
+            bool chosen = WaitFor([&] {
+                if (files)
+                    files->SetPath(m_path);
+                return files ? files->GetPath() == m_path : dialog->IsActive();
+            });
+            dialog->EndModal(files && chosen ? wxID_OK : wxID_CANCEL);
         });
         return wxID_NONE;
     }
