@@ -34,7 +34,6 @@
 #include "ui/Theme.h"
 
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, HELP_HEIGHT = 40 };
-enum { NEW_KEY_WIDTH = 120 };
 enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window
 static const char SashKey[] = "/MainWindow/Splitter"; // in the toolkit's configuration
 static const double LIST_SHARE = 0.35;                // of what the window grows or shrinks
@@ -200,7 +199,6 @@ wxSizer *Cartulo::CreateNewFieldRow()
     m_newFieldKey = new wxComboBox(m_entryPane, ID_NEW_FIELD_KEY);
     m_newField = new xBitmapButton(m_entryPane, ID_NEW_FIELD, "&Add", "list-add");
     m_newField->SetToolTip("Add new fields to the Entry with specified key (Alt+A)");
-    m_newFieldKey->SetMinSize(FromDIP(wxSize(NEW_KEY_WIDTH, -1)));
     m_missingFields = new wxStaticText(m_entryPane, wxID_ANY, "(no comment)");
     m_done = new wxButton(m_entryPane, ID_COMMIT_ENTRY, "Done");
     m_done->SetToolTip("Finish editing the entry.");

@@ -106,6 +106,7 @@ private:
     void ShowMoreFields(int count);
     void ShowEditControls();
     void LayOutEntry();
+    int NewFieldRoom() const;
     void PlaceNote();
     void SetEditMode(bool on);
     void FocusForMode();

@@ -21,10 +21,11 @@
 #include "ui/Schema.h"
 #include "ui/Theme.h"
 
-enum { LABEL_WIDTH = 96 };   // in the narrowest window
-enum { LONGEST_TIP = 1000 }; // characters
-enum { LONGEST_TYPE = 300 }; // what is shown of one
-enum { NOTE_INDEX = 3 };     // of the note on missing fields in its row
+enum { LABEL_WIDTH = 96 };                   // in the narrowest window
+enum { LONGEST_TIP = 1000 };                 // characters
+enum { LONGEST_TYPE = 300 };                 // what is shown of one
+enum { KEY_WIDTH = 120, SMALLEST_KEY = 40 }; // of the box for the key of a new field
+enum { NOTE_INDEX = 3 };                     // of the note on missing fields in its row
 
 static const char CommitTitle[] = "Commit of Bibliography Entry - Question";
 
@@ -150,24 +151,33 @@ void Cartulo::LayOutEntry()
     PlaceNote();
 }
 
+// The width that the row for a new field has for its key and a note.
+int Cartulo::NewFieldRoom() const
+{
+    int room = m_entryPane->GetClientSize().x - FromDIP(2 * PANE_BORDER + 4 * COLUMN_GAP);
+    for (const wxWindow *control :
+         std::initializer_list<const wxWindow *>{m_newFieldLabel, m_newField, m_done})
+        room -= control->GetBestSize().x;
+    return room;
+}
+
 // The note on missing fields stands beside the button that adds one where there is room for it in
 // one line, else below, in as many lines as it takes: sizers know nothing of those.
 void Cartulo::PlaceNote()
 {
     if (!m_missingFields->IsShown())
         return;
-    const int width = m_entryPane->GetClientSize().x - 2 * FromDIP(PANE_BORDER);
-    int room = width - 4 * FromDIP(COLUMN_GAP);
-    for (const wxWindow *control : std::initializer_list<const wxWindow *>{
-             m_newFieldLabel, m_newFieldKey, m_newField, m_done})
-        room -= control->GetEffectiveMinSize().x;
-    const bool beside = m_missingFields->GetBestSize().x <= room;
+    const int room = NewFieldRoom();
+    const wxSize keySize(std::clamp(room, FromDIP(SMALLEST_KEY), FromDIP(KEY_WIDTH)), -1);
+    const bool beside = m_missingFields->GetBestSize().x <= room - keySize.x;
+    wxSizer *place = beside ? m_newFieldRow : m_noteLine;
     wxSize size = wxDefaultSize;
     if (!beside)
-        size = wxSize(1, Native_HeightForWidth(m_missingFields, width));
-    wxSizer *place = beside ? m_newFieldRow : m_noteLine;
-    if (m_missingFields->GetContainingSizer() == place && m_missingFields->GetMinSize() == size)
+        size = wxSize(1, Native_HeightForWidth(m_missingFields, m_newFieldRow->GetSize().x));
+    if (m_missingFields->GetContainingSizer() == place && m_missingFields->GetMinSize() == size &&
+        m_newFieldKey->GetMinSize() == keySize)
         return;
+    m_newFieldKey->SetMinSize(keySize);
     m_missingFields->GetContainingSizer()->Detach(m_missingFields);
     m_missingFields->SetMinSize(size);
     if (beside)

@@ -2,8 +2,13 @@
 
 #include "tests/gui/EditTest.h"
 
+#include <map>
+
+#include <wx/settings.h>
+
 #include "app/Companion.h"
 #include "app/Native.h"
+#include "ui/PanelRules.h"
 
 using Lines = std::vector<LogLine>;
 
@@ -117,13 +122,51 @@ TEST_F(Edit, NotesMissingFieldsInFull)
         const wxStaticText *note = NoteText();
         int height = Native_HeightForWidth(note, note->GetSize().x);
         return note->GetRect().GetRight() < width && done->GetRect().GetRight() < width &&
-               note->GetSize().y >= height && !note->GetRect().Intersects(done->GetRect());
+               done->GetSize().x >= done->GetBestSize().x && note->GetSize().y >= height &&
+               !note->GetRect().Intersects(done->GetRect());
     };
-    for (int width : {512, 800, 1200}) {
+    for (int width : {1200, 800, 640}) {
         frame->SetSize(frame->FromDIP(wxSize(width, 600)));
         ASSERT_TRUE(WaitFor([&] { return frame->GetSize().x == frame->FromDIP(width); })) << width;
         EXPECT_TRUE(WaitFor(fits)) << width;
     }
+}
+
+// Runs on a light and on a dark desktop.
+TEST_F(Edit, TellsFieldsApartByColours)
+{
+    OpenText("@article{one, title = {T}, note = {N}, crossref = {x}, extra = {E}}\n"
+             "@extra-type{two, title = {T}}\n");
+    auto colours = [this] {
+        std::map<wxString, Colour> all;
+        for (wxWindow *child : EntryPane()->GetChildren()) {
+            wxStaticText *text = dynamic_cast<wxStaticText *>(child);
+            wxColour colour = child->GetForegroundColour();
+            if (text && text->IsShown())
+                all[text->GetLabelText()] = {colour.Red(), colour.Green(), colour.Blue()};
+        }
+        return all;
+    };
+    const wxColour back = wxSystemSettings::GetColour(wxSYS_COLOUR_BTNFACE);
+    auto isShown = [&](const char *key, Colour chosen) {
+        Colour wanted = Panel_TextColour(chosen, {back.Red(), back.Green(), back.Blue()},
+                                         wxSystemSettings::GetAppearance().IsUsingDarkBackground());
+        Colour shown = colours()[key];
+        return shown.red == wanted.red && shown.green == wanted.green && shown.blue == wanted.blue;
+    };
+    EXPECT_TRUE(isShown("title", {0, 0, 128}));
+    EXPECT_TRUE(isShown("note", {0, 0, 255}));
+    EXPECT_TRUE(isShown("crossref", {128, 0, 0}));
+    EXPECT_TRUE(isShown("extra", {0, 128, 0}));
+    StartEditing();
+    Choose("book");
+    EXPECT_TRUE(isShown("title", {0, 0, 128}));
+    EXPECT_TRUE(isShown("note", {0, 128, 0}));
+    Choose("extra-type"); // without a section
+    EXPECT_TRUE(isShown("title", {0, 128, 0}));
+    EXPECT_TRUE(isShown("crossref", {128, 0, 0}));
+    EXPECT_TRUE(NewKey()->IsListEmpty());
+    EXPECT_EQ("", Note());
 }
 
 // --- The commit ---
