@@ -382,7 +382,8 @@ void MyFrame::OnCharHook(wxKeyEvent &event)
         return;
     }
     TNSMessage("INFO: MyFrame::OnCharHook ", row->label, TNS_LIFECYCLE);
-    m_panel->GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, id));
+    wxCommandEvent command(wxEVT_MENU, id); // not queued: what is typed next is for the new mode
+    m_panel->GetEventHandler()->ProcessEvent(command);
 }
 
 // --- Leaving and closing ---

@@ -43,6 +43,16 @@ TEST_F(Edit, StartsAndEndsWithEscape)
     EXPECT_FALSE(Panel()->InEditMode());
 }
 
+// Whoever types fast has typed on before the queue of events is handled.
+TEST_F(Edit, StartsBeforeTheNextKeyComes)
+{
+    OpenText(Article);
+    wxKeyEvent key(wxEVT_CHAR_HOOK);
+    key.m_keyCode = key.m_uniChar = WXK_ESCAPE;
+    List()->ProcessWindowEvent(key);
+    EXPECT_TRUE(Panel()->InEditMode());
+}
+
 TEST_F(Edit, RefusesAReadOnlyFile)
 {
     wxTEST_DIALOG(Open(folder.Write("a.bib", std::string(Article) + "@book{two\n")),
