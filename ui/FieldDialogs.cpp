@@ -16,6 +16,7 @@ enum { ID_FIELD_KEY = 6001, ID_FIELD_VALUE = 6002, DIALOG_BORDER = 12, COLUMN_GA
 
 wxBEGIN_EVENT_TABLE(Cartulo_EditField, wxDialog)
     EVT_BUTTON(wxID_OK, Cartulo_EditField::OnOK)
+    EVT_CHAR_HOOK(Cartulo_EditField::OnCharHook)
 wxEND_EVENT_TABLE()
 
 Cartulo_EditField::Cartulo_EditField(wxWindow *parent, const wxString &key, const wxString &value)
@@ -54,6 +55,17 @@ void Cartulo_EditField::OnOK(wxCommandEvent &event)
 {
     TNSMessage("INFO: ", "Cartulo_EditField::OnOK", TNS_ACTION);
     event.Skip(); // closes
+}
+
+void Cartulo_EditField::OnCharHook(wxKeyEvent &event)
+{
+    int key = event.GetKeyCode();
+    if (!event.ControlDown() || (key != WXK_RETURN && key != WXK_NUMPAD_ENTER)) {
+        event.Skip();
+        return;
+    }
+    wxCommandEvent press(wxEVT_BUTTON, wxID_OK);
+    ProcessWindowEvent(press);
 }
 
 // --- The name ---

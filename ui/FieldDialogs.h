@@ -17,6 +17,7 @@ public:
 
 private:
     void OnOK(wxCommandEvent &event);
+    void OnCharHook(wxKeyEvent &event); // Ctrl+Enter is OK: Enter belongs to the text
 
     wxTextCtrl *m_value; // child window
 

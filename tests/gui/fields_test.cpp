@@ -257,6 +257,27 @@ TEST_F(EditField, TakesAValueOfManyLines)
     EXPECT_NE(std::string::npos, Saved().find("\ttitle = {First\n\tSecond},\n"));
 }
 
+TEST_F(EditField, IsAcceptedByCtrlEnter)
+{
+    OpenText(Article);
+    StartEditing();
+    Focus(Value("title"));
+    auto accept = [](Cartulo_EditField &dialog) {
+        wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(6002));
+        value->SetValue("Large");
+        dialog.Show();
+        wxKeyEvent key(wxEVT_CHAR_HOOK);
+        key.m_keyCode = WXK_RETURN;
+        value->ProcessWindowEvent(key); // a new line
+        EXPECT_TRUE(dialog.IsShown());
+        key.SetControlDown(true);
+        value->ProcessWindowEvent(key);
+        EXPECT_FALSE(dialog.IsShown());
+    };
+    wxTEST_DIALOG(PressShortcut('E', true, false), UseDialog<Cartulo_EditField>(accept, wxID_OK));
+    EXPECT_EQ("Large", Value("title")->GetValue());
+}
+
 TEST_F(EditField, NeedsTheFocusInOne)
 {
     OpenText(Article);
