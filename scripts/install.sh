@@ -7,7 +7,7 @@ build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libx
 # A private screen with a window manager, and pictures of it.
 screen="xvfb openbox xfwm4 x11-utils dbus-daemon xdotool wmctrl imagemagick fonts-dejavu-core
         adwaita-icon-theme"
-test="locales python3"
+test="locales python3 texlive-binaries"
 
 missing=
 for group in "$@"; do

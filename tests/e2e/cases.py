@@ -1,7 +1,7 @@
 """What the tests beside this file share.
 
-Each is started as: TEST.py PROGRAM CHANGING PEER [TEST...], on a private screen. CHANGING is the
-editor with a key more, which changes an entry; PEER stands for another program of the channel.
+Each is started as: TEST.py PROGRAM PEER [TEST...], on a private screen. PEER stands for another
+program of the channel.
 """
 
 import os
@@ -15,7 +15,7 @@ from editor import MESSAGES, Editor, poll, user_environment
 
 SOURCE = os.path.dirname(os.path.dirname(os.path.dirname(os.path.abspath(__file__))))
 HOSTILE = os.path.join(SOURCE, "tests", "data", "hostile")
-program = changing = peer = ""
+program = peer = ""
 
 REFS = b"""@article{alpha, title = {Old Maps}, year = 1999}
 @book{beta, title = {New Maps}}
@@ -30,9 +30,9 @@ BROKEN = b"@misc{kept, note = {x}}\n@misc{broken, note = {y} title = {z}}\n"
 
 
 def run():
-    global program, changing, peer
-    program, changing, peer = (os.path.abspath(path) for path in sys.argv[1:4])
-    del sys.argv[1:4]
+    global program, peer
+    program, peer = (os.path.abspath(path) for path in sys.argv[1:3])
+    del sys.argv[1:3]
     unittest.main(verbosity=2)
 
 
@@ -71,9 +71,6 @@ class EditorTest(unittest.TestCase):
                         self.environment)
         self.addCleanup(editor.kill)
         return editor
-
-    def start_changing(self, *arguments):
-        return self.start(*arguments, command=[changing])
 
     def start_other(self):
         """An editor without files, for its window."""

@@ -15,6 +15,7 @@ DEADLINE = 30  # seconds
 FRAME = "Quarlo Cartulo"
 MESSAGES = "Bibliography File Loading Error Messages"
 LOCK_BOX = "Openning BIB file"
+COMMIT_BOX = "Commit of Bibliography Entry - Question"
 
 # Keys that mean nothing to the editor, with their codes in its log. They take turns, so that one
 # that comes late is not taken for the next.
@@ -214,6 +215,12 @@ class Editor:
         """Presses a key that opens a dialog."""
         xdotool("key", key)
 
+    def type_into(self, title, text):
+        """Types a text instead of the one in the field of a dialog that has the focus."""
+        self.activate(self.wait_for_window(title))
+        xdotool("key", "ctrl+a")
+        xdotool("type", text)
+
     def settle(self):
         """Returns when the main window has handled all keys and clicks so far."""
         key, code = next(MARKS)
@@ -259,10 +266,16 @@ class Editor:
         self.settle()
 
     def change(self):
-        """Changes the selected entry; only the program made for this can."""
-        before = self.log().count("Cartulo: Changed: ")
-        xdotool("key", "F12")
-        self.wait_for_log("Cartulo: Changed: ", before + 1)
+        """Puts a letter at the end of the first value of the selected entry."""
+        self.press("Escape", "Tab", "End", "X")
+        self.commit()
+
+    def commit(self):
+        """Leaves the entry that is edited and takes the changes over."""
+        self.begin("Escape")
+        self.answer(COMMIT_BOX)
+        self.wait_until_active()
+        self.settle()
 
     def messages(self):
         """The text of the messages window, which ends here; it comes by way of the search box."""

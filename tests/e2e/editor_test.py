@@ -156,7 +156,7 @@ class Save(EditorTest):
 
     def start_changed(self):
         self.write_both()
-        editor = self.start_changing("refs.bib", "more.bib").ready()
+        editor = self.start("refs.bib", "more.bib").ready()
         editor.change()
         self.assertEqual(REFS, self.read("refs.bib"))
         return editor
@@ -170,7 +170,7 @@ class Save(EditorTest):
 
     def test_follows_search_selection_and_change(self):
         self.write_both()
-        editor = self.start_changing("refs.bib", "more.bib").ready()
+        editor = self.start("refs.bib", "more.bib").ready()
         editor.press("ctrl+f")
         editor.type("old")
         editor.press("Down")

@@ -64,7 +64,7 @@ class HandOver(InstanceTest):
 
     def test_saves_what_it_closes(self):
         self.write_both()
-        first = self.start(self.option, "refs", command=[cases.changing]).ready()
+        first = self.start_first("refs")
         first.change()
         self.assertEqual(REFS, self.read("refs.bib"))
         self.assert_carries_out(first, "more")
