@@ -124,3 +124,9 @@ char *Enc_FromUnicode(char *buffer, const wchar_t *text)
     AppLog("strconv out: ", buffer);
     return buffer;
 }
+
+int Enc_Holds(wchar_t character)
+{
+    const uint32_t *map = Enc_Current()->map;
+    return ToCharacter(map, ToByte(character)) == character;
+}

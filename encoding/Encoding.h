@@ -28,3 +28,6 @@ std::wstring &Enc_ToUnicode(std::wstring &out, const char *text);
 // Display text to store text, into a buffer of at least one byte per character and a NUL. A
 // character outside the code page becomes byte 0xFF. Returns `buffer`.
 char *Enc_FromUnicode(char *buffer, const wchar_t *text);
+
+// 1 when the store gives a character back as it was put there.
+int Enc_Holds(wchar_t character);

@@ -54,6 +54,13 @@ int Bib_StripKeyChars(char *key)
     return 1;
 }
 
+int Bib_HasBadKeyChars(const char *key)
+{
+    while (*key && !IsKeyChar(*key))
+        ++key;
+    return *key != 0;
+}
+
 static int IsReadable(char c) // as a part of a key
 {
     int isControl = (c >= 0 && c < 32) || c == 127;

@@ -99,6 +99,11 @@ int Bib_HasFieldRoom(const char *name)
     return HasRoom(&Fields, name);
 }
 
+int Bib_IsFieldKnown(const char *name)
+{
+    return *FindSlot(&Fields, name) != 0;
+}
+
 void *Bib_Alloc(size_t size)
 {
     void *block = malloc(size);
@@ -173,6 +178,22 @@ void Bib_FreeEntry(BibEntry *entry)
         free(entry->fields[i].value);
     free(entry->key);
     free(entry);
+}
+
+int Bib_FindField(const BibEntry *entry, const char *name)
+{
+    for (int i = 0; i < entry->fieldCount; ++i)
+        if (Ascii_Compare(BibFieldTable[entry->fields[i].name], name) == 0)
+            return i;
+    return -1;
+}
+
+BibEntry **Bib_FindLink(BibFile *file, const BibEntry *entry)
+{
+    BibEntry **link = &file->entries;
+    while (*link && *link != entry)
+        link = &(*link)->next;
+    return *link ? link : nullptr;
 }
 
 // `first` is the text's first letter, `other` the same in the other case.

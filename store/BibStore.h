@@ -102,6 +102,7 @@ int Bib_TypeIndex(const char *name); // null or "" gives 0, "** UNKNOWN **"
 int Bib_FieldIndex(const char *name);
 int Bib_HasTypeRoom(const char *name); // 1 when Bib_TypeIndex(name) will return
 int Bib_HasFieldRoom(const char *name);
+int Bib_IsFieldKnown(const char *name); // 1 when it has an index already
 
 // A block with room for `fieldCount` fields, all zero but fieldCount. Null when memory is out.
 BibEntry *Bib_AllocEntry(int fieldCount);
@@ -114,6 +115,12 @@ BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName, con
 
 // Frees the field values, the key and the block. Unlink the entry first.
 void Bib_FreeEntry(BibEntry *entry);
+
+// The slot of the entry's first field of this name, ignoring case; -1 for none.
+int Bib_FindField(const BibEntry *entry, const char *name);
+
+// The pointer of the file's list that leads to the entry; null when the entry is not of that file.
+BibEntry **Bib_FindLink(BibFile *file, const BibEntry *entry);
 
 // 1 when a field value of the entry contains `text`, ignoring case.
 int Bib_EntryContains(const BibEntry *entry, const char *text);
@@ -177,10 +184,11 @@ const char *Bib_CheckValue(const char *value);
 
 // Removes the characters that no key may hold, "\"#%'(),={} " , in place. Returns 1.
 int Bib_StripKeyChars(char *key);
+int Bib_HasBadKeyChars(const char *key); // 1 when there are some
 
-// 1 when the parser reads it back as it is written: a citation key; the name of a field or of an
-// abbreviation, which does not begin with a digit. Neither is empty or holds one of the characters
-// above, a control character or a backslash.
+// 1 when the parser reads it back unchanged: Bib_IsKey for citation keys, Bib_IsName for fields and
+// abbreviations, which must not begin with a digit. Empty texts, control characters, backslashes
+// and the characters above are refused.
 int Bib_IsKey(const char *key);
 int Bib_IsName(const char *name);
 

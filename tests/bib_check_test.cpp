@@ -257,3 +257,13 @@ TEST(BibIsName, WantsNoDigitAtTheFront)
     for (const char *name : {"", "1", "12", "1a", "a b", "a\\"})
         EXPECT_FALSE(Bib_IsName(name)) << name;
 }
+
+TEST(BibHasBadKeyChars, IsTrueForWhatIsStripped)
+{
+    for (int c = 1; c < 256; ++c) {
+        std::string key = {'a', static_cast<char>(c), 'b'}, stripped = key;
+        Bib_StripKeyChars(stripped.data());
+        EXPECT_EQ(key != stripped.c_str(), Bib_HasBadKeyChars(key.c_str()) != 0) << c;
+    }
+    EXPECT_EQ(0, Bib_HasBadKeyChars(""));
+}

@@ -87,6 +87,8 @@ TEST_F(BibStore, EndsTheProcessAtThe513thField)
     for (int i = 0; i < 512; ++i)
         EXPECT_EQ(i, Bib_FieldIndex(("field" + std::to_string(i)).c_str()));
     EXPECT_EQ(1, Bib_HasFieldRoom("FIELD400"));
+    EXPECT_EQ(1, Bib_IsFieldKnown("FIELD400"));
+    EXPECT_EQ(0, Bib_IsFieldKnown("another"));
     EXPECT_EQ(0, Bib_HasFieldRoom("another"));
     EXPECT_EXIT(Bib_FieldIndex("another"), testing::ExitedWithCode(1),
                 "^Field Table full at adding field: `another'\n$");
@@ -120,6 +122,27 @@ TEST_F(BibNewEntry, MayHaveNoFields)
     EXPECT_EQ(0, entry->fieldCount);
     EXPECT_EQ(0, Bib_EntryContains(entry, "x"));
     EXPECT_EQ(0, Bib_EntryContains(entry, ""));
+}
+
+TEST_F(BibStore, FindsTheFirstFieldOfAName)
+{
+    BibFile *file = LoadText("@misc{k, note = {a}, title = {b}, Note = {c}}\n@misc{none}\n");
+    EXPECT_EQ(0, Bib_FindField(file->entries, "NOTE"));
+    EXPECT_EQ(1, Bib_FindField(file->entries, "title"));
+    EXPECT_EQ(-1, Bib_FindField(file->entries, "year"));
+    EXPECT_EQ(-1, Bib_FindField(file->entries->next, "note"));
+    Bib_FreeFile(file);
+}
+
+TEST_F(BibStore, FindsWhatLeadsToAnEntry)
+{
+    BibFile *file = LoadText("@misc{a, note = {x}}\n@misc{b, note = {x}}\n");
+    BibFile *other = LoadText("@misc{a, note = {x}}\n");
+    EXPECT_EQ(&file->entries, Bib_FindLink(file, file->entries));
+    EXPECT_EQ(&file->entries->next, Bib_FindLink(file, file->entries->next));
+    EXPECT_EQ(nullptr, Bib_FindLink(file, other->entries));
+    Bib_FreeFile(file);
+    Bib_FreeFile(other);
 }
 
 TEST_F(BibStore, FindsTextInValuesIgnoringCase)

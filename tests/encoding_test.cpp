@@ -380,6 +380,17 @@ TEST(EncFromUnicode, GivesBackEveryByteThatIsAloneWithItsMeaning)
     EXPECT_GT(bytes, 50 * 200);
 }
 
+TEST(EncHolds, WhatComesBackAsItWas)
+{
+    for (wchar_t c : {L'a', L'\u00E4', L'\u20AC', L'\u00FF', L'\u00AB', L'\u00BB', L'\t'})
+        EXPECT_TRUE(Enc_Holds(c)) << int(c);
+    for (wchar_t c : {L'\u0436', L'\U0001F600', L'\x02', L'\x05'}) // the last two are marks there
+        EXPECT_FALSE(Enc_Holds(c)) << int(c);
+    Enc_Select("CP1251");
+    EXPECT_TRUE(Enc_Holds(L'\u0436'));
+    EXPECT_FALSE(Enc_Holds(L'\u00FF'));
+}
+
 TEST(EncFromUnicode, LogsTheTextAndTheResult)
 {
     // Display text as UTF-8, store text as it is, but control characters as blanks.
