@@ -2,16 +2,10 @@
 
 #include "tests/gui/EditTest.h"
 
-#include <algorithm>
-
 #include <wx/filedlg.h>
 #include <wx/modalhook.h>
 #include <wx/srchctrl.h>
-#include <wx/toolbar.h>
 #include <wx/uiaction.h>
-
-#include "app/Companion.h"
-#include "ui/EntryDialogs.h"
 
 // --- Which apply ---
 
@@ -208,7 +202,9 @@ TEST_F(FocusWalk, LeadsThroughAllCommandsOfTheList)
                 OpenText(Child);
                 Focus(inSearch ? static_cast<wxWindow *>(Search()) : List());
                 int dialogs = Run(command.id, accept);
-                EXPECT_TRUE(accept || dialogs == command.inList) << command.id << ' ' << dialogs;
+                if (!accept) {
+                    EXPECT_EQ(command.inList, dialogs) << command.id;
+                }
                 frame->Destroy();
                 DeleteClosedWindows();
             }
@@ -228,7 +224,9 @@ TEST_F(FocusWalk, LeadsThroughAllCommandsOfEditing)
                 Focus(where == 0 ? Value("title") : Panel()->FindWindow(where));
                 int dialogs = Run(command.id, accept);
                 int expected = where == 0 ? command.inField : command.inEditing;
-                EXPECT_TRUE(accept || dialogs == expected) << command.id << ' ' << dialogs;
+                if (!accept) {
+                    EXPECT_EQ(expected, dialogs) << command.id;
+                }
                 frame->Destroy();
                 DeleteClosedWindows();
             }
