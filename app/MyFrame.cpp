@@ -362,6 +362,10 @@ static bool IsForButton(int key)
 
 void MyFrame::OnCharHook(wxKeyEvent &event)
 {
+    if (m_dialogs->Open() > 0) { // a key from before the dialog came
+        event.Skip();
+        return;
+    }
     if (GetStatusBar())
         SetStatusText("", 0);
     LogKey(event);
@@ -382,7 +386,8 @@ void MyFrame::OnCharHook(wxKeyEvent &event)
         return;
     }
     TNSMessage("INFO: MyFrame::OnCharHook ", row->label, TNS_LIFECYCLE);
-    wxCommandEvent command(wxEVT_MENU, id); // not queued: what is typed next is for the new mode
+    // Not queued: what is typed next is for the new mode, or for the dialog.
+    wxCommandEvent command(wxEVT_MENU, id);
     m_panel->GetEventHandler()->ProcessEvent(command);
 }
 
@@ -402,11 +407,10 @@ void MyFrame::OnClose(wxCloseEvent &event)
         return; // a box about a file is open, and the constructor waits for it
     }
     bool mayVeto = event.CanVeto();
-    if (!m_panel->FinishEditing() && mayVeto) {
-        event.Veto();
-        return;
-    }
-    if (!MayClose(mayVeto)) {
+    bool goOn = m_panel->FinishEditing() || !mayVeto;
+    if (!m_panel)
+        return; // closed while it asked
+    if (!goOn || !MayClose(mayVeto)) {
         event.Veto();
         return;
     }

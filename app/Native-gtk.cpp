@@ -66,9 +66,14 @@ int Native_LatinLetter(const wxKeyEvent &event)
     return 0;
 }
 
+void Native_KeepScrollBars(wxWindow *scrolled)
+{
+    gtk_scrolled_window_set_overlay_scrolling(GTK_SCROLLED_WINDOW(scrolled->GetHandle()), FALSE);
+}
+
 int Native_HeightForWidth(const wxWindow *window, int width)
 {
-    int least, natural;
-    gtk_widget_get_preferred_height_for_width(window->GetHandle(), width, &least, &natural);
+    int natural = 0;
+    gtk_widget_get_preferred_height_for_width(window->GetHandle(), width, nullptr, &natural);
     return natural;
 }

@@ -18,5 +18,8 @@ bool Native_IsMapped(wxWindow *window);
 // of it; 0 for other keys.
 int Native_LatinLetter(const wxKeyEvent &event);
 
-// The height of a text that is wrapped to this width.
+// Scroll bars that stay in sight where there is something to scroll.
+void Native_KeepScrollBars(wxWindow *scrolled);
+
+// The height that a control with wrapping text needs at this width; both in pixels.
 int Native_HeightForWidth(const wxWindow *window, int width);

@@ -130,26 +130,7 @@ TEST_F(EntryFiles, HoldParentsThatHaveNoneThemselves)
 
 // --- Keys ---
 
-TEST_F(EntryKeys, LoseBlanksAndControlCharacters)
-{
-    EXPECT_EQ("mykey", Entry_TypedKey(L" my key\t\n\x01"));
-    EXPECT_EQ("", Entry_TypedKey(L" \t "));
-    EXPECT_EQ("a{b}", Entry_TypedKey(L"a{b}"));
-    EXPECT_EQ("mark", Entry_TypedKey(L"\u00ABmark\u00BB")); // marks of abbreviations
-}
-
-TEST_F(EntryKeys, AreTextOfTheCodePage)
-{
-    EXPECT_EQ("M\xFCller", Entry_TypedKey(L"M\u00FCller"));
-    EXPECT_TRUE(Entry_KeyFits(L"M\u00FCller \u00FF"));
-    EXPECT_FALSE(Entry_KeyFits(L"\u0141ukasz"));
-    EXPECT_FALSE(Entry_KeyFits(L"a\U0001F600"));
-    Enc_Select("CP1250");
-    EXPECT_TRUE(Entry_KeyFits(L"\u0141ukasz"));
-    EXPECT_FALSE(Entry_KeyFits(L"\u00FF"));
-}
-
-TEST_F(EntryKeys, ForNewEntries)
+TEST_F(EntryKeys, AreCheckedForNewEntries)
 {
     BibFile *talks = Open("talks.bib", Talks), *books = Open("books.bib", Books);
     struct {
@@ -195,7 +176,7 @@ TEST_F(EntryKeys, OfAFileThatIsListedTwiceAreNotTakenElsewhere)
     EXPECT_EQ(KEY_TAKEN, Entry_CheckNewKey(&set, file, "Griske84"));
 }
 
-TEST_F(EntryKeys, ForRenamedEntries)
+TEST_F(EntryKeys, AreCheckedForRenamedEntries)
 {
     BibFile *talks = Open("talks.bib", Talks + "@misc{other, note = {N}}\n");
     Open("books.bib", Books);

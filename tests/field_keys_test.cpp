@@ -1,24 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "app/Ids.h"
-#include "encoding/Encoding.h"
 #include "ui/FieldKeys.h"
-
-TEST(FieldKeyTyped, HasNoBlanksAndControlCharacters)
-{
-    EXPECT_EQ("mykey", FieldKey_Typed(L" my\tkey\n "));
-    EXPECT_EQ("", FieldKey_Typed(L" \t"));
-    EXPECT_EQ("", FieldKey_Typed(L""));
-}
-
-TEST(FieldKeyTyped, IsTextOfTheCodePage)
-{
-    EXPECT_EQ("\xE9"
-              "diteur",
-              FieldKey_Typed(L"\u00E9diteur"));
-    Enc_Select("CP1251");
-    EXPECT_EQ("\xE4", FieldKey_Typed(L"\u0434"));
-}
 
 TEST(FieldKeyCheckNew, TellsWhatIsWrong)
 {
@@ -52,15 +34,4 @@ TEST(FieldKeyCheckNewName, LooksAtTheValuesThatAreShown)
     EXPECT_EQ(FIELD_KEY_UNWRITABLE, FieldKey_CheckNewName(&grid, "1999"));
     EXPECT_EQ(FIELD_KEY_EMPTY, FieldKey_CheckNewName(&grid, ""));
     EXPECT_EQ(FIELD_KEY_BAD_CHARS, FieldKey_CheckNewName(&grid, "ti{tle"));
-}
-
-TEST(FieldKeyRowToRemove, FollowsTheCommand)
-{
-    const struct {
-        int id, focused, row;
-    } rows[] = {{ID_REMOVE_ROW, -1, 0},     {ID_REMOVE_ROW + 15, 2, 15}, {ID_REMOVE_ROW_END, 2, -1},
-                {ID_REMOVE_ROW - 1, 2, -1}, {ID_REMOVE_FIELD, 2, 2},     {ID_REMOVE_FIELD, -1, 5}};
-    for (const auto &row : rows)
-        EXPECT_EQ(row.row, FieldKey_RowToRemove(row.id, row.focused, 5)) << row.id;
-    static_assert(ID_REMOVE_ROW == 6023 && ID_REMOVE_ROW_END == 6039);
 }

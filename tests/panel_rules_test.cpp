@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include "app/Ids.h"
 #include "ui/PanelRules.h"
 
 static const Colour White = {255, 255, 255}, Black = {0, 0, 0};
@@ -110,4 +111,14 @@ TEST(PanelTextColour, KeepsTheHueOnDarkThemes)
     Colour green = Panel_TextColour({0, 128, 0}, {45, 45, 45}, true);
     EXPECT_EQ(255, green.green);
     EXPECT_LT(green.red, green.green);
+}
+
+TEST(PanelRowToRemove, FollowsTheCommand)
+{
+    const struct {
+        int id, focused, row;
+    } rows[] = {{ID_REMOVE_ROW, -1, 0},     {ID_REMOVE_ROW + 15, 2, 15}, {ID_REMOVE_ROW_END, 2, -1},
+                {ID_REMOVE_ROW - 1, 2, -1}, {ID_REMOVE_FIELD, 2, 2},     {ID_REMOVE_FIELD, -1, 5}};
+    for (const auto &row : rows)
+        EXPECT_EQ(row.row, Panel_RowToRemove(row.id, row.focused, 5)) << row.id;
 }

@@ -1,6 +1,5 @@
 #include "ui/Cartulo.h"
 
-#include <algorithm>
 #include <cstdlib>
 #include <vector>
 
@@ -27,6 +26,7 @@
 #include "app/Log.h"
 #include "app/Native.h"
 #include "encoding/Encoding.h"
+#include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/Messages.h"
 #include "ui/QListBox.h"
@@ -193,27 +193,6 @@ void Cartulo::CreateRows(int count)
     }
 }
 
-wxSizer *Cartulo::CreateNewFieldRow()
-{
-    m_newFieldLabel = new wxStaticText(m_entryPane, wxID_ANY, "Add Field:");
-    m_newFieldKey = new wxComboBox(m_entryPane, ID_NEW_FIELD_KEY);
-    m_newField = new xBitmapButton(m_entryPane, ID_NEW_FIELD, "&Add", "list-add");
-    m_newField->SetToolTip("Add new fields to the Entry with specified key (Alt+A)");
-    m_missingFields = new wxStaticText(m_entryPane, wxID_ANY, "(no comment)");
-    m_done = new wxButton(m_entryPane, ID_COMMIT_ENTRY, "Done");
-    m_done->SetToolTip("Finish editing the entry.");
-    m_newFieldRow = new wxBoxSizer(wxHORIZONTAL);
-    wxSizerFlags place = wxSizerFlags().CentreVertical().Border(wxRIGHT, FromDIP(COLUMN_GAP));
-    m_newFieldRow->Add(m_newFieldLabel, place);
-    m_newFieldRow->Add(m_newFieldKey, place);
-    m_newFieldRow->Add(m_newField, place);
-    m_newFieldRow->Add(m_missingFields, place);
-    m_newFieldRow->AddStretchSpacer();
-    m_newFieldRow->Add(m_done, wxSizerFlags().CentreVertical());
-    ShowEditControls();
-    return m_newFieldRow;
-}
-
 void Cartulo::CreateEntryPane()
 {
     m_entryPane = new wxScrolledWindow(this, wxID_ANY, wxDefaultPosition, wxDefaultSize,
@@ -235,7 +214,10 @@ void Cartulo::CreateEntryPane()
     column->Add(m_help, wxSizerFlags(place).Proportion(1));
     m_entryPane->SetSizer(column);
     m_entryPane->SetScrollRate(0, FromDIP(16));
+    Native_KeepScrollBars(m_entryPane);
     m_entryPane->Bind(wxEVT_SIZE, &Cartulo::OnEntrySize, this);
+    m_type->Bind(wxEVT_MOUSEWHEEL, &Cartulo::OnWheel, this);
+    m_newFieldKey->Bind(wxEVT_MOUSEWHEEL, &Cartulo::OnWheel, this);
     m_entryPane->Hide();
 }
 
@@ -346,13 +328,21 @@ void Cartulo::KeepSashPosition()
 
 // --- Files ---
 
+static bool IsCommand(const wxEvent &event)
+{
+    const wxEventType type = event.GetEventType();
+    return type == wxEVT_MENU || type == wxEVT_BUTTON || type == wxEVT_CHOICE ||
+           type == wxEVT_LISTBOX || type == wxEVT_LISTBOX_DCLICK || type == wxEVT_TEXT ||
+           type == wxEVT_SEARCH;
+}
+
 // While files are opened, closed or saved a box may be open, and events that were queued before
 // still come in: no command may touch the files then.
 bool Cartulo::TryBefore(wxEvent &event)
 {
-    if (!m_busy || !event.IsCommandEvent())
+    if (!m_busy || !IsCommand(event))
         return wxSplitterWindow::TryBefore(event);
-    ShowStatus(this, "Cartulo is still busy with the files: please try again.");
+    ShowStatus(this, "Cartulo waits for an answer, or is busy with the files: please try again.");
     return true;
 }
 
@@ -363,7 +353,7 @@ void Cartulo::ShowBox(void *owner, const char *caption, const char *text)
 
 void Cartulo::ShowWarning(const wxString &caption, const wxString &text)
 {
-    wxMessageBox(text, caption, wxOK | wxICON_WARNING, wxGetTopLevelParent(this));
+    Box_Warn(wxGetTopLevelParent(this), caption, text);
 }
 
 // 1 when the record, which was at `path`, is still in the set; it may have been freed.
@@ -383,6 +373,7 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *)
     std::string path = file ? file->path : "";
     m_entry = nullptr;
     m_file = -1;
+    Grid_Clear(&m_grid);
     if (m_list)
         m_list->Drop_Index();
     m_busy = true;
@@ -552,9 +543,14 @@ wxString Cartulo::UnsavedText() const
 
 void Cartulo::OnSave(wxCommandEvent &)
 {
-    if (SaveAll(true) == 0 && FileSet_ModifiedCount(&m_set) != 0)
+    int saved = SaveAll(true);
+    if (saved == 0 && FileSet_ModifiedCount(&m_set) != 0)
         ShowWarning("Save Bibliography File",
                     "These Bib-files can't be saved:\n\n" + UnsavedText());
+    else if (m_editMode)
+        ShowStatus(this, "The entry that you edit is not saved yet: finish it first, with Esc.");
+    else if (saved == 1)
+        ShowStatus(this, "All modified BIB files are saved.");
 }
 
 // --- The list ---

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <wx/scrolwin.h>
+#include <wx/sizer.h>
 #include <wx/splitter.h>
 
 #include <string>
@@ -29,7 +30,7 @@ public:
     const BibFileSet *Files() const { return &m_set; }
     const BibEntry *CurrentEntry() const { return m_entry; } // null for none
     bool InEditMode() const { return m_editMode; }
-    bool IsBusy() const { return m_busy; } // loading, saving or asking about it
+    bool IsBusy() const { return m_busy; } // loading, saving, or asking about it or a commit
 
     // The button that closed the last window for adding or renaming an entry; 0 for none yet.
     int DialogResult() const { return m_dialogResult; }
@@ -58,11 +59,11 @@ public:
     // The files with unsaved changes, and why they could not be saved where that was tried.
     wxString UnsavedText() const;
 
-    void Update_Tools();                         // enables the tools that apply now
-    void ShowEntry(BibEntry *entry, int file);   // fills the entry pane; null changes nothing
-    void Update_Field_Colors(const char *type);  // of the labels that are shown
-    void CheckMandatoryFields(int last);         // proposes fields; rows up to this one count
-    void UpdateHelpText();                       // for the mode and the type
+    void Update_Tools();                        // enables the tools that apply now
+    void ShowEntry(BibEntry *entry, int file);  // fills the entry pane; null changes nothing
+    void Update_Field_Colors(const char *type); // of the labels that are shown
+    void CheckMandatoryFields(int last); // fills "Add Field:" and the note; rows up to `last` count
+    void UpdateHelpText();               // for the mode and the type
     void OnSearch(wxCommandEvent &event);        // takes the text of a search field
     void OnIndexChanged(wxCommandEvent &event);  // a row was selected
     void OnIndexActivate(wxCommandEvent &event); // a row was double-clicked
@@ -96,31 +97,38 @@ private:
     void OpenFile(const std::string &path);
     void ShowSelection();
     void ClearEntry();
-    void FillTypes();
+    void FillRow(int row);
     void FillRows();
     void FitRow(int row);
     void ReadRows();
     void WriteRow(int row);
     void WriteRows();
     void HideRow(int row);
-    void ShowMoreFields(int count);
+    void ShowMoreFields();
     void ShowEditControls();
     void LayOutEntry();
+    wxSizerFlags PlaceInRow() const;
     int NewFieldRoom() const;
     void PlaceNote();
     void SetEditMode(bool on);
     void FocusForMode();
     int FocusedRow() const;
-    void LeaveEditing();
-    int ChosenType() const;
+    int RowWithFocus(int count) const;
+    void KeepFocus(int row);
+    void ToggleEditing();
+    void FollowList();
+    void CommitEntry();
     bool Commit();
     int Ask(const wxString &text, int buttons);
     bool AcceptLosses();
     bool CheckRows();
     bool ReplaceEntry(int type);
     void AddField(const std::string &key);
+    bool TakeValue(int row, const wxString &text);
+    bool NeedsStoredRow(int row);
     void RemoveRow(int row);
     void SelectInList(BibEntry *entry);
+    void ShowChanged(BibEntry *entry, int file);
     void RemoveEntry(int row);
     void UpdateSaveTool();
     void ShowRow(const char *handler);
@@ -144,6 +152,7 @@ private:
     void OnRenameField(wxCommandEvent &event);
     void OnRemoveField(wxCommandEvent &event);
     void OnEntrySize(wxSizeEvent &event);
+    void OnWheel(wxMouseEvent &event);
     void OnSashMove(wxSplitterEvent &event);
     void OnPaint(wxPaintEvent &event);
     bool TryBefore(wxEvent &event) override;
@@ -156,7 +165,7 @@ private:
     std::string m_search;        // store text
     bool m_isPainted = false;
     bool m_editMode = false; // else the list is in use
-    bool m_busy = false;     // saving or carrying out a command line
+    bool m_busy = false;     // see IsBusy
     int m_dialogResult = 0;
     std::string m_ini;  // path of the INI file with the entry types
     std::string m_name; // of the application, from there
@@ -180,8 +189,8 @@ private:
     wxStaticText *m_missingFields = nullptr;
     wxButton *m_done = nullptr;
     wxTextCtrl *m_help = nullptr;
-    wxSizer *m_newFieldRow = nullptr; // of the entry pane, as is
-    wxSizer *m_noteLine = nullptr;    // the place for a long note on missing fields
+    wxSizer *m_newFieldRow = nullptr; // sizers of the entry pane
+    wxSizer *m_noteLine = nullptr;    // below it, for a long note on missing fields
 
     wxDECLARE_EVENT_TABLE();
 };

@@ -2,43 +2,37 @@
 #include "ui/Cartulo.h"
 
 #include <algorithm>
+#include <initializer_list>
 #include <vector>
 
 #include <wx/button.h>
 #include <wx/choice.h>
 #include <wx/combobox.h>
 #include <wx/msgdlg.h>
+#include <wx/settings.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "app/Companion.h"
 #include "app/Icons.h"
+#include "app/Ids.h"
 #include "app/Log.h"
 #include "app/Native.h"
 #include "ui/DisplayText.h"
 #include "ui/QListBox.h"
 #include "ui/Schema.h"
 #include "ui/Theme.h"
+#include "ui/TypeChoice.h"
 
 enum { LABEL_WIDTH = 96 };                   // in the narrowest window
 enum { LONGEST_TIP = 1000 };                 // characters
 enum { LONGEST_TYPE = 300 };                 // what is shown of one
-enum { KEY_WIDTH = 120, SMALLEST_KEY = 40 }; // of the box for the key of a new field
-enum { NOTE_INDEX = 3 };                     // of the note on missing fields in its row
+enum { KEY_WIDTH = 160, SMALLEST_KEY = 40 }; // of the box for the key of a new field
 
 static const char CommitTitle[] = "Commit of Bibliography Entry - Question";
 
 // --- Rows and their controls ---
-
-// The choice leaves out the fixed types, which no entry has.
-void Cartulo::FillTypes()
-{
-    int known = BibTypeCount - BIB_FIXED_TYPES;
-    for (int i = int(m_type->GetCount()); i < known; ++i)
-        m_type->Append(
-            ShortText(m_type, StoreText(BibTypeTable[BIB_FIXED_TYPES + i]), LONGEST_TYPE));
-}
 
 // The part of a long text that a tip can show.
 static wxString TipText(const wxString &text)
@@ -70,16 +64,21 @@ void Cartulo::FitRow(int row)
 
 // A text control holds no more than 65,534 bytes, and nothing behind a NUL: what it cannot hold is
 // not to be edited in it.
+void Cartulo::FillRow(int index)
+{
+    GridRow &row = m_grid.rows[index];
+    m_rows[index].value->ChangeValue(wxString(row.filled));
+    m_rows[index].value->SetInsertionPoint(0); // a long one is shown from its beginning
+    std::wstring held = m_rows[index].value->GetValue().ToStdWstring();
+    row.locked = held != row.filled;
+    row.filled = row.text = held;
+}
+
 void Cartulo::FillRows()
 {
     CreateRows(m_grid.count);
-    for (int i = 0; i < m_grid.count; ++i) {
-        GridRow &row = m_grid.rows[i];
-        m_rows[i].value->ChangeValue(wxString(row.filled));
-        std::wstring held = m_rows[i].value->GetValue().ToStdWstring();
-        row.locked = held != row.filled;
-        row.filled = row.text = held;
-    }
+    for (int i = 0; i < m_grid.count; ++i)
+        FillRow(i);
     WriteRows();
 }
 
@@ -95,15 +94,18 @@ void Cartulo::WriteRow(int index)
     const GridRow &row = m_grid.rows[index];
     FieldRow &controls = m_rows[index];
     bool own = m_editMode && !row.inherited;
-    bool isCrossref = Grid_IsCrossref(&row);
     controls.label->SetLabelText(StoreText(row.key.c_str()));
     if (controls.value->GetValue().ToStdWstring() != row.text)
         controls.value->ChangeValue(wxString(row.text));
-    controls.value->Enable(own && !isCrossref && !row.locked);
+    bool locked = !own || row.crossref || row.locked;
+    controls.value->Enable(!locked);
+    controls.value->SetForegroundColour(m_editMode && locked
+                                            ? Theme_PaleTextColour()
+                                            : wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
     controls.remove->Enable(own);
     controls.label->Show();
     controls.value->Show();
-    controls.remove->Show(!isCrossref || !m_grid.target);
+    controls.remove->Show(!row.crossref || !m_grid.parent);
     FitRow(index);
 }
 
@@ -132,16 +134,42 @@ void Cartulo::WriteRows()
         if (hadFocus && !m_rows[i].value->IsEnabled())
             FocusForMode();
     }
-    ShowMoreFields(m_grid.hidden);
+    ShowMoreFields();
 }
 
 // Nobody shall take an entry with more fields than rows for one with that many fields.
-void Cartulo::ShowMoreFields(int count)
+void Cartulo::ShowMoreFields()
 {
-    m_moreFields->SetLabelText(count == 1
-                                   ? wxString("1 more field is not shown.")
-                                   : wxString::Format("%d more fields are not shown.", count));
-    m_moreFields->Show(count > 0);
+    std::string text = Grid_HiddenText(&m_grid);
+    m_moreFields->SetLabelText(StoreText(text.c_str()));
+    m_moreFields->Show(!text.empty());
+}
+
+// Beside the button that adds a field.
+enum { NOTE_INDEX = 3 }; // of the note on missing fields
+
+wxSizerFlags Cartulo::PlaceInRow() const
+{
+    return wxSizerFlags().CentreVertical().Border(wxRIGHT, FromDIP(COLUMN_GAP));
+}
+
+wxSizer *Cartulo::CreateNewFieldRow()
+{
+    m_newFieldLabel = new wxStaticText(m_entryPane, wxID_ANY, "Add Field:");
+    m_newFieldKey = new wxComboBox(m_entryPane, ID_NEW_FIELD_KEY);
+    m_newField = new xBitmapButton(m_entryPane, ID_NEW_FIELD, "&Add", "list-add");
+    m_newField->SetToolTip("Add new fields to the Entry with specified key (Alt+A)");
+    m_missingFields = new wxStaticText(m_entryPane, wxID_ANY, "(no comment)");
+    m_done = new wxButton(m_entryPane, ID_COMMIT_ENTRY, "Done");
+    m_done->SetToolTip("Finish editing the entry.");
+    m_newFieldRow = new wxBoxSizer(wxHORIZONTAL);
+    for (wxWindow *control : std::initializer_list<wxWindow *>{m_newFieldLabel, m_newFieldKey,
+                                                               m_newField, m_missingFields})
+        m_newFieldRow->Add(control, PlaceInRow());
+    m_newFieldRow->AddStretchSpacer();
+    m_newFieldRow->Add(m_done, wxSizerFlags().CentreVertical());
+    ShowEditControls();
+    return m_newFieldRow;
 }
 
 void Cartulo::LayOutEntry()
@@ -181,11 +209,17 @@ void Cartulo::PlaceNote()
     m_missingFields->GetContainingSizer()->Detach(m_missingFields);
     m_missingFields->SetMinSize(size);
     if (beside)
-        place->Insert(NOTE_INDEX, m_missingFields, wxSizerFlags().CentreVertical());
+        place->Insert(NOTE_INDEX, m_missingFields, PlaceInRow());
     else
         place->Add(m_missingFields, wxSizerFlags().Expand());
     m_entryPane->FitInside();
     m_entryPane->Layout();
+}
+
+// Over a choice it would choose: whoever turns the wheel wants to scroll the pane.
+void Cartulo::OnWheel(wxMouseEvent &event)
+{
+    m_entryPane->ProcessWindowEvent(event);
 }
 
 void Cartulo::OnEntrySize(wxSizeEvent &event)
@@ -209,8 +243,8 @@ void Cartulo::ShowEntry(BibEntry *entry, int file)
     m_entryPane->Freeze();
     m_fileName->SetLabelText(path);
     m_fileName->SetToolTip(path);
-    FillTypes();
-    m_type->SetSelection(std::max<int>(entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
+    TypeChoice_Fill(m_type, LONGEST_TYPE);
+    TypeChoice_Select(m_type, entry->type);
     m_type->Enable(m_editMode);
     Grid_Fill(&m_grid, entry);
     FillRows();
@@ -260,6 +294,8 @@ void Cartulo::CheckMandatoryFields(int last)
     std::vector<SchemaRow> rows;
     for (int i = 0; i <= last && i < m_grid.count; ++i)
         rows.push_back({m_grid.rows[i].key, m_grid.rows[i].inherited});
+    for (const HiddenField &field : Grid_HiddenFields(&m_grid))
+        rows.push_back({field.key, field.inherited});
     Update_Field_Colors(m_typeName.c_str());
     SchemaAdvice advice = Schema_Advise(m_ini.c_str(), m_typeName.c_str(), rows);
     m_newFieldKey->Clear();
@@ -322,8 +358,8 @@ void Cartulo::OnEditEntry(wxCommandEvent &)
 void Cartulo::OnChangeType(wxCommandEvent &)
 {
     TNSMessage("INFO: Cartulo::OnChangeType to ", "...", TNS_ACTION);
-    int type = m_type->GetSelection() + BIB_FIXED_TYPES;
-    if (type < BIB_FIXED_TYPES || type >= BibTypeCount)
+    int type = TypeChoice_Type(m_type);
+    if (type < 0)
         return;
     TNSMessage("INFO: Cartulo::OnChangeType to ", BibTypeTable[type], TNS_ACTION);
     if (m_typeName != BibTypeTable[type]) {
@@ -338,26 +374,25 @@ void Cartulo::OnChangeType(wxCommandEvent &)
 
 void Cartulo::OnCommitEntry(wxCommandEvent &)
 {
+    CommitEntry();
+}
+
+void Cartulo::CommitEntry()
+{
     TNSMessage("INFO: Cartulo::OnCommitEntry", "", TNS_ACTION);
-    bool nothingToShow = !m_entry && !m_editMode;
+    bool nothingToShow = !m_editMode && (!m_entry || !m_entryPane->IsShown());
     if (!nothingToShow && Commit())
-        LeaveEditing();
+        ToggleEditing();
 }
 
 bool Cartulo::FinishEditing()
 {
     if (!m_editMode)
         return true;
-    wxCommandEvent event;
-    OnCommitEntry(event);
+    if (m_busy)
+        return false; // the user is being asked already
+    CommitEntry();
     return !m_editMode;
-}
-
-// The type that is chosen; the entry's own where none is.
-int Cartulo::ChosenType() const
-{
-    int type = m_type->GetSelection() + BIB_FIXED_TYPES;
-    return type >= BIB_FIXED_TYPES && type < BibTypeCount ? type : m_entry->type;
 }
 
 // Takes the edits over or drops them, as the user says. False when the editing goes on.
@@ -366,15 +401,14 @@ bool Cartulo::Commit()
     if (!m_entry || !m_editMode || m_set.files[m_file]->readOnly)
         return true;
     ReadRows();
-    int type = ChosenType();
+    int chosen = TypeChoice_Type(m_type), type = chosen >= 0 ? chosen : m_entry->type;
     GridChanges changes = Grid_Compare(&m_grid, type);
     if (!Grid_HasChanges(&changes))
         return true;
     int answer = Ask(StoreText(Grid_Question(&changes).c_str()), wxYES_NO | wxCANCEL);
     if (answer != wxYES)
         return answer == wxNO;
-    bool onlyType = changes.added == 0 && changes.modified == 0 && changes.removed == 0;
-    if (!onlyType)
+    if (!Grid_ChangesOnlyType(&changes))
         return AcceptLosses() && CheckRows() && ReplaceEntry(type);
     m_entry->type = type;
     SetModified(m_file);
@@ -394,28 +428,32 @@ int Cartulo::Ask(const wxString &text, int buttons)
 bool Cartulo::AcceptLosses()
 {
     std::wstring losses = Grid_Losses(&m_grid);
-    return losses.empty() || Ask(wxString(losses), wxYES_NO) == wxYES;
+    return losses.empty() || Ask(wxString(losses), wxYES_NO | wxNO_DEFAULT) == wxYES;
 }
 
-// One box for each value that cannot be written; false when there is one.
+// One box for each value that cannot be written; false when there is one. The first gets the focus.
 bool Cartulo::CheckRows()
 {
-    bool good = true;
+    int firstBad = -1;
     for (int i = 0; i < m_grid.count; ++i) {
-        const char *reason = Grid_CheckRow(&m_grid, i);
+        const char *reason = Grid_CheckRow(&m_grid.rows[i]);
         if (!reason)
             continue;
-        good = false;
+        if (firstBad < 0)
+            firstBad = i;
         ShowWarning(CommitTitle, "Wrong syntax of value in the field: `" +
                                      StoreText(m_grid.rows[i].key.c_str()) + "':\n\n" +
                                      StoreText(reason) +
                                      "\n\nIn this reason modification of entire entry can't be "
                                      "accepted.\nFix an error and try again.");
     }
-    return good;
+    if (firstBad >= 0 && m_rows[firstBad].value->IsEnabled())
+        m_rows[firstBad].value->SetFocus();
+    return firstBad < 0;
 }
 
-// Puts the entry as it was edited in the place of the old one. False when it cannot be built.
+// Puts the entry as it was edited in the place of the old one. False when it cannot be built, and
+// the editing goes on.
 bool Cartulo::ReplaceEntry(int type)
 {
     if (!Grid_HasRoom(&m_grid)) {
@@ -426,6 +464,7 @@ bool Cartulo::ReplaceEntry(int type)
     BibEntry *entry = Grid_Build(&m_grid, type);
     if (!entry) {
         AppLog("ERROR: Not enought memory for allocating new entry");
+        ShowWarning(CommitTitle, "There is not enough memory for the changed entry.");
         return false;
     }
     m_list->Drop_Index(); // its rows refer to the old entry
@@ -436,17 +475,32 @@ bool Cartulo::ReplaceEntry(int type)
     }
     AppLog("ERROR: Can't locate our entry inside BIB-file data");
     Bib_FreeEntry(entry);
+    ShowWarning(CommitTitle, "The changes can't be stored: the entry is not in its file any more.");
     return true;
 }
 
 // Back to the list, with the entry as it is in the store now. From the list, it is the way in.
-void Cartulo::LeaveEditing()
+void Cartulo::ToggleEditing()
 {
     SetEditMode(!m_editMode);
     Grid_Clear(&m_grid); // the old entry may be gone
     m_list->Update_Index(m_entry, m_search.c_str());
     RefreshPane();
     ShowEntry(m_entry, m_file);
+    m_entryPane->Scroll(0, 0);
+    if (!m_editMode)
+        FollowList();
     FocusForMode();
     UpdateHelpText();
+}
+
+// What is shown is what the list has selected: the changed entry may not hold the searched text any
+// more.
+void Cartulo::FollowList()
+{
+    const IndexItem *item = m_list->Item(m_list->GetSelection());
+    if (item && item->entry == m_entry)
+        return;
+    ShowSelection();
+    ShowStatus(this, "The entry is not in the list: it does not hold the searched text.");
 }

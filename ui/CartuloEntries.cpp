@@ -7,6 +7,7 @@
 #include "app/Log.h"
 #include "ui/DisplayText.h"
 #include "ui/EntryDialogs.h"
+#include "ui/EntryRules.h"
 #include "ui/QListBox.h"
 
 void Cartulo::OnNewEntry(wxCommandEvent &)
@@ -21,10 +22,7 @@ void Cartulo::OnNewEntry(wxCommandEvent &)
     m_dialogResult = dialog.ShowModal();
     if (!dialog.Changed())
         return;
-    SetModified(dialog.ChangedFile());
-    SelectInList(dialog.Changed());
-    ShowSelection();
-    FocusList();
+    ShowChanged(dialog.Changed(), dialog.ChangedFile());
     if (m_entry != dialog.Changed())
         ShowStatus(this, "The new entry is not in the list: it does not hold the searched text.");
 }
@@ -41,8 +39,13 @@ void Cartulo::OnRenameEntry(wxCommandEvent &)
     m_dialogResult = dialog.ShowModal();
     if (!dialog.Changed())
         return;
-    SelectInList(dialog.Changed());
-    SetModified(dialog.ChangedFile());
+    ShowChanged(dialog.Changed(), dialog.ChangedFile());
+}
+
+void Cartulo::ShowChanged(BibEntry *entry, int file)
+{
+    SetModified(file);
+    SelectInList(entry);
     ShowSelection();
     FocusList();
 }
@@ -77,7 +80,9 @@ void Cartulo::OnRemoveEntry(wxCommandEvent &)
     }
     wxString text = m_list->GetItemText(row);
     AppLog(text.utf8_str());
-    if (wxMessageBox(text, "Removing Entry", wxYES_NO, this) == wxYES)
+    wxMessageDialog box(this, text, "Removing Entry", wxYES_NO);
+    box.SetExtendedMessage("Do you want to remove this entry from its file ?");
+    if (box.ShowModal() == wxID_YES)
         RemoveEntry(row);
 }
 
@@ -96,6 +101,7 @@ void Cartulo::RemoveEntry(int row)
     }
     BibEntry *next = Entry_NextInList(m_list->Item(0), int(m_list->GetItemCount()), row);
     int index = m_file;
+    Grid_Clear(&m_grid); // it shows the entry
     if (!Entry_Remove(file, m_entry))
         return;
     m_entry = nullptr;

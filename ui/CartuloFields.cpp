@@ -3,7 +3,6 @@
 
 #include <algorithm>
 
-#include <wx/choice.h>
 #include <wx/combobox.h>
 #include <wx/msgdlg.h>
 #include <wx/textctrl.h>
@@ -11,17 +10,27 @@
 #include "app/Companion.h"
 #include "app/Ids.h"
 #include "app/Log.h"
+#include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/FieldDialogs.h"
 #include "ui/FieldKeys.h"
+#include "ui/Keys.h"
+#include "ui/PanelRules.h"
+#include "ui/QListBox.h"
 
 static const char AddTitle[] = "Adding New Field";
+static_assert(ID_REMOVE_ROW_END - ID_REMOVE_ROW == GRID_ROWS);
 
 // The row whose value has the focus; -1 for none, and for rows that the stored entry does not have.
 int Cartulo::FocusedRow() const
 {
-    int stored = m_entry ? std::min<int>(m_entry->fieldCount, GRID_ROWS) : 0;
-    for (int i = 0; i < std::min(stored, m_grid.count); ++i)
+    return RowWithFocus(std::min(Grid_StoredRows(&m_grid), m_grid.count));
+}
+
+// Among the first `count` ones; -1 for none.
+int Cartulo::RowWithFocus(int count) const
+{
+    for (int i = 0; i < count; ++i)
         if (m_rows[i].value->HasFocus())
             return i;
     return -1;
@@ -40,22 +49,23 @@ void Cartulo::OnNewField(wxCommandEvent &)
     TNSMessage("INFO: Cartulo::OnNewField", "", TNS_ACTION);
     if (!m_editMode || !m_entry)
         return;
-    std::string key = FieldKey_Typed(m_newFieldKey->GetValue().ToStdWstring().c_str());
-    switch (FieldKey_CheckNew(key.c_str())) {
-    case FIELD_KEY_EMPTY:
+    std::wstring typed = m_newFieldKey->GetValue().ToStdWstring();
+    std::string misfit = Key_Misfit(typed.c_str()), key = Key_Typed(typed.c_str());
+    FieldKeyVerdict verdict = FieldKey_CheckNew(key.c_str());
+    if (misfit.empty() && verdict == FIELD_KEY_OK) {
+        AddField(key);
+        return;
+    }
+    if (!misfit.empty())
+        ShowWarning(AddTitle, StoreText(misfit.c_str()));
+    else if (verdict == FIELD_KEY_EMPTY)
         ShowWarning(AddTitle, "Field key is undefined.\nPlease enter key name or choose some "
                               "standard value in list of combo box.");
-        return;
-    case FIELD_KEY_BAD_CHARS: // nothing is removed here
-        wxMessageBox(FieldKey_BadCharsText, AddTitle, wxOK | wxCANCEL | wxICON_WARNING,
-                     wxGetTopLevelParent(this));
-        return;
-    case FIELD_KEY_UNWRITABLE:
+    else if (verdict == FIELD_KEY_BAD_CHARS) // only the window for another name removes them
+        Box_WarnOrCancel(wxGetTopLevelParent(this), AddTitle, FieldKey_BadCharsText);
+    else
         ShowWarning(AddTitle, FieldKey_UnwritableText);
-        return;
-    default:
-        AddField(key);
-    }
+    m_newFieldKey->SetFocus();
 }
 
 void Cartulo::AddField(const std::string &key)
@@ -83,24 +93,55 @@ void Cartulo::AddField(const std::string &key)
 
 // --- Changing ---
 
+// The commands are for stored fields. False, with a word on it, when there is no such row.
+bool Cartulo::NeedsStoredRow(int row)
+{
+    if (!m_editMode)
+        return false;
+    if (row < 0)
+        ShowStatus(this,
+                   "Put the cursor into a field first, one that was there before the editing.");
+    return row >= 0;
+}
+
+// False when the row can't hold the text: it keeps what it has.
+bool Cartulo::TakeValue(int row, const wxString &text)
+{
+    wxTextCtrl *value = m_rows[row].value;
+    wxString old = value->GetValue();
+    if (text != old)
+        value->ChangeValue(text);
+    if (value->GetValue() == text)
+        return true;
+    value->ChangeValue(old);
+    return false;
+}
+
 void Cartulo::OnEditField(wxCommandEvent &)
 {
-    int row = m_editMode ? FocusedRow() : -1;
-    if (row < 0)
+    int row = FocusedRow();
+    if (!NeedsStoredRow(row))
         return;
     const std::string &key = m_grid.rows[row].key;
     LogRow("INFO: Editing Field: ", row, key);
-    Cartulo_EditField dialog(wxGetTopLevelParent(this), StoreText(key.c_str()),
-                             m_rows[row].value->GetValue());
-    if (dialog.ShowModal() == wxID_OK && dialog.Value() != m_rows[row].value->GetValue())
-        m_rows[row].value->ChangeValue(dialog.Value());
+    wxString text = m_rows[row].value->GetValue();
+    for (bool taken = false; !taken;) {
+        Cartulo_EditField dialog(wxGetTopLevelParent(this), StoreText(key.c_str()), text);
+        if (dialog.ShowModal() != wxID_OK)
+            break;
+        text = dialog.Value();
+        taken = TakeValue(row, text);
+        if (!taken)
+            ShowWarning(dialog.GetTitle(), "The value is too long: a field can be edited up to "
+                                           "65,534 bytes.");
+    }
     m_rows[row].value->SetFocus();
 }
 
 void Cartulo::OnRenameField(wxCommandEvent &)
 {
-    int row = m_editMode ? FocusedRow() : -1;
-    if (row < 0)
+    int row = FocusedRow();
+    if (!NeedsStoredRow(row))
         return;
     const std::string &key = m_grid.rows[row].key;
     LogRow("INFO: Renaming Field: ", row, key);
@@ -127,13 +168,17 @@ void Cartulo::OnRemoveField(wxCommandEvent &event)
     TNSMessage("INFO: Cartulo::OnRemoveField ", text.utf8_str(), TNS_ACTION);
     if (!m_editMode || !m_entry)
         return;
-    int row = FieldKey_RowToRemove(id, FocusedRow(), m_entry->fieldCount);
-    if (row < 0)
+    int stored = Grid_StoredRows(&m_grid), row = Panel_RowToRemove(id, FocusedRow(), stored);
+    if (row < 0) {
         TNSMessage("INFO: Cartulo::OnRemoveField ", "unknown target", TNS_ACTION);
-    else if (row >= std::min<int>(m_entry->fieldCount, GRID_ROWS))
+    } else if (row >= stored) {
         TNSMessage("INFO: Cartulo::OnRemoveField ", "unknown target2", TNS_ACTION);
-    else
+        ShowStatus(this, row < m_grid.count
+                             ? "A field that was just added can be removed after \"Done\"."
+                             : "Put the cursor into a field first.");
+    } else {
         RemoveRow(row);
+    }
 }
 
 void Cartulo::RemoveRow(int row)
@@ -142,13 +187,15 @@ void Cartulo::RemoveRow(int row)
         return;
     std::string key = m_grid.rows[row].key;
     LogRow("INFO: Cartulo::OnRemoveField ", row, key);
-    bool hadFocus = m_rows[row].value->HasFocus();
+    int focused = RowWithFocus(m_grid.count);
     ReadRows();
     GridRemove result = Grid_Remove(&m_grid, row);
     if (result == GRID_NO_ROW)
         return;
     if (result == GRID_REMOVED)
         AppLog("WARNING, removing the field: ", key.c_str());
+    else
+        FillRow(row);
     WriteRows();
     if (result == GRID_INHERITED) {
         m_newFieldKey->Append(StoreText(key.c_str()));
@@ -157,6 +204,16 @@ void Cartulo::RemoveRow(int row)
     CheckMandatoryFields(m_grid.count - 1);
     m_newFieldKey->SetValue(StoreText(key.c_str())); // adding brings it back
     LayOutEntry();
-    if (hadFocus && !m_rows[row].value->IsEnabled())
+    KeepFocus(focused > row ? focused - 1 : focused);
+}
+
+// In the row that moved up, or else somewhere.
+void Cartulo::KeepFocus(int row)
+{
+    if (row < 0)
+        return;
+    if (row < m_grid.count && m_rows[row].value->IsEnabled())
+        m_rows[row].value->SetFocus();
+    else
         FocusForMode();
 }

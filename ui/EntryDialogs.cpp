@@ -1,21 +1,19 @@
 #include "ui/EntryDialogs.h"
 
-#include <algorithm>
-
 #include <wx/checkbox.h>
 #include <wx/choice.h>
 #include <wx/msgdlg.h>
 #include <wx/sizer.h>
-#include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "app/Companion.h"
-#include "encoding/Encoding.h"
+#include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
+#include "ui/Keys.h"
 #include "ui/Schema.h"
+#include "ui/TypeChoice.h"
 
-enum { DIALOG_BORDER = 12, COLUMN_GAP = 8, KEY_WIDTH = 280, LONGEST_ITEM = 400 };
-enum { SPECS_SIZE = 2048 };
+enum { KEY_WIDTH = 280, LONGEST_ITEM = 400 };
 
 // --- What both windows have ---
 
@@ -25,35 +23,18 @@ EntryDialog::EntryDialog(wxWindow *parent, const EntryPlace &current, const Text
       m_current(current), m_files(Entry_WritableFiles(current.set)), m_texts(texts)
 {
     SetFont(wxFontInfo(10));
-    m_rows = new wxFlexGridSizer(2, FromDIP(wxSize(COLUMN_GAP, COLUMN_GAP)));
-    m_rows->AddGrowableCol(1);
     m_file = new wxChoice(this, ID_ENTRY_FILE);
     m_key = new wxTextCtrl(this, ID_ENTRY_KEY);
     m_key->SetMinSize(FromDIP(wxSize(KEY_WIDTH, -1)));
     m_type = new wxChoice(this, ID_ENTRY_TYPE);
     FillFiles();
-    FillTypes();
-    AddRow(texts.fileLabel, m_file);
-    AddRow(texts.keyLabel, m_key);
-    AddRow("Entry Type:", m_type);
-}
-
-void EntryDialog::AddRow(const char *label, wxWindow *control)
-{
-    m_rows->Add(new wxStaticText(this, wxID_ANY, label), wxSizerFlags().CentreVertical());
-    m_rows->Add(control, wxSizerFlags().Expand());
-}
-
-void EntryDialog::AddButtons()
-{
-    const int border = FromDIP(DIALOG_BORDER);
-    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
-    column->Add(m_rows, wxSizerFlags(1).Expand().Border(wxALL, border));
-    column->Add(CreateStdDialogButtonSizer(wxOK | wxCANCEL),
-                wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
-    SetSizerAndFit(column);
-    CentreOnParent();
-    m_key->SetFocus();
+    TypeChoice_Fill(m_type, LONGEST_ITEM);
+    if (current.entry)
+        TypeChoice_Select(m_type, current.entry->type);
+    m_rows = Dialog_CreateRows(this);
+    Dialog_AddRow(m_rows, this, texts.fileLabel, m_file);
+    Dialog_AddRow(m_rows, this, texts.keyLabel, m_key);
+    Dialog_AddRow(m_rows, this, "Entry Type:", m_type);
 }
 
 void EntryDialog::FillFiles()
@@ -61,15 +42,6 @@ void EntryDialog::FillFiles()
     for (int file : m_files)
         m_file->Append(ShortText(
             m_file, PathText(Entry_FileLabel(m_current.set, m_files, file).c_str()), LONGEST_ITEM));
-}
-
-// The fixed types, which no entry has, are not offered.
-void EntryDialog::FillTypes()
-{
-    for (int i = BIB_FIXED_TYPES; i < BibTypeCount; ++i)
-        m_type->Append(ShortText(m_type, StoreText(BibTypeTable[i]), LONGEST_ITEM));
-    if (m_current.entry)
-        m_type->SetSelection(std::max<int>(m_current.entry->type - BIB_FIXED_TYPES, wxNOT_FOUND));
 }
 
 // The item of the current file; wxNOT_FOUND when that can't be written.
@@ -83,37 +55,44 @@ int EntryDialog::CurrentChoice() const
 
 std::string EntryDialog::Key() const
 {
-    return Entry_TypedKey(m_key->GetValue().ToStdWstring().c_str());
+    return Key_Typed(m_key->GetValue().ToStdWstring().c_str());
 }
 
 void EntryDialog::Refuse(const wxString &text)
 {
-    wxMessageBox(text, m_texts.caption, wxOK | wxICON_EXCLAMATION, this);
+    Box_Warn(this, m_texts.caption, text);
     m_key->SetFocus();
 }
 
 void EntryDialog::ReplaceBadChars(std::string key)
 {
-    int answer = wxMessageBox("The key includes invalid characters.\n"
-                              "We will remove them from key and continue.",
-                              m_texts.caption, wxOK | wxCANCEL | wxICON_EXCLAMATION, this);
+    bool accepted = Box_WarnOrCancel(this, m_texts.caption,
+                                     "The key includes invalid characters.\n"
+                                     "We will remove them from key and continue.");
     m_key->SetFocus();
-    if (answer != wxOK)
+    if (!accepted)
         return;
     Bib_StripKeyChars(key.data());
     m_key->ChangeValue(StoreText(key.c_str()));
 }
 
-bool EntryDialog::Accept(KeyVerdict verdict, std::string key)
+bool EntryDialog::AcceptDuplicate()
 {
-    if (!Entry_KeyFits(m_key->GetValue().ToStdWstring().c_str())) {
-        Refuse(wxString::Format("The key includes characters that can't be stored in %s.",
-                                Enc_Current()->name));
+    return wxMessageBox(m_texts.takenElsewhere, m_texts.caption, wxYES_NO | wxICON_QUESTION,
+                        this) == wxYES;
+}
+
+bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)
+{
+    std::string misfit = Key_Misfit(m_key->GetValue().ToStdWstring().c_str());
+    if (!misfit.empty()) {
+        Refuse(StoreText(misfit.c_str()));
         return false;
     }
     switch (verdict) {
     case KEY_OK:
-        return true;
+    case KEY_SAME:
+        return verdict == KEY_OK;
     case KEY_EMPTY:
         Refuse(m_texts.emptyKey);
         return false;
@@ -126,17 +105,13 @@ bool EntryDialog::Accept(KeyVerdict verdict, std::string key)
     case KEY_NO_FILE:
         Refuse("I can't locate selected bibliography file.");
         return false;
-    case KEY_SAME:
-        return false;
     case KEY_TAKEN:
         Refuse(m_texts.takenKey);
         return false;
     case KEY_TAKEN_ELSEWHERE:
         break;
     }
-    return wxMessageBox("Specified Key is already present in another BIB files.\n"
-                        "Are you shure that you want to add duplication in your BIB-File ?",
-                        m_texts.caption, wxYES_NO | wxICON_QUESTION, this) == wxYES;
+    return AcceptDuplicate();
 }
 
 void EntryDialog::SetChanged(BibEntry *entry, int file)
@@ -156,7 +131,9 @@ Cartulo_NewEntry::Cartulo_NewEntry(wxWindow *parent, const EntryPlace &current,
     : EntryDialog(parent, current,
                   {"Creating New Bibliography Entry", "Add Entry to BIB-file:", "Entry Key:",
                    "Adding New Entry", "Please enter key of the new bibliography entry.",
-                   "Specified Key is already present in the BIB file."}),
+                   "Specified Key is already present in the BIB file.",
+                   "Specified Key is already present in another BIB files.\n"
+                   "Are you shure that you want to add duplication in your BIB-File ?"}),
       m_ini(ini)
 {
     SelectFile();
@@ -165,8 +142,10 @@ Cartulo_NewEntry::Cartulo_NewEntry(wxWindow *parent, const EntryPlace &current,
     m_child = new wxCheckBox(this, ID_ENTRY_CHILD, "");
     const BibFile *file = current.file >= 0 ? current.set->files[current.file] : nullptr;
     m_child->Enable(Entry_MayBeParent(file, current.entry));
-    AddRow("Create 'crossref':", m_child);
-    AddButtons();
+    if (m_child->IsEnabled())
+        m_child->SetToolTip("The new entry refers to `" + StoreText(current.entry->key) + "'.");
+    Dialog_AddRow(m_rows, this, "Create 'crossref':", m_child);
+    Dialog_Finish(this, m_rows, m_key);
 }
 
 // The line is logged for a file that was found, too.
@@ -202,10 +181,10 @@ void Cartulo_NewEntry::OnOK(wxCommandEvent &event)
 
 bool Cartulo_NewEntry::Create(int file, const std::string &key)
 {
-    int item = m_type->GetSelection();
-    const char *type = item == wxNOT_FOUND ? "" : BibTypeTable[BIB_FIXED_TYPES + item];
+    int index = TypeChoice_Type(m_type);
+    const char *type = index < 0 ? "" : BibTypeTable[index];
     const bool child = m_child->GetValue();
-    char section[SPECS_SIZE];
+    char section[SCHEMA_SECTION_SIZE];
     Schema_FieldSpecs(m_ini.c_str(), type, section, sizeof section);
     const char *specs = child ? Entry_ChildSpecs : section;
     std::string reason = Entry_CheckType(type, specs);
@@ -233,14 +212,16 @@ Cartulo_RenameEntry::Cartulo_RenameEntry(wxWindow *parent, const EntryPlace &cur
     : EntryDialog(parent, current,
                   {"Renaming Bibliography Entry", "Entry in BIB-file:", "New Key for the Entry:",
                    "Renaming Entry", "Please enter new key for the bibliography entry.",
-                   "Specified New Key is already present in the BIB file."})
+                   "Specified New Key is already present in the BIB file.",
+                   "Specified New Key is already present in another BIB files.\n"
+                   "Are you shure that you want to add duplication in your BIB-File ?"})
 {
     m_file->SetSelection(CurrentChoice());
     m_file->Disable();
     m_type->Disable();
     if (current.entry)
         m_key->ChangeValue(StoreText(current.entry->key));
-    AddButtons();
+    Dialog_Finish(this, m_rows, m_key);
 }
 
 bool Cartulo_RenameEntry::MayRename() const

@@ -1,7 +1,7 @@
 // ui/EntryDialogs.h - the windows that add an entry and rename one.
 //
-// Their OK handlers change the store. The list, the entry that is shown and the mark of the file as
-// modified are up to the caller, who asks for Changed() when the window is closed.
+// Their OK handlers change the store only. After the window is closed the caller asks for
+// Changed(), updates list and pane, and marks the file as modified.
 #pragma once
 
 #include <wx/dialog.h>
@@ -36,18 +36,16 @@ protected:
     struct Texts {
         const char *title, *fileLabel, *keyLabel;
         const char *caption; // of the boxes
-        const char *emptyKey, *takenKey;
+        const char *emptyKey, *takenKey, *takenElsewhere;
     };
 
     EntryDialog(wxWindow *parent, const EntryPlace &current, const Texts &texts);
 
-    void AddRow(const char *label, wxWindow *control);
-    void AddButtons(); // and the final size; the key gets the focus
     int CurrentChoice() const;
     std::string Key() const; // as it was typed, as store text
 
     // False when it can't be the key; the user knows why then, or has one without bad characters.
-    bool Accept(KeyVerdict verdict, std::string key);
+    bool Accept(KeyVerdict verdict, const std::string &key);
     void Refuse(const wxString &text);
     void SetChanged(BibEntry *entry, int file);
 
@@ -56,14 +54,14 @@ protected:
     wxChoice *m_file;         // child windows
     wxTextCtrl *m_key;
     wxChoice *m_type;
+    wxFlexGridSizer *m_rows; // for Dialog_Finish
 
 private:
     void FillFiles();
-    void FillTypes();
     void ReplaceBadChars(std::string key);
+    bool AcceptDuplicate();
 
     Texts m_texts;
-    wxFlexGridSizer *m_rows;
     BibEntry *m_changed = nullptr;
     int m_changedFile = -1;
 };

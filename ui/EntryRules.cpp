@@ -3,24 +3,18 @@
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
-#include <cwchar>
 
 #include "app/Log.h"
-#include "encoding/Encoding.h"
 #include "store/Ascii.h"
 
 // --- Fields ---
 
-// The slot of the entry's first `crossref`; -1 for none.
 static int FindCrossref(const BibEntry *entry)
 {
-    for (int i = 0; i < entry->fieldCount; ++i)
-        if (Ascii_Compare(BibFieldTable[entry->fields[i].name], "crossref") == 0)
-            return i;
-    return -1;
+    return Bib_FindField(entry, "crossref");
 }
 
-static void Replace(char **text, const char *with)
+static void ReplaceText(char **text, const char *with)
 {
     char *copy = Bib_CopyText(with, strlen(with));
     if (!copy)
@@ -56,35 +50,12 @@ std::string Entry_FileLabel(const BibFileSet *set, const std::vector<int> &files
     return name + " (" + set->files[file]->path + ")";
 }
 
-int Entry_MayBeParent(const BibFile *file, const BibEntry *entry)
+bool Entry_MayBeParent(const BibFile *file, const BibEntry *entry)
 {
     return file && entry && !file->readOnly && FindCrossref(entry) < 0;
 }
 
 // --- Keys ---
-
-std::string Entry_TypedKey(const wchar_t *typed)
-{
-    std::vector<char> narrow(wcslen(typed) + 1);
-    std::string key = Enc_FromUnicode(narrow.data(), typed);
-    key.erase(std::remove_if(key.begin(), key.end(), [](unsigned char c) { return c <= 32; }),
-              key.end());
-    return key;
-}
-
-int Entry_KeyFits(const wchar_t *typed)
-{
-    const unsigned char none = 255; // what stands for characters without a byte
-    for (; *typed; ++typed) {
-        const wchar_t character[] = {*typed, 0};
-        char byte[2];
-        Enc_FromUnicode(byte, character);
-        if (static_cast<unsigned char>(byte[0]) == none &&
-            Enc_Current()->map[none] != static_cast<uint32_t>(*typed))
-            return 0;
-    }
-    return 1;
-}
 
 static int HasKey(const BibFile *file, const char *key)
 {
@@ -98,9 +69,7 @@ static KeyVerdict CheckForm(const char *key)
 {
     if (!*key)
         return KEY_EMPTY;
-    std::string stripped = key;
-    Bib_StripKeyChars(stripped.data());
-    if (strcmp(stripped.c_str(), key) != 0)
+    if (Bib_HasBadKeyChars(key))
         return KEY_BAD_CHARS;
     return Bib_IsKey(key) ? KEY_OK : KEY_UNWRITABLE;
 }
@@ -138,14 +107,6 @@ KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const B
 
 const char Entry_ChildSpecs[] = "crossref=*\0";
 
-static int IsKnownField(const std::string &name)
-{
-    for (int i = 0; i < BibFieldCount; ++i)
-        if (Ascii_Compare(BibFieldTable[i], name.c_str()) == 0)
-            return 1;
-    return 0;
-}
-
 static std::vector<std::string> MandatoryFields(const char *specs)
 {
     std::vector<std::string> names;
@@ -169,7 +130,7 @@ std::string Entry_CheckType(const char *typeName, const char *specs)
         if (!Bib_IsName(name.c_str()))
             return std::string("The type `") + typeName + "' asks for the field `" + name +
                    "', which can't be written to a BIB file.";
-        newNames += !IsKnownField(name);
+        newNames += !Bib_IsFieldKnown(name.c_str());
     }
     if (newNames > BIB_FIELD_LIMIT - BibFieldCount)
         return "There are too many different names of fields in all open files.\n\n"
@@ -182,13 +143,14 @@ BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, con
 {
     BibEntry *entry = Bib_NewEntry(file, key, typeName, specs, 0);
     if (entry && parent && FindCrossref(entry) == 0)
-        Replace(&entry->fields[0].value, parent->key);
+        ReplaceText(&entry->fields[0].value, parent->key);
     return entry;
 }
 
 // --- Changes ---
 
-// The slot of the `crossref` that names `key`; -1 when the entry does not refer to it.
+// The slot of the `crossref` that names `key`; -1 when the entry does not refer to it. Logs each
+// value that it looks at: the log tells why a removal was refused.
 static int FindReference(const BibEntry *entry, const char *key)
 {
     int crossref = FindCrossref(entry);
@@ -205,9 +167,9 @@ void Entry_Rename(BibFile *file, BibEntry *entry, const char *key)
     for (BibEntry *other = file->entries; other && other != entry; other = other->next) {
         int reference = FindReference(other, entry->key);
         if (reference >= 0)
-            Replace(&other->fields[reference].value, key);
+            ReplaceText(&other->fields[reference].value, key);
     }
-    Replace(&entry->key, key);
+    ReplaceText(&entry->key, key);
 }
 
 std::string Entry_Referrers(const BibFile *file, const BibEntry *entry)
@@ -221,10 +183,8 @@ std::string Entry_Referrers(const BibFile *file, const BibEntry *entry)
 
 int Entry_Remove(BibFile *file, BibEntry *entry)
 {
-    BibEntry **link = &file->entries;
-    while (*link && *link != entry)
-        link = &(*link)->next;
-    if (!*link) {
+    BibEntry **link = Bib_FindLink(file, entry);
+    if (!link) {
         AppLog("DELETEENTRY: ", "Current entry not found.");
         return 0;
     }

@@ -13,13 +13,13 @@
 // once.
 std::vector<int> Entry_WritableFiles(const BibFileSet *set);
 
-// What tells a file from the others of `files`: its base name; with its path where that is not
-// enough (text of the system).
+// The base name, followed by the path where another file of `files` has the same one. Bytes as the
+// system spells names, not store text.
 std::string Entry_FileLabel(const BibFileSet *set, const std::vector<int> &files, int file);
 
-// 1 when it may become the parent of a new entry of its file: there is one (null: none), it has no
-// parent itself, and the file may be written.
-int Entry_MayBeParent(const BibFile *file, const BibEntry *entry);
+// True when it may become the parent of a new entry of its file: there is one (null: none), it has
+// no parent itself, and the file may be written.
+bool Entry_MayBeParent(const BibFile *file, const BibEntry *entry);
 
 // --- Keys ---
 
@@ -33,12 +33,6 @@ enum KeyVerdict {
     KEY_TAKEN,          // by an entry of the file; also by the renamed one, in other letter case
     KEY_TAKEN_ELSEWHERE // by an entry of another file: the user may want that
 };
-
-// A key as it was typed, as store text without characters of code 32 and below.
-std::string Entry_TypedKey(const wchar_t *typed);
-
-// 0 when it holds characters that the selected code page lacks: Entry_TypedKey has others for them.
-int Entry_KeyFits(const wchar_t *typed);
 
 KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const char *key);
 KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const BibEntry *entry,
@@ -60,14 +54,15 @@ BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, con
 
 // --- Changes ---
 
-// Renames the entry and the `crossref` fields of the entries before it in its file.
+// Renames the entry and the `crossref` fields of the entries before it in its file. A key or a
+// reference for which memory is out stays as it was.
 void Entry_Rename(BibFile *file, BibEntry *entry, const char *key);
 
 // The keys of the entries before this one in the file whose `crossref` names it, as "`a', `b'"; ""
 // for none.
 std::string Entry_Referrers(const BibFile *file, const BibEntry *entry);
 
-// Unlinks and frees. 0, logged, when the entry is not of that file.
+// Unlinks and frees the entry. Returns 0, logged, when it is not of that file.
 int Entry_Remove(BibFile *file, BibEntry *entry);
 
 // The entry to select when that of `row` is gone: the one after it in the list, else the one

@@ -1,18 +1,32 @@
 #include "ui/FieldDialogs.h"
 
+#include <algorithm>
+
 #include <wx/combobox.h>
-#include <wx/msgdlg.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "app/Companion.h"
+#include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/FieldKeys.h"
+#include "ui/Keys.h"
 
-enum { ID_FIELD_KEY = 6001, ID_FIELD_VALUE = 6002, DIALOG_BORDER = 12, COLUMN_GAP = 8 };
+enum { LONG_WORD = 1000 }; // characters
 
 // --- The value ---
+
+// To break a very long word between its letters only where blanks do not help takes minutes.
+static long WrapStyle(const wxString &value)
+{
+    int length = 0, longest = 0;
+    for (wxUniChar c : value) {
+        length = c == ' ' || c == '\n' ? 0 : length + 1;
+        longest = std::max(longest, length);
+    }
+    return longest > LONG_WORD ? wxTE_CHARWRAP : wxTE_BESTWRAP;
+}
 
 wxBEGIN_EVENT_TABLE(Cartulo_EditField, wxDialog)
     EVT_BUTTON(wxID_OK, Cartulo_EditField::OnOK)
@@ -26,24 +40,20 @@ Cartulo_EditField::Cartulo_EditField(wxWindow *parent, const wxString &key, cons
     SetFont(wxFontInfo(10));
     wxBoxSizer *heading = new wxBoxSizer(wxHORIZONTAL);
     heading->Add(new wxStaticText(this, wxID_ANY, "Field Key:"),
-                 wxSizerFlags().Border(wxRIGHT, FromDIP(COLUMN_GAP)));
+                 wxSizerFlags().Border(wxRIGHT, FromDIP(DIALOG_GAP)));
     wxStaticText *keyText = new wxStaticText(this, ID_FIELD_KEY, "");
     keyText->SetLabelText(key);
     heading->Add(keyText);
     m_value = new wxTextCtrl(this, ID_FIELD_VALUE, "There is no editable field", wxDefaultPosition,
-                             wxDefaultSize, wxTE_MULTILINE);
+                             wxDefaultSize, wxTE_MULTILINE | WrapStyle(value));
     m_value->SetMinSize(FromDIP(wxSize(600, 200)));
-    m_value->ChangeValue(value);
 
-    const int border = FromDIP(DIALOG_BORDER);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
-    column->Add(heading, wxSizerFlags().Border(wxALL, border));
-    column->Add(m_value, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
-    column->Add(CreateStdDialogButtonSizer(wxOK | wxCANCEL),
-                wxSizerFlags().Expand().Border(wxALL, border));
-    SetSizerAndFit(column);
-    CentreOnParent();
-    m_value->SetFocus();
+    column->Add(heading, wxSizerFlags().Border(wxBOTTOM, FromDIP(DIALOG_BORDER)));
+    column->Add(m_value, wxSizerFlags(1).Expand());
+    Dialog_Finish(this, column, m_value);
+    m_value->ChangeValue(value);
+    m_value->SetInsertionPointEnd();
 }
 
 wxString Cartulo_EditField::Value() const
@@ -82,52 +92,48 @@ Cartulo_RenameField::Cartulo_RenameField(wxWindow *parent, const FieldGrid *grid
     SetFont(wxFontInfo(10));
     wxTextCtrl *oldName = new wxTextCtrl(this, ID_FIELD_KEY, key);
     oldName->Disable();
-    m_name =
-        new wxComboBox(this, ID_FIELD_VALUE, proposal, wxDefaultPosition, wxDefaultSize, proposals);
+    m_name = new wxComboBox(this, ID_FIELD_NEW_NAME, proposal, wxDefaultPosition, wxDefaultSize,
+                            proposals);
     m_name->SetValue(proposal);
-    wxFlexGridSizer *rows = new wxFlexGridSizer(2, FromDIP(wxSize(COLUMN_GAP, COLUMN_GAP)));
-    rows->AddGrowableCol(1);
-    rows->Add(new wxStaticText(this, wxID_ANY, "Old Field Name:"), wxSizerFlags().CentreVertical());
-    rows->Add(oldName, wxSizerFlags().Expand());
-    rows->Add(new wxStaticText(this, wxID_ANY, "New Field Name:"), wxSizerFlags().CentreVertical());
-    rows->Add(m_name, wxSizerFlags().Expand());
-
-    const int border = FromDIP(DIALOG_BORDER);
-    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
-    column->Add(rows, wxSizerFlags(1).Expand().Border(wxALL, border));
-    column->Add(CreateStdDialogButtonSizer(wxOK | wxCANCEL),
-                wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
-    SetSizerAndFit(column);
-    CentreOnParent();
-    m_name->SetFocus();
+    wxFlexGridSizer *rows = Dialog_CreateRows(this);
+    Dialog_AddRow(rows, this, "Old Field Name:", oldName);
+    Dialog_AddRow(rows, this, "New Field Name:", m_name);
+    Dialog_Finish(this, rows, m_name);
 }
 
-void Cartulo_RenameField::Refuse(const wxString &text)
+// False when the user has to see to the name first. An empty one is accepted: nothing changes.
+bool Cartulo_RenameField::Accept(const std::string &name)
 {
-    wxMessageBox(text, GetTitle(), wxOK | wxICON_WARNING, this);
+    switch (FieldKey_CheckNewName(m_grid, name.c_str())) {
+    case FIELD_KEY_OK:
+    case FIELD_KEY_EMPTY:
+        return true;
+    case FIELD_KEY_BAD_CHARS:
+        if (Box_WarnOrCancel(this, GetTitle(), FieldKey_BadCharsText)) {
+            std::string stripped = name;
+            Bib_StripKeyChars(stripped.data());
+            m_name->SetValue(StoreText(stripped.c_str()));
+        }
+        return false;
+    case FIELD_KEY_UNWRITABLE:
+        Box_Warn(this, GetTitle(), FieldKey_UnwritableText);
+        return false;
+    case FIELD_KEY_TAKEN:
+        Box_Warn(this, GetTitle(), FieldKey_TakenText);
+    }
+    return false;
 }
 
 void Cartulo_RenameField::OnOK(wxCommandEvent &event)
 {
-    std::string name = FieldKey_Typed(m_name->GetValue().ToStdWstring().c_str());
-    switch (FieldKey_CheckNewName(m_grid, name.c_str())) {
-    case FIELD_KEY_EMPTY:
-        break; // closes, and nothing changes
-    case FIELD_KEY_BAD_CHARS:
-        if (wxMessageBox(FieldKey_BadCharsText, GetTitle(), wxOK | wxCANCEL | wxICON_WARNING,
-                         this) == wxOK) {
-            Bib_StripKeyChars(name.data());
-            m_name->SetValue(StoreText(name.c_str()));
-        }
+    std::wstring typed = m_name->GetValue().ToStdWstring();
+    std::string misfit = Key_Misfit(typed.c_str()), name = Key_Typed(typed.c_str());
+    if (!misfit.empty()) {
+        Box_Warn(this, GetTitle(), StoreText(misfit.c_str()));
         return;
-    case FIELD_KEY_UNWRITABLE:
-        Refuse(FieldKey_UnwritableText);
-        return;
-    case FIELD_KEY_TAKEN:
-        Refuse(FieldKey_TakenText);
-        return;
-    case FIELD_KEY_OK:
-        m_newName = name;
     }
+    if (!Accept(name))
+        return;
+    m_newName = name;
     event.Skip(); // closes
 }

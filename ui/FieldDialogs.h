@@ -1,12 +1,16 @@
 // ui/FieldDialogs.h - the windows for a field of the entry that is edited: its value, its name.
 #pragma once
 
+#include <wx/arrstr.h>
 #include <wx/dialog.h>
 
-#include "ui/FieldGrid.h"
+#include <string>
 
 class wxComboBox;
 class wxTextCtrl;
+struct FieldGrid;
+
+enum { ID_FIELD_KEY = 6001, ID_FIELD_VALUE = 6002, ID_FIELD_NEW_NAME = 6002 };
 
 class Cartulo_EditField : public wxDialog
 {
@@ -35,7 +39,7 @@ public:
 
 private:
     void OnOK(wxCommandEvent &event);
-    void Refuse(const wxString &text);
+    bool Accept(const std::string &name);
 
     const FieldGrid *m_grid;
     wxComboBox *m_name; // child window

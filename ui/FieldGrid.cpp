@@ -4,6 +4,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
+#include <cwchar>
 
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
@@ -18,12 +19,11 @@ static const char *NameOf(const BibField *field)
     return BibFieldTable[field->name];
 }
 
+// Null when the entry has none of this name.
 static const BibField *FindField(const BibEntry *entry, const char *name)
 {
-    for (int i = 0; i < entry->fieldCount; ++i)
-        if (SameName(NameOf(&entry->fields[i]), name))
-            return &entry->fields[i];
-    return nullptr;
+    int slot = Bib_FindField(entry, name);
+    return slot >= 0 ? &entry->fields[slot] : nullptr;
 }
 
 static int CountShown(const BibEntry *entry) // fields that get a row
@@ -33,13 +33,13 @@ static int CountShown(const BibEntry *entry) // fields that get a row
 
 // --- Showing ---
 
-const BibEntry *Grid_FindTarget(const BibEntry *entry)
+const BibEntry *Grid_FindParent(const BibEntry *entry)
 {
     const BibField *crossref = FindField(entry, "crossref");
-    const BibEntry *target = crossref ? entry->next : nullptr;
-    while (target && !SameName(target->key, crossref->value))
-        target = target->next;
-    return target;
+    const BibEntry *parent = crossref ? entry->next : nullptr;
+    while (parent && !SameName(parent->key, crossref->value))
+        parent = parent->next;
+    return parent;
 }
 
 static void FillRow(GridRow *row, const char *key, const char *value)
@@ -48,7 +48,7 @@ static void FillRow(GridRow *row, const char *key, const char *value)
     row->key = key;
     row->stored = value;
     row->text = Enc_ToUnicode(row->filled, value);
-    row->field = GRID_NEW_FIELD;
+    row->field = GRID_NO_FIELD;
 }
 
 static void FillOwnRow(GridRow *row, const BibEntry *entry, int index)
@@ -57,7 +57,7 @@ static void FillOwnRow(GridRow *row, const BibEntry *entry, int index)
     FillRow(row, NameOf(field), field->value);
     row->crossref = SameName(NameOf(field), "crossref");
     row->field = index;
-    row->reserved = field->companion;
+    row->companion = field->companion;
 }
 
 static void FillInheritedRow(GridRow *row, const BibField *field)
@@ -68,8 +68,8 @@ static void FillInheritedRow(GridRow *row, const BibField *field)
 
 static void FillInheritedRows(FieldGrid *grid)
 {
-    for (int i = 0; i < grid->target->fieldCount && grid->count < GRID_ROWS; ++i) {
-        const BibField *field = &grid->target->fields[i];
+    for (int i = 0; i < grid->parent->fieldCount && grid->count < GRID_ROWS; ++i) {
+        const BibField *field = &grid->parent->fields[i];
         if (!FindField(grid->entry, NameOf(field)))
             FillInheritedRow(&grid->rows[grid->count++], field);
     }
@@ -79,12 +79,12 @@ void Grid_Fill(FieldGrid *grid, const BibEntry *entry)
 {
     Grid_Clear(grid);
     grid->entry = entry;
-    grid->target = Grid_FindTarget(entry);
+    grid->parent = Grid_FindParent(entry);
     grid->count = CountShown(entry);
     grid->hidden = entry->fieldCount - grid->count;
     for (int i = 0; i < grid->count; ++i)
         FillOwnRow(&grid->rows[i], entry, i);
-    if (grid->target)
+    if (grid->parent)
         FillInheritedRows(grid);
 }
 
@@ -93,19 +93,63 @@ void Grid_Clear(FieldGrid *grid)
     *grid = {};
 }
 
-bool Grid_IsCrossref(const GridRow *row)
+int Grid_StoredRows(const FieldGrid *grid)
 {
-    return row->crossref;
+    return grid->entry ? CountShown(grid->entry) : 0;
+}
+
+static bool HasRow(const FieldGrid *grid, const char *key)
+{
+    return std::any_of(grid->rows, grid->rows + grid->count,
+                       [key](const GridRow &row) { return SameName(row.key.c_str(), key); });
+}
+
+std::vector<HiddenField> Grid_HiddenFields(const FieldGrid *grid)
+{
+    std::vector<HiddenField> fields;
+    for (int i = Grid_StoredRows(grid); grid->entry && i < grid->entry->fieldCount; ++i)
+        fields.push_back({NameOf(&grid->entry->fields[i]), false});
+    for (int i = 0; grid->parent && i < grid->parent->fieldCount; ++i) {
+        const char *key = NameOf(&grid->parent->fields[i]);
+        if (!HasRow(grid, key) && !FindField(grid->entry, key))
+            fields.push_back({key, true});
+    }
+    return fields;
+}
+
+static std::string CountText(long count, const char *what)
+{
+    if (count == 0)
+        return "";
+    return std::to_string(count) + " more " + what +
+           (count == 1 ? "field is not shown." : "fields are not shown.");
+}
+
+std::string Grid_HiddenText(const FieldGrid *grid)
+{
+    std::vector<HiddenField> fields = Grid_HiddenFields(grid);
+    long inherited = std::count_if(fields.begin(), fields.end(),
+                                   [](const HiddenField &field) { return field.inherited; });
+    std::string own = CountText(static_cast<long>(fields.size()) - inherited, "");
+    std::string others = CountText(inherited, "inherited ");
+    return own + (own.empty() || others.empty() ? "" : " ") + others;
 }
 
 // --- Editing ---
 
 static bool IsHidden(const FieldGrid *grid, const char *key)
 {
-    for (int i = CountShown(grid->entry); i < grid->entry->fieldCount; ++i)
-        if (SameName(NameOf(&grid->entry->fields[i]), key))
-            return true;
-    return false;
+    std::vector<HiddenField> fields = Grid_HiddenFields(grid);
+    return std::any_of(fields.begin(), fields.end(), [key](const HiddenField &field) {
+        return !field.inherited && SameName(field.key.c_str(), key);
+    });
+}
+
+static bool HasOwnRow(const FieldGrid *grid, const char *key)
+{
+    return std::any_of(grid->rows, grid->rows + grid->count, [key](const GridRow &row) {
+        return !row.inherited && SameName(row.key.c_str(), key);
+    });
 }
 
 static int FindLastRow(const FieldGrid *grid, const char *key)
@@ -118,14 +162,14 @@ static int FindLastRow(const FieldGrid *grid, const char *key)
 
 GridAdd Grid_Add(FieldGrid *grid, const char *key, int *row)
 {
+    if (HasOwnRow(grid, key) || IsHidden(grid, key))
+        return GRID_EXISTS;
     int found = FindLastRow(grid, key);
-    if (found >= 0 && grid->rows[found].inherited) {
+    if (found >= 0) {
         grid->rows[found].inherited = false;
         *row = found;
         return GRID_OVERRIDDEN;
     }
-    if (found >= 0 || IsHidden(grid, key))
-        return GRID_EXISTS;
     if (grid->count == GRID_ROWS)
         return GRID_FULL;
     *row = grid->count++;
@@ -135,11 +179,12 @@ GridAdd Grid_Add(FieldGrid *grid, const char *key, int *row)
 
 GridRemove Grid_Remove(FieldGrid *grid, int row)
 {
-    if (row < 0 || row >= grid->count || row >= grid->entry->fieldCount)
+    if (row < 0 || row >= grid->count || row >= Grid_StoredRows(grid))
         return GRID_NO_ROW;
-    const char *key = grid->rows[row].key.c_str();
-    const BibField *inherited = grid->target ? FindField(grid->target, key) : nullptr;
-    if (inherited) {
+    std::string key = grid->rows[row].key;
+    const BibField *inherited = grid->parent ? FindField(grid->parent, key.c_str()) : nullptr;
+    grid->rows[row].key.clear();
+    if (inherited && !HasRow(grid, key.c_str())) {
         FillInheritedRow(&grid->rows[row], inherited);
         return GRID_INHERITED;
     }
@@ -154,16 +199,16 @@ static bool SameLetter(wchar_t a, wchar_t b)
     return lower(a) == lower(b);
 }
 
-int Grid_MayRename(const FieldGrid *grid, const char *name)
+bool Grid_MayRename(const FieldGrid *grid, const char *name)
 {
     std::wstring shown;
     Enc_ToUnicode(shown, name);
     for (int i = 0; i < grid->count; ++i) {
         const std::wstring &text = grid->rows[i].text;
         if (std::equal(text.begin(), text.end(), shown.begin(), shown.end(), SameLetter))
-            return 0;
+            return false;
     }
-    return 1;
+    return true;
 }
 
 void Grid_Rename(FieldGrid *grid, int row, const char *name)
@@ -204,16 +249,21 @@ static int CountOwnRows(const FieldGrid *grid)
 
 // --- Comparing ---
 
+namespace
+{
+
 // Which field each row stands for, and which fields are taken.
 struct Match {
-    int fields[GRID_ROWS]; // by row; GRID_NEW_FIELD for none
+    int fields[GRID_ROWS]; // by row; GRID_NO_FIELD for none
     bool taken[GRID_ROWS]; // by field
 };
+
+} // namespace
 
 static void Take(Match *match, int row, int field)
 {
     match->fields[row] = field;
-    if (field != GRID_NEW_FIELD)
+    if (field != GRID_NO_FIELD)
         match->taken[field] = true;
 }
 
@@ -227,7 +277,7 @@ static int FindFreeField(const BibEntry *entry, const Match *match, const GridRo
     int field = CountShown(entry) - 1;
     while (field >= 0 && (match->taken[field] || !IsNamed(entry, field, row)))
         --field;
-    return field >= 0 ? field : GRID_NEW_FIELD;
+    return field >= 0 ? field : GRID_NO_FIELD;
 }
 
 // Rows that still have their key come first: they keep their field when it has a namesake.
@@ -236,11 +286,11 @@ static Match MatchRows(const FieldGrid *grid)
     Match match = {};
     for (int i = 0; i < grid->count; ++i) {
         const GridRow *row = &grid->rows[i];
-        bool keepsKey = row->field != GRID_NEW_FIELD && IsNamed(grid->entry, row->field, row);
-        Take(&match, i, keepsKey ? row->field : GRID_NEW_FIELD);
+        bool keepsKey = row->field != GRID_NO_FIELD && IsNamed(grid->entry, row->field, row);
+        Take(&match, i, keepsKey ? row->field : GRID_NO_FIELD);
     }
     for (int i = 0; i < grid->count; ++i)
-        if (match.fields[i] == GRID_NEW_FIELD && !grid->rows[i].inherited)
+        if (match.fields[i] == GRID_NO_FIELD && !grid->rows[i].inherited)
             Take(&match, i, FindFreeField(grid->entry, &match, &grid->rows[i]));
     return match;
 }
@@ -254,7 +304,7 @@ GridChanges Grid_Compare(const FieldGrid *grid, int type)
         if (grid->rows[i].inherited)
             continue;
         int field = match.fields[i];
-        if (field == GRID_NEW_FIELD)
+        if (field == GRID_NO_FIELD)
             ++changes.added;
         else if (ValueOf(&grid->rows[i]) != grid->entry->fields[field].value)
             ++changes.modified;
@@ -266,6 +316,11 @@ GridChanges Grid_Compare(const FieldGrid *grid, int type)
 bool Grid_HasChanges(const GridChanges *changes)
 {
     return changes->type || changes->added || changes->modified || changes->removed;
+}
+
+bool Grid_ChangesOnlyType(const GridChanges *changes)
+{
+    return changes->type && !changes->added && !changes->modified && !changes->removed;
 }
 
 std::string Grid_Question(const GridChanges *changes)
@@ -303,14 +358,13 @@ static bool StoresGuillemets(const std::string &value)
                        [map](char c) { return IsGuillemet(map[static_cast<unsigned char>(c)]); });
 }
 
-// Each once, in order.
+// The characters that would not come back, each once, in their order.
 static std::wstring LostCharacters(const GridRow *row)
 {
-    std::wstring back, lost;
-    Enc_ToUnicode(back, ValueOf(row).c_str());
-    for (size_t i = 0; i < back.size(); ++i)
-        if (back[i] != row->text[i] && lost.find(row->text[i]) == lost.npos)
-            lost += row->text[i];
+    std::wstring lost;
+    for (wchar_t c : row->text)
+        if (!Enc_Holds(c) && lost.find(c) == lost.npos)
+            lost += c;
     return lost;
 }
 
@@ -324,8 +378,8 @@ static std::wstring Visible(wchar_t c)
     return name;
 }
 
-// The first of them, with blanks between.
-static std::wstring List(const std::wstring &characters)
+// The first twenty, with blanks between.
+static std::wstring ListCharacters(const std::wstring &characters)
 {
     static const size_t most = 20;
     std::wstring list;
@@ -334,28 +388,46 @@ static std::wstring List(const std::wstring &characters)
     return characters.size() > most ? list + L" ..." : list;
 }
 
-static std::wstring RowLosses(const GridRow *row)
+static bool StoresGuillemets(const BibEntry *entry)
+{
+    return std::any_of(entry->fields, entry->fields + entry->fieldCount,
+                       [](const BibField &field) { return StoresGuillemets(field.value); });
+}
+
+// What the store makes of it.
+static std::wstring Stored(wchar_t c)
+{
+    const wchar_t character[] = {c, 0};
+    char byte[2];
+    std::wstring stored;
+    return Enc_ToUnicode(stored, Enc_FromUnicode(byte, character));
+}
+
+static std::wstring RowLosses(const GridRow *row, bool textGuillemets)
 {
     std::wstring key, page, text;
     Enc_ToUnicode(key, row->key.c_str());
     Enc_ToUnicode(page, Enc_Current()->name);
     std::wstring lost = LostCharacters(row);
     if (!lost.empty())
-        text += L"`" + key + L"': " + List(lost) + L" can't be stored in " + page + L".\n";
-    if (StoresGuillemets(row->stored) && HoldsGuillemets(row->text))
+        text += L"`" + key + L"': " + ListCharacters(lost) + L" can't be stored in " + page +
+                L" and would become " + Stored(lost[0]) + L".\n";
+    if (textGuillemets && HoldsGuillemets(row->text))
         text += L"`" + key +
-                L"': \xAB and \xBB can't be stored as text, they would mark an "
+                L"': \xAB and \xBB can't be stored as text: they would mark an "
                 L"abbreviation.\n";
     return text;
 }
 
 std::wstring Grid_Losses(const FieldGrid *grid)
 {
+    bool textGuillemets =
+        StoresGuillemets(grid->entry) || (grid->parent && StoresGuillemets(grid->parent));
     std::wstring text;
     for (int i = 0; i < grid->count; ++i)
         if (IsChanged(&grid->rows[i]))
-            text += RowLosses(&grid->rows[i]);
-    return text.empty() ? text : text + L"\nDo you want to accept these changes nevertheless ?";
+            text += RowLosses(&grid->rows[i], textGuillemets);
+    return text.empty() ? text : text + L"\nDo you want to accept these changes anyway ?";
 }
 
 // --- Checking ---
@@ -371,39 +443,32 @@ static bool HasReadableNames(const std::string &value)
     return true;
 }
 
-const char *Grid_CheckRow(const FieldGrid *grid, int row)
+const char *Grid_CheckRow(const GridRow *row)
 {
-    const GridRow *checked = &grid->rows[row];
-    if (checked->inherited)
+    if (row->inherited)
         return nullptr;
-    std::string value = ValueOf(checked);
+    std::string value = ValueOf(row);
     const char *reason = Bib_CheckValue(value.c_str());
-    if (!reason && IsChanged(checked) && !HasReadableNames(value))
+    if (!reason && IsChanged(row) && !HasReadableNames(value))
         reason = "The name of an abbreviation is missing, begins with a digit, or holds a "
                  "backslash or a control character";
     return reason;
 }
 
-static bool IsKnownName(const char *name)
-{
-    return std::any_of(BibFieldTable, BibFieldTable + BibFieldCount,
-                       [name](const char *known) { return SameName(known, name); });
-}
-
-// The key of row i is in the table already, or an earlier row brings it there.
-static bool NeedsNoRoom(const FieldGrid *grid, int i)
+// Whether the key of row i is neither in the table already nor brought there by an earlier row.
+static bool IsNewName(const FieldGrid *grid, int i)
 {
     const char *key = grid->rows[i].key.c_str();
-    return IsKnownName(key) || std::any_of(grid->rows, grid->rows + i, [key](const GridRow &row) {
-               return SameName(row.key.c_str(), key);
-           });
+    return !Bib_IsFieldKnown(key) &&
+           std::none_of(grid->rows, grid->rows + i,
+                        [key](const GridRow &row) { return SameName(row.key.c_str(), key); });
 }
 
-int Grid_HasRoom(const FieldGrid *grid)
+bool Grid_HasRoom(const FieldGrid *grid)
 {
     int names = BibFieldCount;
     for (int i = 0; i < grid->count; ++i)
-        names += !NeedsNoRoom(grid, i);
+        names += IsNewName(grid, i);
     return names <= BIB_FIELD_LIMIT;
 }
 
@@ -417,7 +482,7 @@ static int BuildFields(BibField *field, const FieldGrid *grid)
         const GridRow *row = &grid->rows[i];
         if (row->inherited)
             continue;
-        *field = {Bib_FieldIndex(row->key.c_str()), row->reserved, CopyValue(row)};
+        *field = {Bib_FieldIndex(row->key.c_str()), row->companion, CopyValue(row)};
         complete &= field++->value != nullptr;
     }
     for (int i = CountShown(grid->entry); i < grid->entry->fieldCount; ++i) {
@@ -446,10 +511,8 @@ BibEntry *Grid_Build(const FieldGrid *grid, int type)
 
 int Grid_Replace(BibFile *file, BibEntry *old, BibEntry *entry)
 {
-    BibEntry **link = &file->entries;
-    while (*link && *link != old)
-        link = &(*link)->next;
-    if (!*link)
+    BibEntry **link = Bib_FindLink(file, old);
+    if (!link)
         return 0;
     entry->next = old->next;
     *link = entry;

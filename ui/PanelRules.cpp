@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <cmath>
 
+#include "app/Ids.h"
+
 PanelPane Panel_Pane(int fileCount, int rowCount)
 {
     if (fileCount == 0)
@@ -23,6 +25,15 @@ PanelTools Panel_Tools(const BibFileSet *set, int file, bool editMode)
     for (int i = 0; i < set->count && !tools.add; ++i)
         tools.add = IsWritable(set, i); // a new entry may go to any file
     return tools;
+}
+
+int Panel_RowToRemove(int id, int focusedRow, int storedRows)
+{
+    if (id >= ID_REMOVE_ROW && id < ID_REMOVE_ROW_END)
+        return id - ID_REMOVE_ROW;
+    if (id != ID_REMOVE_FIELD)
+        return -1;
+    return focusedRow >= 0 ? focusedRow : storedRows;
 }
 
 static double Linear(unsigned char channel)

@@ -18,6 +18,11 @@ struct PanelTools {
 };
 PanelTools Panel_Tools(const BibFileSet *set, int file, bool editMode);
 
+// The row whose field a command removes: of a row's button (ID_REMOVE_ROW and following), or, for
+// ID_REMOVE_FIELD, the one with the focus; when none has it (-1), `storedRows`, which is no row.
+// -1 for another command.
+int Panel_RowToRemove(int id, int focusedRow, int storedRows);
+
 struct Colour {
     unsigned char red, green, blue;
 };
@@ -26,5 +31,6 @@ struct Colour {
 double Panel_Contrast(Colour a, Colour b);
 
 // The colour of a text whose colour was chosen for light backgrounds: itself on those, and on a
-// dark one the same hue, light enough for a contrast of 4.5 at least.
+// dark one the same hue, light enough for a contrast of 4.5 at least, of 7 where the colour was
+// dark, so that dark and bright ones stay apart.
 Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme);

@@ -11,13 +11,7 @@
 #include "store/Sys.h"
 
 // Of buffers, in bytes with the end: what does not fit is not read.
-enum {
-    SECTION_NAMES_SIZE = 2046,
-    SECTION_SIZE = 2048,
-    VALUE_SIZE = 64,
-    NAME_SIZE = 256,
-    HELP_SIZE = 1024
-};
+enum { SECTION_NAMES_SIZE = 2046, VALUE_SIZE = 64, NAME_SIZE = 256, HELP_SIZE = 1024 };
 
 // The length of the path up to the separator of its last name, with it.
 static size_t FolderLength(const std::string &path)
@@ -118,7 +112,7 @@ std::string Schema_Description(const char *ini, const char *type)
 
 void Schema_FieldSpecs(const char *ini, const char *type, char *buffer, size_t size)
 {
-    Profile_GetSection(type, buffer, std::min<size_t>(size, SECTION_SIZE), ini);
+    Profile_GetSection(type, buffer, std::min<size_t>(size, SCHEMA_SECTION_SIZE), ini);
 }
 
 // --- Advice ---
@@ -203,7 +197,7 @@ static std::string Note(const std::vector<std::string> &missing)
 
 SchemaAdvice Schema_Advise(const char *ini, const char *type, const std::vector<SchemaRow> &rows)
 {
-    char specs[SECTION_SIZE];
+    char specs[SCHEMA_SECTION_SIZE];
     Schema_FieldSpecs(ini, type, specs, sizeof specs);
     SchemaAdvice advice = {{}, -1, ""};
     std::vector<std::string> missing;

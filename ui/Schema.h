@@ -37,7 +37,9 @@ Colour Schema_FieldColour(FieldClass fieldClass); // of its label, on a light ba
 // "Custom Entry Type" for a type without a section or description.
 std::string Schema_Description(const char *ini, const char *type);
 
-// The lines of a type's section as Bib_NewEntry wants them: at most 2048 bytes. Ends with two 0.
+enum { SCHEMA_SECTION_SIZE = 2048 }; // bytes; what does not fit is not read
+
+// The lines of a type's section as Bib_NewEntry wants them; the last ends with two 0.
 void Schema_FieldSpecs(const char *ini, const char *type, char *buffer, size_t size);
 
 // A shown row, as far as the schema is concerned.

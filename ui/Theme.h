@@ -7,3 +7,6 @@
 
 // Gives the window's text `colour`, or its readable twin when the desktop is dark.
 void Theme_SetTextColour(wxWindow *window, Colour colour);
+
+// For what can be read but not edited now: paler than other text, dark enough to read.
+wxColour Theme_PaleTextColour();

@@ -180,6 +180,17 @@ class ByKeyboard(EditorTest):
         with open(os.path.join(self.work, "all.bbl"), encoding="ascii") as stream:
             return done.stdout, stream.read()
 
+    def test_keys_that_come_before_a_box_are_for_the_box(self):
+        self.write("a.bib", b"@misc{a, note = {A}}\n@misc{b, note = {B}}\n@misc{c, note = {C}}\n")
+        editor = self.start("a.bib").ready()
+        xdotool("key", "--delay", 0, "alt+d", "alt+d", "alt+n")
+        editor.answer(REMOVE_ENTRY)
+        editor.wait_until_active()
+        editor.press("alt+b")
+        self.assertEqual(b"@misc{b,\n\tnote = {B}\n}\n@misc{c,\n\tnote = {C}\n}\n",
+                         self.read("a.bib"))
+        self.assertEqual([], editor.windows(RENAME_ENTRY))
+
 
 class Fields(EditorTest):
     def start_on(self, contents):
@@ -204,6 +215,15 @@ class Fields(EditorTest):
         editor.press("Tab", "alt+d")
         editor.commit()
         self.assert_becomes(b"@misc{a,\n\tbooktitle = {New},\n\tyear = 1999\n}\n", editor)
+
+    def test_keep_their_type_when_the_wheel_turns_over_it(self):
+        editor = self.start_on(b"@misc{a, title = {T}}\n")
+        editor.press("Escape")
+        for y in range(60, 160, 8):
+            xdotool("mousemove", "--window", editor.frame, 600, y, "click", 5, "click", 4)
+        editor.settle()
+        self.assertNotIn("Cartulo::OnChangeType", editor.log())
+        self.assertIn("Update_Tools(): EditMode", editor.log())
 
     def test_keep_their_values_when_the_changes_are_dropped(self):
         editor = self.start_on(b"@misc{a, note = {Old}}\n")

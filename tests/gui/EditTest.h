@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdlib>
+#include <filesystem>
 
 #include <wx/button.h>
 #include <wx/choice.h>
@@ -80,6 +81,16 @@ protected:
         return last;
     }
     wxString Note() const { return NoteText()->GetLabelText(); }
+
+    bool EntryPaneSays(const wxString &text) const
+    {
+        for (wxWindow *child : EntryPane()->GetChildren()) {
+            wxStaticText *label = dynamic_cast<wxStaticText *>(child);
+            if (label && label->IsShown() && label->GetLabelText() == text)
+                return true;
+        }
+        return false;
+    }
 
     wxButton *Remover(int row) const
     {

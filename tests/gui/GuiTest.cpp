@@ -122,6 +122,15 @@ bool PressOK(wxDialog &dialog)
     return closed;
 }
 
+int WhileBoxIsOpen::Enter(wxDialog *dialog)
+{
+    if (dynamic_cast<Cartulo_Messages *>(dialog))
+        return wxID_OK;
+    ++boxes;
+    m_action();
+    return m_answer;
+}
+
 // --- The log ---
 
 static std::vector<LogLine> logged;

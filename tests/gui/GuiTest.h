@@ -96,6 +96,27 @@ private:
 // In a dialog that is not modal; true when that closes it.
 bool PressOK(wxDialog &dialog);
 
+// Does something while a message box is open, and answers it. Closes the messages window.
+class WhileBoxIsOpen : public wxModalDialogHook
+{
+public:
+    WhileBoxIsOpen(const std::function<void()> &action, int answer)
+        : m_action(action), m_answer(answer)
+    {
+        Register();
+    }
+
+    int boxes = 0;
+
+protected:
+    int Enter(wxDialog *dialog) override;
+    void Exit(wxDialog *) override {}
+
+private:
+    std::function<void()> m_action;
+    int m_answer;
+};
+
 // While one lives, dialogs of the program are really shown.
 class AllowDialogs
 {

@@ -206,6 +206,18 @@ TEST_F(Edit, DropsTheEditsOnNo)
     EXPECT_FALSE(SaveEnabled());
 }
 
+// Events of the toolkit come in while it asks, too.
+TEST_F(Edit, IsNotCalledBusyByItsOwnQuestion)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    WhileBoxIsOpen hook([this] { Panel()->UpdateWindowUI(wxUPDATE_UI_RECURSE); }, wxID_CANCEL);
+    const wxString before = Status();
+    Send(ID_COMMIT_ENTRY);
+    EXPECT_EQ(before, Status());
+}
+
 TEST_F(Edit, GoesOnOnCancel)
 {
     OpenText(Article);
@@ -258,6 +270,7 @@ TEST_F(Edit, RefusesEachValueThatCannotBeWritten)
                   ExpectBox(CommitTitle, WrongSyntax("title", other.utf8_str()), wxID_OK));
     EXPECT_TRUE(Panel()->InEditMode());
     EXPECT_EQ("{open", Value("author")->GetValue());
+    EXPECT_TRUE(WaitFor([this] { return Value("author")->HasFocus(); }));
     EXPECT_FALSE(SaveEnabled());
     Send(ID_EDIT_ENTRY);
 }
@@ -298,6 +311,31 @@ TEST_F(Edit, AsksBeforeItLosesCharacters)
     EXPECT_FALSE(Panel()->InEditMode());
     EXPECT_NE(std::string::npos, Saved().find("\xFF\xF3"
                                               "d\xFF"));
+}
+
+TEST_F(Edit, IsNotSavedBeforeItIsFinished)
+{
+    OpenText(std::string(Article) + "@book{two, year = {1999}}\n");
+    StartEditing();
+    SetValue("year", "2001");
+    Send(ID_SAVE);
+    EXPECT_EQ("The entry that you edit is not saved yet: finish it first, with Esc.", Status());
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    Send(ID_SAVE);
+    EXPECT_EQ("All modified BIB files are saved.", Status());
+    EXPECT_NE(std::string::npos, folder.Read("a.bib").find("2001"));
+}
+
+TEST_F(Edit, CountsFieldsWithoutARowAsPresent)
+{
+    std::string text = "@article{one";
+    for (int i = 0; i < 16; ++i)
+        text += ", f" + std::to_string(i) + " = {v}";
+    OpenText(text + ", author = {A}, crossref = {p}}\n@book{p, title = {T}, year = {1999}}\n");
+    EXPECT_TRUE(
+        EntryPaneSays("2 more fields are not shown. 2 more inherited fields are not shown."));
+    StartEditing();
+    EXPECT_EQ("", Note());
 }
 
 TEST_F(Edit, KeepsBytesThatNobodyTouched)
@@ -374,6 +412,18 @@ TEST_F(Edit, IsFinishedBeforeTheWindowCloses)
     EXPECT_NE(std::string::npos, folder.Read("a.bib").find("New Title"));
 }
 
+// As the end of the session does it.
+TEST_F(Edit, MayBeClosedByForceWhileItAsks)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "New Title");
+    WhileBoxIsOpen hook([this] { frame->Close(true); }, wxID_CANCEL);
+    frame->Close();
+    DeleteClosedWindows();
+    EXPECT_FALSE(frame);
+}
+
 TEST_F(Edit, IsFinishedBeforeTheQuitCommand)
 {
     OpenText(Article);
@@ -442,15 +492,24 @@ TEST_F(Edit, OutlivesASearch)
     EXPECT_NE(std::string::npos, Saved().find("New Title"));
 }
 
+// What is shown is what the commands act on.
 TEST_F(Edit, LeavesTheListOnASearchThatTheEntryNoLongerMatches)
 {
-    OpenText(Article);
+    OpenText(std::string(Article) + "@book{two, year = {1999}}\n");
     SearchFor("1999");
-    StartEditing();
-    SetValue("year", "2001");
-    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    for (const char *key : {"one", "two"}) {
+        ASSERT_STREQ(key, Panel()->CurrentEntry()->key);
+        StartEditing();
+        SetValue("year", "2001");
+        wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+        EXPECT_EQ("The entry is not in the list: it does not hold the searched text.", Status());
+    }
+    EXPECT_EQ(nullptr, Panel()->CurrentEntry());
+    EXPECT_FALSE(ToolEnabled(ID_RENAME_ENTRY));
     EXPECT_FALSE(Panel()->InEditMode());
     EXPECT_TRUE(IsShowing(ID_NEW_ENTRY));
+    Send(ID_COMMIT_ENTRY); // nothing is shown that could be edited
+    EXPECT_FALSE(Panel()->InEditMode());
     EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
     SearchFor("");
     EXPECT_EQ("2001", Value("year")->GetValue());

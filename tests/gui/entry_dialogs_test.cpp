@@ -3,7 +3,6 @@
 #include "tests/gui/GuiTest.h"
 
 #include <cstdlib>
-#include <cstring>
 
 #include <wx/checkbox.h>
 #include <wx/choice.h>
@@ -84,6 +83,8 @@ const char BadChars[] = "The key includes invalid characters.\n"
                         "We will remove them from key and continue.";
 const char Elsewhere[] = "Specified Key is already present in another BIB files.\n"
                          "Are you shure that you want to add duplication in your BIB-File ?";
+const char NewElsewhere[] = "Specified New Key is already present in another BIB files.\n"
+                            "Are you shure that you want to add duplication in your BIB-File ?";
 const long Refusal = wxOK | wxICON_EXCLAMATION, Offer = wxOK | wxCANCEL | wxICON_EXCLAMATION,
            Question = wxYES_NO | wxICON_QUESTION;
 
@@ -580,8 +581,8 @@ TEST_F(RenameEntry, AsksAboutKeysOfOtherFiles)
         EXPECT_TRUE(PressOK(dialog, "ost77"));
     };
     wxTEST_DIALOG(Run(ID_RENAME_ENTRY), UseRename(press),
-                  ExpectBox(Renaming, Elsewhere, wxID_NO, Question),
-                  ExpectBox(Renaming, Elsewhere, wxID_YES, Question));
+                  ExpectBox(Renaming, NewElsewhere, wxID_NO, Question),
+                  ExpectBox(Renaming, NewElsewhere, wxID_YES, Question));
     EXPECT_EQ("ost77 (a)", Selected());
 }
 
@@ -607,9 +608,8 @@ TEST_F(RenameEntry, TakesTheChildrenBeforeItAlong)
 TEST_F(RemoveEntry, AsksFirst)
 {
     Open(folder.Write("R&D.bib", Talks));
-    // The icon is the toolkit's own for a box without one.
     wxTEST_DIALOG(Run(ID_REMOVE_ENTRY),
-                  ExpectBox("Removing Entry", "Griske84 (R&D)", wxID_NO, Question));
+                  ExpectBox("Removing Entry", "Griske84 (R&D)", wxID_NO, wxYES_NO));
     EXPECT_EQ(1u, Rows().size());
     EXPECT_EQ(0, Modified(0));
 }
@@ -755,8 +755,10 @@ TEST_F(NewEntry, IsGivenUpWithEscape)
     EXPECT_EQ(wxID_CANCEL, Panel()->DialogResult());
     EXPECT_EQ(0, Modified(0));
     ASSERT_TRUE(WaitFor([this] { return frame->IsActive() && Search()->HasFocus(); }));
+    ForgetLog();
     keys.Char('M', wxMOD_ALT);
-    wxTEST_DIALOG(WaitFor([] { return false; }, 500),
+    auto isShown = [] { return !TakeLog("INFO: Cartulo::OnShowMessages").empty(); };
+    wxTEST_DIALOG(EXPECT_TRUE(WaitFor(isShown)),
                   ExpectMessages("There is no any messages related with loading BIB-files"));
 }
 

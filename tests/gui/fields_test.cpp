@@ -15,6 +15,10 @@ using RenameField = Edit;
 
 static const long Refusal = wxOK | wxICON_EXCLAMATION;
 static const long Offer = wxOK | wxCANCEL | wxICON_EXCLAMATION;
+static const char Unwritable[] =
+    "A field of this name can't be written to a BIB file.\nIt must not "
+    "begin with a digit, and hold no backslash or control character.";
+static const char Misfit[] = "The key includes characters that can't be stored in CP1252.";
 static const char BadChars[] = "Specified field key includes wrong characters.\nWe will remove "
                                "them from key and continue.";
 
@@ -68,12 +72,9 @@ TEST_F(NewField, RefusesKeys)
     for (const char *key : {"journal", "TITLE", "jour nal"})
         wxTEST_DIALOG(AddField(key), ExpectBox(title, "Field with specified key is already exists.",
                                                wxID_OK, Refusal));
-    wxTEST_DIALOG(AddField("1st"),
-                  ExpectBox(title,
-                            "A field of this name can't be written to a BIB file.\nIt must begin "
-                            "with a letter, and go on with letters, digits and a few signs like - "
-                            "and _.",
-                            wxID_OK, Refusal));
+    wxTEST_DIALOG(AddField("1st"), ExpectBox(title, Unwritable, wxID_OK, Refusal));
+    wxTEST_DIALOG(AddField(L"\u0416anr"), ExpectBox(title, Misfit, wxID_OK, Refusal));
+    EXPECT_TRUE(WaitFor([this] { return NewKey()->HasFocus(); }));
     EXPECT_EQ(2u, ShownFields().size());
 }
 
@@ -156,7 +157,24 @@ TEST_F(RemoveField, TakesTheOneOfItsButton)
     Focus(Value("year"));
     PressRemover(0);
     EXPECT_EQ((std::vector<Field>{{"title", "T"}, {"year", "1999"}}), ShownFields());
-    EXPECT_TRUE(WaitFor([this] { return Type()->HasFocus(); })); // the last row is gone
+    EXPECT_TRUE(WaitFor([this] { return Value("year")->HasFocus(); })); // one row higher now
+    PressRemover(1);
+    EXPECT_TRUE(WaitFor([this] { return Type()->HasFocus(); })); // there is no row behind it
+}
+
+// What the control cannot hold is not to be stored as the control has it.
+TEST_F(RemoveField, KeepsTheInheritedValueThatIsTooLongForItsRow)
+{
+    const std::string text(70000, 'x');
+    OpenText("@inbook{child, crossref = {parent}, author = {A}}\n@book{parent, author = {" + text +
+             "}}\n");
+    StartEditing();
+    Focus(Value("author"));
+    PressShortcut('D', true, false);
+    AddField("author");
+    EXPECT_FALSE(Value("author")->IsEnabled());
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
+    EXPECT_EQ(text, Panel()->CurrentEntry()->fields[1].value);
 }
 
 TEST_F(RemoveField, ShowsTheInheritedOneAgain)
@@ -189,6 +207,7 @@ TEST_F(RemoveField, LeavesNewOnesBehindTheStoredOnes)
                      {"INFO: Cartulo::OnRemoveField unknown target2", TNS_ACTION}}),
               TakeLog("INFO: Cartulo::OnRemoveField"));
     EXPECT_EQ(4u, ShownFields().size());
+    EXPECT_EQ("A field that was just added can be removed after \"Done\".", Status());
     PressRemover(0); // now it moves up to a stored one's place
     PressRemover(2);
     EXPECT_EQ((std::vector<Field>{{"title", "T"}, {"year", "1999"}}), ShownFields());
@@ -221,9 +240,9 @@ TEST_F(EditField, ShowsItsValueInALargeWindow)
     ForgetLog();
     auto change = [](Cartulo_EditField &dialog) {
         EXPECT_EQ("Editing Field", dialog.GetTitle());
-        EXPECT_EQ("title", dialog.FindWindow(6001)->GetLabel());
+        EXPECT_EQ("title", dialog.FindWindow(ID_FIELD_KEY)->GetLabel());
         EXPECT_EQ(10, dialog.GetFont().GetPointSize());
-        wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(6002));
+        wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_VALUE));
         EXPECT_EQ("T", value->GetValue());
         EXPECT_TRUE(value->IsMultiLine());
         value->SetValue("Large");
@@ -250,7 +269,7 @@ TEST_F(EditField, TakesAValueOfManyLines)
     StartEditing();
     Focus(Value("title"));
     auto change = [](Cartulo_EditField &dialog) {
-        dynamic_cast<wxTextCtrl *>(dialog.FindWindow(6002))->SetValue("First\n\tSecond");
+        dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_VALUE))->SetValue("First\n\tSecond");
     };
     wxTEST_DIALOG(PressShortcut('E', true, false), UseDialog<Cartulo_EditField>(change, wxID_OK));
     wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES));
@@ -263,7 +282,7 @@ TEST_F(EditField, IsAcceptedByCtrlEnter)
     StartEditing();
     Focus(Value("title"));
     auto accept = [](Cartulo_EditField &dialog) {
-        wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(6002));
+        wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_VALUE));
         value->SetValue("Large");
         dialog.Show();
         wxKeyEvent key(wxEVT_CHAR_HOOK);
@@ -278,18 +297,59 @@ TEST_F(EditField, IsAcceptedByCtrlEnter)
     EXPECT_EQ("Large", Value("title")->GetValue());
 }
 
+// Within the time that a test may take.
+TEST_F(EditField, TakesALongWord)
+{
+    const std::string text(60000, 'x');
+    OpenText("@article{one, url = {" + text + "}}\n");
+    StartEditing();
+    Focus(Value("url"));
+    auto isShown = [&](Cartulo_EditField &dialog) { EXPECT_TRUE(text == dialog.Value()); };
+    wxTEST_DIALOG(PressShortcut('E', true, false), UseDialog<Cartulo_EditField>(isShown, wxID_OK));
+    Send(ID_COMMIT_ENTRY); // nothing has changed
+    EXPECT_FALSE(Panel()->InEditMode());
+}
+
 TEST_F(EditField, NeedsTheFocusInOne)
 {
     OpenText(Article);
     StartEditing();
+    ForgetLog();
+    auto areRefused = [this] {
+        for (int key : {'E', 'N'}) {
+            PressShortcut(key, true, false);
+            EXPECT_EQ("Put the cursor into a field first, one that was there before the editing.",
+                      Status());
+        }
+    };
     Focus(Type());
-    PressShortcut('E', true, false);
-    PressShortcut('N', true, false);
-    EXPECT_TRUE(Panel()->InEditMode());
+    areRefused();
     AddField("note"); // which gets the focus, but is not stored yet
     ASSERT_TRUE(WaitFor([this] { return Value("note")->HasFocus(); }));
-    PressShortcut('E', true, false);
-    PressShortcut('N', true, false);
+    areRefused();
+    EXPECT_TRUE(Panel()->InEditMode());
+    EXPECT_EQ(Lines(), TakeLog("INFO: Editing Field"));
+    EXPECT_EQ(Lines(), TakeLog("INFO: Renaming Field"));
+}
+
+TEST_F(EditField, GivesTooLongAValueBack)
+{
+    OpenText(Article);
+    StartEditing();
+    Focus(Value("title"));
+    wxString text;
+    for (int i = 0; i < 35000; ++i)
+        text += "x ";
+    auto enter = [&](Cartulo_EditField &dialog) {
+        dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_VALUE))->SetValue(text);
+    };
+    auto isKept = [&](Cartulo_EditField &dialog) { EXPECT_TRUE(text == dialog.Value()); };
+    wxTEST_DIALOG(PressShortcut('E', true, false), UseDialog<Cartulo_EditField>(enter, wxID_OK),
+                  ExpectBox("Editing Field",
+                            "The value is too long: a field can be edited up to 65,534 bytes.",
+                            wxID_OK, Refusal),
+                  UseDialog<Cartulo_EditField>(isKept, wxID_CANCEL));
+    EXPECT_EQ("T", Value("title")->GetValue());
 }
 
 // --- Renaming ---
@@ -303,10 +363,10 @@ TEST_F(RenameField, ChangesTheKey)
     ForgetLog();
     auto change = [this](Cartulo_RenameField &dialog) {
         EXPECT_EQ("Renaming Field", dialog.GetTitle());
-        wxTextCtrl *old = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(6001));
+        wxTextCtrl *old = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_KEY));
         EXPECT_EQ("title", old->GetValue());
         EXPECT_FALSE(old->IsEnabled());
-        wxComboBox *name = dynamic_cast<wxComboBox *>(dialog.FindWindow(6002));
+        wxComboBox *name = dynamic_cast<wxComboBox *>(dialog.FindWindow(ID_FIELD_NEW_NAME));
         EXPECT_EQ(NewKey()->GetStrings(), name->GetStrings());
         EXPECT_EQ("booktitle", name->GetValue());
         EXPECT_TRUE(PressOK(dialog));
@@ -327,10 +387,10 @@ TEST_F(RenameField, ChangesNothingOnCancelOrWithoutAName)
     StartEditing();
     Focus(Value("title"));
     auto cancel = [](Cartulo_RenameField &dialog) {
-        dynamic_cast<wxComboBox *>(dialog.FindWindow(6002))->SetValue("booktitle");
+        dynamic_cast<wxComboBox *>(dialog.FindWindow(ID_FIELD_NEW_NAME))->SetValue("booktitle");
     };
     auto empty = [](Cartulo_RenameField &dialog) {
-        dynamic_cast<wxComboBox *>(dialog.FindWindow(6002))->SetValue(" \t");
+        dynamic_cast<wxComboBox *>(dialog.FindWindow(ID_FIELD_NEW_NAME))->SetValue(" \t");
         EXPECT_TRUE(PressOK(dialog));
     };
     wxTEST_DIALOG(PressShortcut('N', true, false),
@@ -347,7 +407,7 @@ TEST_F(RenameField, RefusesNames)
     StartEditing();
     Focus(Value("title"));
     auto tryAll = [](Cartulo_RenameField &dialog) {
-        wxComboBox *name = dynamic_cast<wxComboBox *>(dialog.FindWindow(6002));
+        wxComboBox *name = dynamic_cast<wxComboBox *>(dialog.FindWindow(ID_FIELD_NEW_NAME));
         for (const char *text : {"1st", "Journal", "t", "a{b}"}) {
             name->SetValue(text);
             EXPECT_FALSE(PressOK(dialog)) << text;
@@ -360,13 +420,9 @@ TEST_F(RenameField, RefusesNames)
     const char *title = "Renaming Field";
     ExpectBox taken(title, "Field with specified key is already exists.", wxID_OK, Refusal);
     ExpectBox takenToo = taken;
-    wxTEST_DIALOG(
-        PressShortcut('N', true, false), UseDialog<Cartulo_RenameField>(tryAll),
-        ExpectBox(title,
-                  "A field of this name can't be written to a BIB file.\nIt must begin with a "
-                  "letter, and go on with letters, digits and a few signs like - and _.",
-                  wxID_OK, Refusal),
-        taken, takenToo, ExpectBox(title, BadChars, wxID_CANCEL, Offer),
-        ExpectBox(title, BadChars, wxID_OK, Offer));
+    wxTEST_DIALOG(PressShortcut('N', true, false), UseDialog<Cartulo_RenameField>(tryAll),
+                  ExpectBox(title, Unwritable, wxID_OK, Refusal), taken, takenToo,
+                  ExpectBox(title, BadChars, wxID_CANCEL, Offer),
+                  ExpectBox(title, BadChars, wxID_OK, Offer));
     EXPECT_EQ((Field{"ab", "T"}), ShownFields().at(1));
 }

@@ -250,33 +250,6 @@ TEST_F(Window, SaysThatAFileIsLockedElsewhere)
     EXPECT_TRUE(IsShowing(ID_OPEN));
 }
 
-// Does something while a message box is open, and answers it. Closes the messages window.
-class WhileBoxIsOpen : public wxModalDialogHook
-{
-public:
-    WhileBoxIsOpen(const std::function<void()> &action, int answer)
-        : m_action(action), m_answer(answer)
-    {
-        Register();
-    }
-
-    int boxes = 0;
-
-protected:
-    int Enter(wxDialog *dialog) override
-    {
-        if (dynamic_cast<Cartulo_Messages *>(dialog))
-            return wxID_OK;
-        ++boxes;
-        m_action();
-        return m_answer;
-    }
-
-private:
-    std::function<void()> m_action;
-    int m_answer;
-};
-
 TEST_F(Window, StaysWhileItIsMade)
 {
     std::string path = folder.Write("taken.bib", OneEntry);
@@ -302,7 +275,8 @@ TEST_F(Window, TouchesNoFilesWhileABoxIsOpen)
             for (int id : {ID_OPEN, ID_SAVE, ID_CITE, ID_MESSAGES, ID_REMOVE_ENTRY})
                 Panel()->GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, id));
             HandleQueuedEvents();
-            EXPECT_EQ("Cartulo is still busy with the files: please try again.", Status());
+            EXPECT_EQ("Cartulo waits for an answer, or is busy with the files: please try again.",
+                      Status());
         },
         wxID_OK);
     frame->TakeCommand((a + " " + taken).c_str());

@@ -1,0 +1,42 @@
+#include "ui/Dialogs.h"
+
+#include <wx/dialog.h>
+#include <wx/msgdlg.h>
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+
+wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog)
+{
+    wxFlexGridSizer *rows = new wxFlexGridSizer(2, dialog->FromDIP(wxSize(DIALOG_GAP, DIALOG_GAP)));
+    rows->AddGrowableCol(1);
+    return rows;
+}
+
+void Dialog_AddRow(wxFlexGridSizer *rows, wxWindow *dialog, const wxString &label,
+                   wxWindow *control)
+{
+    rows->Add(new wxStaticText(dialog, wxID_ANY, label), wxSizerFlags().CentreVertical());
+    rows->Add(control, wxSizerFlags().Expand());
+}
+
+void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus)
+{
+    const int border = dialog->FromDIP(DIALOG_BORDER);
+    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
+    column->Add(content, wxSizerFlags(1).Expand().Border(wxALL, border));
+    column->Add(dialog->CreateStdDialogButtonSizer(wxOK | wxCANCEL),
+                wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
+    dialog->SetSizerAndFit(column);
+    dialog->CentreOnParent();
+    focus->SetFocus();
+}
+
+void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text)
+{
+    wxMessageBox(text, caption, wxOK | wxICON_WARNING, parent);
+}
+
+bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString &text)
+{
+    return wxMessageBox(text, caption, wxOK | wxCANCEL | wxICON_WARNING, parent) == wxOK;
+}

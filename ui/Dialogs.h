@@ -1,0 +1,24 @@
+// ui/Dialogs.h - what the program's windows and boxes have in common.
+#pragma once
+
+#include <wx/string.h>
+
+class wxDialog;
+class wxFlexGridSizer;
+class wxSizer;
+class wxWindow;
+
+enum { DIALOG_BORDER = 12, DIALOG_GAP = 8 }; // device-independent pixels
+
+// Two columns, labels and controls; the second one grows.
+wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog);
+void Dialog_AddRow(wxFlexGridSizer *rows, wxWindow *dialog, const wxString &label,
+                   wxWindow *control);
+
+// Puts OK and Cancel below the content, fits and centres the dialog. `focus` gets the focus.
+void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus);
+
+void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text);
+
+// A warning that may be cancelled; true for OK.
+bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString &text);

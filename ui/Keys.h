@@ -1,0 +1,11 @@
+// ui/Keys.h - what users type for the key of an entry or the name of a field.
+#pragma once
+
+#include <string>
+
+// As store text, without characters of code 32 and below.
+std::string Key_Typed(const wchar_t *typed);
+
+// What to say of characters that the code page lacks (store text): Key_Typed would have others for
+// them. "" when there are none.
+std::string Key_Misfit(const wchar_t *typed);
