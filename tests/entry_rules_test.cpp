@@ -3,19 +3,16 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <cstring>
 #include <string>
 #include <vector>
 
 #include "encoding/Encoding.h"
-#include "store/Sys.h"
 #include "tests/support/LogWatch.h"
 #include "tests/support/TempFolder.h"
 #include "ui/Schema.h"
 
 using testing::ElementsAre;
 using testing::HasSubstr;
-using testing::IsEmpty;
 
 namespace
 {

@@ -125,7 +125,7 @@ private:
     bool ReplaceEntry(int type);
     void AddField(const std::string &key);
     bool TakeValue(int row, const wxString &text);
-    bool NeedsStoredRow(int row);
+    bool IsStoredRow(int row);
     void RemoveRow(int row);
     void SelectInList(BibEntry *entry);
     void ShowChanged(BibEntry *entry, int file);

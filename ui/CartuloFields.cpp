@@ -94,7 +94,7 @@ void Cartulo::AddField(const std::string &key)
 // --- Changing ---
 
 // The commands are for stored fields. False, with a word on it, when there is no such row.
-bool Cartulo::NeedsStoredRow(int row)
+bool Cartulo::IsStoredRow(int row)
 {
     if (!m_editMode)
         return false;
@@ -120,7 +120,7 @@ bool Cartulo::TakeValue(int row, const wxString &text)
 void Cartulo::OnEditField(wxCommandEvent &)
 {
     int row = FocusedRow();
-    if (!NeedsStoredRow(row))
+    if (!IsStoredRow(row))
         return;
     const std::string &key = m_grid.rows[row].key;
     LogRow("INFO: Editing Field: ", row, key);
@@ -141,7 +141,7 @@ void Cartulo::OnEditField(wxCommandEvent &)
 void Cartulo::OnRenameField(wxCommandEvent &)
 {
     int row = FocusedRow();
-    if (!NeedsStoredRow(row))
+    if (!IsStoredRow(row))
         return;
     const std::string &key = m_grid.rows[row].key;
     LogRow("INFO: Renaming Field: ", row, key);

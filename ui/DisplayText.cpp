@@ -27,9 +27,9 @@ std::string PathBytes(const wxString &path)
     return std::string(path.fn_str());
 }
 
-wxString ShortText(const wxWindow *control, const wxString &text, int width)
+wxString ShortText(wxWindow *control, const wxString &text, int width)
 {
-    wxClientDC dc(const_cast<wxWindow *>(control));
+    wxClientDC dc(control);
     dc.SetFont(control->GetFont());
     return wxControl::Ellipsize(text, dc, wxELLIPSIZE_MIDDLE, control->FromDIP(width),
                                 wxELLIPSIZE_FLAGS_NONE);

@@ -11,8 +11,9 @@ wxString StoreText(const char *text); // contents of BIB files, in the selected 
 wxString PathText(const char *text);  // names of files, and messages that hold them
 std::wstring PathTextWide(const char *text);
 
-// A name for a control that is as wide as its text: the middle of a long one is left out.
-wxString ShortText(const wxWindow *control, const wxString &text, int width); // at 100 %
+// `text`, its middle left out where it is wider than `width` (device-independent pixels) in the
+// control's font. For controls that grow with their text.
+wxString ShortText(wxWindow *control, const wxString &text, int width);
 
 // A file name as the system wants it.
 std::string PathBytes(const wxString &path);
