@@ -395,7 +395,7 @@ TEST_F(Grid, EndsItsQuestionAboutLossesWithOne)
     EXPECT_EQ("", Losses());
     Type(0, "« Ж");
     EXPECT_EQ("`note': Ж can't be stored in CP1252 and would become ÿ.\n"
-              "`note': « and » can't be stored as text: they would mark an abbreviation.\n"
+              "`note': « and » will mark an abbreviation, not stand as text.\n"
               "\nDo you want to accept these changes anyway ?",
               Losses());
 }
@@ -403,8 +403,8 @@ TEST_F(Grid, EndsItsQuestionAboutLossesWithOne)
 // They may have been copied from there.
 TEST_F(Grid, AsksAboutGuillemetsThatStandInAnotherField)
 {
-    const char *const question = "`note': « and » can't be stored as text: they would mark an "
-                                 "abbreviation.\n";
+    const char *const question = "`note': « and » will mark an abbreviation, not stand as "
+                                 "text.\n";
     Show("@misc{k, note = {a}, title = {\xAB x}}", "k");
     Type(0, "« x");
     EXPECT_THAT(Losses(), testing::StartsWith(question));

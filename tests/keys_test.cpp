@@ -30,6 +30,12 @@ TEST(KeyMisfit, TellsOfCharactersThatTheCodePageLacks)
     EXPECT_NE("", Key_Misfit(L"\u00FF"));
 }
 
+TEST(KeyMisfit, TellsOfGuillemets)
+{
+    EXPECT_NE("", Key_Misfit(L"my\u00AB1"));
+    EXPECT_NE("", Key_Misfit(L"\u00BB"));
+}
+
 TEST(KeyMisfit, PassesOverWhatIsDroppedAnyway)
 {
     EXPECT_EQ("", Key_Misfit(L"a\t\x02 b"));

@@ -115,6 +115,7 @@ private:
     int FocusedRow() const;
     int RowWithFocus(int count) const;
     void KeepFocus(int row);
+    void FocusRow(int row);
     void ToggleEditing();
     void FollowList();
     void CommitEntry();
@@ -167,9 +168,10 @@ private:
     bool m_editMode = false; // else the list is in use
     bool m_busy = false;     // see IsBusy
     int m_dialogResult = 0;
-    std::string m_ini;  // path of the INI file with the entry types
-    std::string m_name; // of the application, from there
-    int m_sashPosition; // of the split window, kept while it is not split
+    int m_wheelRest = 0; // of a line that the mouse wheel has not turned yet
+    std::string m_ini;   // path of the INI file with the entry types
+    std::string m_name;  // of the application, from there
+    int m_sashPosition;  // of the split window, kept while it is not split
 
     QListBox *m_list = nullptr; // child windows, made after the first files are loaded
     wxScrolledWindow *m_entryPane = nullptr;

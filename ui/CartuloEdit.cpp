@@ -26,6 +26,7 @@
 #include "ui/TypeChoice.h"
 
 enum { LABEL_WIDTH = 96 };                   // in the narrowest window
+enum { NOTE_INDEX = 3 };                     // of the note on missing fields, in its row
 enum { LONGEST_TIP = 1000 };                 // characters
 enum { LONGEST_TYPE = 300 };                 // what is shown of one
 enum { KEY_WIDTH = 160, SMALLEST_KEY = 40 }; // of the box for the key of a new field
@@ -145,9 +146,6 @@ void Cartulo::ShowMoreFields()
     m_moreFields->Show(!text.empty());
 }
 
-// Beside the button that adds a field.
-enum { NOTE_INDEX = 3 }; // of the note on missing fields
-
 wxSizerFlags Cartulo::PlaceInRow() const
 {
     return wxSizerFlags().CentreVertical().Border(wxRIGHT, FromDIP(COLUMN_GAP));
@@ -219,7 +217,12 @@ void Cartulo::PlaceNote()
 // Over a choice it would choose: whoever turns the wheel wants to scroll the pane.
 void Cartulo::OnWheel(wxMouseEvent &event)
 {
-    m_entryPane->ProcessWindowEvent(event);
+    if (event.GetWheelAxis() != wxMOUSE_WHEEL_VERTICAL)
+        return;
+    m_wheelRest += event.GetWheelRotation() * event.GetLinesPerAction(); // small on touchpads
+    const int lines = m_wheelRest / event.GetWheelDelta();
+    m_wheelRest -= lines * event.GetWheelDelta();
+    m_entryPane->ScrollLines(-lines);
 }
 
 void Cartulo::OnEntrySize(wxSizeEvent &event)
@@ -322,6 +325,15 @@ void Cartulo::FocusForMode()
         m_type->SetFocus();
     else if (m_list->IsShown())
         m_list->SetFocus();
+}
+
+// The toolkit would select the whole value: the next letter would take its place.
+void Cartulo::FocusRow(int row)
+{
+    wxTextCtrl *value = m_rows[row].value;
+    long at = value->GetInsertionPoint();
+    value->SetFocus();
+    value->SetInsertionPoint(at);
 }
 
 // The list is enabled before it gets the focus, and disabled after it lost it.
@@ -448,7 +460,7 @@ bool Cartulo::CheckRows()
                                      "accepted.\nFix an error and try again.");
     }
     if (firstBad >= 0 && m_rows[firstBad].value->IsEnabled())
-        m_rows[firstBad].value->SetFocus();
+        FocusRow(firstBad);
     return firstBad < 0;
 }
 

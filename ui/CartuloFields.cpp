@@ -109,12 +109,14 @@ bool Cartulo::TakeValue(int row, const wxString &text)
 {
     wxTextCtrl *value = m_rows[row].value;
     wxString old = value->GetValue();
-    if (text != old)
-        value->ChangeValue(text);
-    if (value->GetValue() == text)
+    if (text == old)
         return true;
-    value->ChangeValue(old);
-    return false;
+    value->ChangeValue(text);
+    bool taken = value->GetValue() == text;
+    if (!taken)
+        value->ChangeValue(old);
+    value->SetInsertionPointEnd();
+    return taken;
 }
 
 void Cartulo::OnEditField(wxCommandEvent &)
@@ -135,7 +137,7 @@ void Cartulo::OnEditField(wxCommandEvent &)
             ShowWarning(dialog.GetTitle(), "The value is too long: a field can be edited up to "
                                            "65,534 bytes.");
     }
-    m_rows[row].value->SetFocus();
+    FocusRow(row);
 }
 
 void Cartulo::OnRenameField(wxCommandEvent &)
@@ -155,7 +157,7 @@ void Cartulo::OnRenameField(wxCommandEvent &)
         LayOutEntry();
     }
     if (m_rows[row].value->IsEnabled())
-        m_rows[row].value->SetFocus();
+        FocusRow(row);
 }
 
 // --- Removing ---
@@ -213,7 +215,7 @@ void Cartulo::KeepFocus(int row)
     if (row < 0)
         return;
     if (row < m_grid.count && m_rows[row].value->IsEnabled())
-        m_rows[row].value->SetFocus();
+        FocusRow(row);
     else
         FocusForMode();
 }

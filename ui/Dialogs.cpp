@@ -4,6 +4,8 @@
 #include <wx/msgdlg.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
+#include <wx/textctrl.h>
+#include <wx/textentry.h>
 
 wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog)
 {
@@ -19,6 +21,26 @@ void Dialog_AddRow(wxFlexGridSizer *rows, wxWindow *dialog, const wxString &labe
     rows->Add(control, wxSizerFlags().Expand());
 }
 
+static bool IsLine(wxWindow *window)
+{
+    wxTextCtrl *text = dynamic_cast<wxTextCtrl *>(window);
+    return text ? !text->IsMultiLine() : dynamic_cast<wxTextEntry *>(window) != nullptr;
+}
+
+// GTK lets a button that Enter presses look pressed for a quarter of a second first. Who types on
+// meanwhile would type into the dialog, and with Esc give it up.
+static void OnCharHook(wxKeyEvent &event)
+{
+    wxWindow *window = static_cast<wxWindow *>(event.GetEventObject());
+    bool isEnter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
+    if (!isEnter || event.HasAnyModifiers() || !IsLine(window)) {
+        event.Skip();
+        return;
+    }
+    wxCommandEvent press(wxEVT_BUTTON, wxID_OK);
+    wxGetTopLevelParent(window)->ProcessWindowEvent(press);
+}
+
 void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus)
 {
     const int border = dialog->FromDIP(DIALOG_BORDER);
@@ -28,6 +50,7 @@ void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus)
                 wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
     dialog->SetSizerAndFit(column);
     dialog->CentreOnParent();
+    dialog->Bind(wxEVT_CHAR_HOOK, OnCharHook);
     focus->SetFocus();
 }
 

@@ -15,7 +15,8 @@ wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog);
 void Dialog_AddRow(wxFlexGridSizer *rows, wxWindow *dialog, const wxString &label,
                    wxWindow *control);
 
-// Puts OK and Cancel below the content, fits and centres the dialog. `focus` gets the focus.
+// Puts OK and Cancel below the content, fits and centres the dialog. `focus` gets the focus. Enter
+// in a field of one line is OK at once.
 void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus);
 
 void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text);

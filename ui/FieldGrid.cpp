@@ -413,9 +413,7 @@ static std::wstring RowLosses(const GridRow *row, bool textGuillemets)
         text += L"`" + key + L"': " + ListCharacters(lost) + L" can't be stored in " + page +
                 L" and would become " + Stored(lost[0]) + L".\n";
     if (textGuillemets && HoldsGuillemets(row->text))
-        text += L"`" + key +
-                L"': \xAB and \xBB can't be stored as text: they would mark an "
-                L"abbreviation.\n";
+        text += L"`" + key + L"': \xAB and \xBB will mark an abbreviation, not stand as text.\n";
     return text;
 }
 

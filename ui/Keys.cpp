@@ -17,7 +17,7 @@ std::string Key_Typed(const wchar_t *typed)
 
 std::string Key_Misfit(const wchar_t *typed)
 {
-    auto fits = [](wchar_t c) { return c <= 32 || Enc_Holds(c); };
+    auto fits = [](wchar_t c) { return c <= 32 || (Enc_Holds(c) && c != L'\xAB' && c != L'\xBB'); };
     if (std::all_of(typed, typed + wcslen(typed), fits))
         return "";
     return std::string("The key includes characters that can't be stored in ") +

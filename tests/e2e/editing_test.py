@@ -191,6 +191,15 @@ class ByKeyboard(EditorTest):
                          self.read("a.bib"))
         self.assertEqual([], editor.windows(RENAME_ENTRY))
 
+    def test_a_dialog_is_done_before_the_next_key(self):
+        self.write("a.bib", b"@misc{a, note = {A}}\n")
+        editor = self.start("a.bib").ready()
+        editor.begin("alt+n")
+        editor.type_into(RENAME_ENTRY, "b")
+        xdotool("key", "--delay", 0, "Return", "Escape")
+        editor.wait(lambda: not editor.windows(RENAME_ENTRY), "the dialog closes")
+        self.assertIn("Fix crossref's on the entry: a", editor.log())
+
 
 class Fields(EditorTest):
     def start_on(self, contents):

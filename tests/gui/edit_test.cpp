@@ -4,6 +4,7 @@
 
 #include <map>
 
+#include <wx/scrolwin.h>
 #include <wx/settings.h>
 
 #include "app/Companion.h"
@@ -142,6 +143,31 @@ TEST_F(Edit, NotesMissingFieldsInFull)
     }
 }
 
+TEST_F(Edit, ScrollsByTheWheelOverItsChoices)
+{
+    OpenText(
+        "@article{one, a = 1, b = 2, c = 3, d = 4, e = 5, f = 6, g = 7, h = 8, i = 9, j = 10}\n");
+    StartEditing();
+    ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
+    frame->SetSize(frame->FromDIP(wxSize(640, 512)));
+    ASSERT_TRUE(WaitFor([this] { return frame->GetSize().y == frame->FromDIP(512); }));
+    wxScrolledWindow *pane = dynamic_cast<wxScrolledWindow *>(EntryPane());
+    ASSERT_TRUE(pane);
+    int top = pane->GetViewStart().y;
+    wxWindow *choices[] = {Type(), NewKey()};
+    for (wxWindow *choice : choices) {
+        wxMouseEvent wheel(wxEVT_MOUSEWHEEL);
+        wheel.m_wheelDelta = 120;
+        wheel.m_linesPerAction = 3;
+        wheel.m_wheelRotation = -60;
+        choice->ProcessWindowEvent(wheel);
+        EXPECT_EQ(top + 1, pane->GetViewStart().y);
+        choice->ProcessWindowEvent(wheel); // the other half of a line counts, too
+        top = pane->GetViewStart().y;
+    }
+    EXPECT_EQ(6, top);
+}
+
 // Runs on a light and on a dark desktop.
 TEST_F(Edit, TellsFieldsApartByColours)
 {
@@ -271,6 +297,7 @@ TEST_F(Edit, RefusesEachValueThatCannotBeWritten)
     EXPECT_TRUE(Panel()->InEditMode());
     EXPECT_EQ("{open", Value("author")->GetValue());
     EXPECT_TRUE(WaitFor([this] { return Value("author")->HasFocus(); }));
+    EXPECT_FALSE(Value("author")->HasSelection());
     EXPECT_FALSE(SaveEnabled());
     Send(ID_EDIT_ENTRY);
 }
@@ -412,7 +439,6 @@ TEST_F(Edit, IsFinishedBeforeTheWindowCloses)
     EXPECT_NE(std::string::npos, folder.Read("a.bib").find("New Title"));
 }
 
-// As the end of the session does it.
 TEST_F(Edit, MayBeClosedByForceWhileItAsks)
 {
     OpenText(Article);

@@ -261,6 +261,8 @@ TEST_F(EditField, ShowsItsValueInALargeWindow)
               TakeLog("INFO: Cartulo_EditField"));
     EXPECT_EQ("Large", Value("title")->GetValue());
     EXPECT_TRUE(WaitFor([this] { return Value("title")->HasFocus(); }));
+    EXPECT_FALSE(Value("title")->HasSelection()); // the next letter does not take its place
+    EXPECT_EQ(5, Value("title")->GetInsertionPoint());
 }
 
 TEST_F(EditField, TakesAValueOfManyLines)
