@@ -7,10 +7,19 @@
 #include "store/BibStore.h"
 #include "ui/DisplayText.h"
 
+// No letter is wider than it is high, and measuring takes its time: most names go in as they are.
 void TypeChoice_Fill(wxChoice *choice, int width)
 {
-    for (int i = BIB_FIXED_TYPES + int(choice->GetCount()); i < BibTypeCount; ++i)
-        choice->Append(ShortText(choice, StoreText(BibTypeTable[i]), width));
+    int known = BIB_FIXED_TYPES + int(choice->GetCount());
+    if (known >= BibTypeCount)
+        return;
+    const size_t fits = size_t(choice->FromDIP(width) / choice->GetCharHeight());
+    wxArrayString names;
+    for (int i = known; i < BibTypeCount; ++i) {
+        wxString name = StoreText(BibTypeTable[i]);
+        names.Add(name.length() <= fits ? name : ShortText(choice, name, width));
+    }
+    choice->Append(names);
 }
 
 void TypeChoice_Select(wxChoice *choice, int type)
