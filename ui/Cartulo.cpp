@@ -187,10 +187,14 @@ void Cartulo::CreateRow(int index)
 // which is made before.
 void Cartulo::CreateRows(int count)
 {
+    if (m_rowCount >= count)
+        return;
     for (; m_rowCount < count; ++m_rowCount) {
         CreateRow(m_rowCount);
         m_rows[m_rowCount].remove->SetMinSize(m_rows[0].remove->GetBestSize());
     }
+    m_entryPane
+        ->OnInternalIdle(); // Tab knows the rows now, and not when there is nothing else to do
 }
 
 void Cartulo::CreateEntryPane()

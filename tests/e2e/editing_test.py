@@ -6,7 +6,7 @@ import subprocess
 
 import cases
 from cases import REFS, SOURCE, EditorTest
-from editor import COMMIT_BOX, is_locked, use_keyboard, xdotool
+from editor import COMMIT_BOX, OPEN_BOX, is_locked, use_keyboard, xdotool
 
 STYLE = os.path.join(SOURCE, "tests", "data", "entries.bst")
 NEW_ENTRY = "Creating New Bibliography Entry"
@@ -91,8 +91,15 @@ class ByKeyboard(EditorTest):
     def start_library(self):
         use_keyboard("gb")  # it has guillemets
         self.addCleanup(use_keyboard, "us")
-        self.write("library.bib", LIBRARY)
-        return self.start("library.bib").ready()
+        path = self.write("library.bib", LIBRARY)
+        editor = self.start().ready()
+        editor.begin("alt+o")
+        editor.activate(editor.wait_for_window(OPEN_BOX))
+        xdotool("type", path)
+        editor.answer(OPEN_BOX)
+        editor.wait_for_log(f"Loading: {path}")
+        editor.wait_until_active()
+        return editor
 
     def fill(self, editor, *values):
         """Types a value into each row from the next one on."""

@@ -15,6 +15,7 @@ DEADLINE = 30  # seconds
 FRAME = "Quarlo Cartulo"
 MESSAGES = "Bibliography File Loading Error Messages"
 LOCK_BOX = "Openning BIB file"
+OPEN_BOX = "Open BIB file"
 COMMIT_BOX = "Commit of Bibliography Entry - Question"
 
 # Keys that mean nothing to the editor, with their codes in its log. They take turns, so that one

@@ -6,9 +6,8 @@ import signal
 
 import cases
 from cases import ALL_ROWS, MORE, MORE_ROWS, REFS, EditorTest
-from editor import LOCK_BOX, MESSAGES, is_locked, minimise, windows_named
+from editor import LOCK_BOX, MESSAGES, OPEN_BOX, is_locked, minimise, windows_named
 
-OPEN_BOX = "Open BIB file"
 REFS_ROWS = ["alpha (refs)", "beta (refs)", "gamma (refs)"]
 
 
