@@ -297,7 +297,7 @@ TEST_F(Place, IsTheUsersOnceTheWindowIsOpen)
     ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
     frame->SetSize(wxRect(300, 200, 810, 610));
     ExpectAt({300, 200, 810, 610});
-    EXPECT_FALSE(WaitFor([&] { return frame->GetRect() == wxRect(50, 50, 800, 600); }, 200));
+    ASSERT_FALSE(WaitFor([&] { return frame->GetRect() != wxRect(300, 200, 810, 610); }, 200));
 }
 
 TEST_F(Place, IsLoggedAtTheEnd)
