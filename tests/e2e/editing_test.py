@@ -123,19 +123,13 @@ class ByKeyboard(EditorTest):
         editor.commit()
 
     def add_entry(self, editor):
-        editor.begin("alt+a")
-        editor.type_into(NEW_ENTRY, "kay77")
-        editor.answer(NEW_ENTRY)
-        editor.wait_until_active()
+        editor.run_dialog("alt+a", NEW_ENTRY, "kay77")
         editor.press("Escape")
         self.fill(editor, "Ann Kay and {\\'E}. Roe", "Even {Older} Maps", "«jgo»", "1977")
         editor.commit()
 
     def rename_entry(self, editor):
-        editor.begin("alt+n")
-        editor.type_into(RENAME_ENTRY, "kay1977")
-        editor.answer(RENAME_ENTRY)
-        editor.wait_until_active()
+        editor.run_dialog("alt+n", RENAME_ENTRY, "kay1977")
         self.assertEqual(["doe99 (library)", "kay1977 (library)"], editor.press("Home", "k"))
 
     def add_child(self, editor):
@@ -224,10 +218,7 @@ class Fields(EditorTest):
         editor.type_into(EDIT_FIELD, "New")
         editor.answer(EDIT_FIELD, "ctrl+Return")
         editor.wait_until_active()
-        editor.begin("alt+n")
-        editor.type_into(RENAME_FIELD, "booktitle")
-        editor.answer(RENAME_FIELD)
-        editor.wait_until_active()
+        editor.run_dialog("alt+n", RENAME_FIELD, "booktitle")
         editor.press("Tab", "alt+d")
         editor.commit()
         self.assert_becomes(b"@misc{a,\n\tbooktitle = {New},\n\tyear = 1999\n}\n", editor)

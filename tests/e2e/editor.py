@@ -222,6 +222,13 @@ class Editor:
         xdotool("key", "ctrl+a")
         xdotool("type", text)
 
+    def run_dialog(self, key, title, text):
+        """Opens a dialog with a key, types a text into it, and accepts it with Enter."""
+        self.begin(key)
+        self.type_into(title, text)
+        self.answer(title)
+        self.wait_until_active()
+
     def settle(self):
         """Returns when the main window has handled all keys and clicks so far."""
         key, code = next(MARKS)
