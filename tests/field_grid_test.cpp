@@ -131,7 +131,7 @@ TEST_F(Grid, ShowsOwnFieldsAndThenInheritedOnes)
                                         "(month=«jan»)"));
     EXPECT_EQ(FindEntry(file, "parent"), grid.parent);
     EXPECT_EQ(FindEntry(file, "child"), grid.entry);
-    EXPECT_EQ(0, grid.hidden);
+    EXPECT_THAT(Grid_HiddenFields(&grid), IsEmpty());
     EXPECT_TRUE(grid.rows[0].crossref);
     EXPECT_FALSE(grid.rows[1].crossref);
 }
@@ -186,17 +186,17 @@ TEST_F(Grid, StopsAtSixteenRowsWithInheritedFields)
     ASSERT_EQ(GRID_ROWS, grid.count);
     EXPECT_EQ("c", grid.rows[15].key);
     EXPECT_TRUE(grid.rows[15].inherited);
-    EXPECT_EQ(0, grid.hidden);
+    EXPECT_EQ("1 more inherited field is not shown.", Grid_HiddenText(&grid));
 }
 
 TEST_F(Grid, CountsFieldsThatFindNoRow)
 {
     Show("@misc{k, " + Fields(16) + "}", "k");
     EXPECT_EQ(GRID_ROWS, grid.count);
-    EXPECT_EQ(0, grid.hidden);
+    EXPECT_THAT(Grid_HiddenFields(&grid), IsEmpty());
     Show("@misc{k, " + Fields(19) + "}", "k");
     EXPECT_EQ(GRID_ROWS, grid.count);
-    EXPECT_EQ(3, grid.hidden);
+    EXPECT_EQ(3u, Grid_HiddenFields(&grid).size());
 }
 
 TEST_F(Grid, ForgetsTheEntryWhenItIsCleared)

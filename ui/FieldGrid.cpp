@@ -31,6 +31,11 @@ static int CountShown(const BibEntry *entry) // fields that get a row
     return std::min<int>(entry->fieldCount, GRID_ROWS);
 }
 
+static int CountHidden(const BibEntry *entry) // the others
+{
+    return entry->fieldCount - CountShown(entry);
+}
+
 // --- Showing ---
 
 const BibEntry *Grid_FindParent(const BibEntry *entry)
@@ -81,7 +86,6 @@ void Grid_Fill(FieldGrid *grid, const BibEntry *entry)
     grid->entry = entry;
     grid->parent = Grid_FindParent(entry);
     grid->count = CountShown(entry);
-    grid->hidden = entry->fieldCount - grid->count;
     for (int i = 0; i < grid->count; ++i)
         FillOwnRow(&grid->rows[i], entry, i);
     if (grid->parent)
@@ -98,10 +102,13 @@ int Grid_StoredRows(const FieldGrid *grid)
     return grid->entry ? CountShown(grid->entry) : 0;
 }
 
-static bool HasRow(const FieldGrid *grid, const char *key)
+// The last one; -1 for none.
+static int FindRow(const FieldGrid *grid, const char *key)
 {
-    return std::any_of(grid->rows, grid->rows + grid->count,
-                       [key](const GridRow &row) { return SameName(row.key.c_str(), key); });
+    int row = grid->count - 1;
+    while (row >= 0 && !SameName(grid->rows[row].key.c_str(), key))
+        --row;
+    return row;
 }
 
 std::vector<HiddenField> Grid_HiddenFields(const FieldGrid *grid)
@@ -111,7 +118,7 @@ std::vector<HiddenField> Grid_HiddenFields(const FieldGrid *grid)
         fields.push_back({NameOf(&grid->entry->fields[i]), false});
     for (int i = 0; grid->parent && i < grid->parent->fieldCount; ++i) {
         const char *key = NameOf(&grid->parent->fields[i]);
-        if (!HasRow(grid, key) && !FindField(grid->entry, key))
+        if (FindRow(grid, key) < 0 && !FindField(grid->entry, key))
             fields.push_back({key, true});
     }
     return fields;
@@ -152,19 +159,11 @@ static bool HasOwnRow(const FieldGrid *grid, const char *key)
     });
 }
 
-static int FindLastRow(const FieldGrid *grid, const char *key)
-{
-    int row = grid->count - 1;
-    while (row >= 0 && !SameName(grid->rows[row].key.c_str(), key))
-        --row;
-    return row;
-}
-
 GridAdd Grid_Add(FieldGrid *grid, const char *key, int *row)
 {
     if (HasOwnRow(grid, key) || IsHidden(grid, key))
         return GRID_EXISTS;
-    int found = FindLastRow(grid, key);
+    int found = FindRow(grid, key);
     if (found >= 0) {
         grid->rows[found].inherited = false;
         *row = found;
@@ -184,7 +183,7 @@ GridRemove Grid_Remove(FieldGrid *grid, int row)
     std::string key = grid->rows[row].key;
     const BibField *inherited = grid->parent ? FindField(grid->parent, key.c_str()) : nullptr;
     grid->rows[row].key.clear();
-    if (inherited && !HasRow(grid, key.c_str())) {
+    if (inherited && FindRow(grid, key.c_str()) < 0) {
         FillInheritedRow(&grid->rows[row], inherited);
         return GRID_INHERITED;
     }
@@ -494,7 +493,7 @@ static int BuildFields(BibField *field, const FieldGrid *grid)
 
 BibEntry *Grid_Build(const FieldGrid *grid, int type)
 {
-    BibEntry *entry = Bib_AllocEntry(CountOwnRows(grid) + grid->hidden);
+    BibEntry *entry = Bib_AllocEntry(CountOwnRows(grid) + CountHidden(grid->entry));
     if (!entry)
         return nullptr;
     entry->type = type;

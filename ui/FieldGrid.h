@@ -33,7 +33,6 @@ struct FieldGrid {
     int count;              // rows that are shown
     const BibEntry *entry;  // whose fields these are; belongs to its file; null for none
     const BibEntry *parent; // the entry that it inherits from; of the same file; null for none
-    int hidden;             // own fields that found no row; a commit carries them over
 };
 
 // --- Showing ---
@@ -50,7 +49,7 @@ void Grid_Clear(FieldGrid *grid);
 // How many of the entry's stored fields have a row when it is filled.
 int Grid_StoredRows(const FieldGrid *grid);
 
-// A field that found no row.
+// A field that found no row. A commit carries the entry's own over.
 struct HiddenField {
     std::string key;
     bool inherited;
@@ -65,8 +64,7 @@ std::string Grid_HiddenText(const FieldGrid *grid);
 enum GridAdd { GRID_ADDED, GRID_OVERRIDDEN, GRID_FULL, GRID_EXISTS };
 
 // Gives `key` a row: a new one at the end, or the inherited one, which becomes the entry's own.
-// Sets
-// `*row`, except for GRID_FULL and GRID_EXISTS. A hidden field exists.
+// That is `*row`, which stays as it is for GRID_FULL and GRID_EXISTS. A hidden field exists.
 GridAdd Grid_Add(FieldGrid *grid, const char *key, int *row);
 
 enum GridRemove { GRID_REMOVED, GRID_INHERITED, GRID_NO_ROW };
