@@ -151,7 +151,7 @@ TEST_F(EntryKeys, AreCheckedForNewEntries)
                       {"griske84", books, KEY_TAKEN_ELSEWHERE},
                       {"ost77", talks, KEY_TAKEN_ELSEWHERE}};
     for (const auto &row : rows)
-        EXPECT_EQ(row.verdict, Entry_CheckNewKey(&set, row.target, row.key)) << row.key;
+        EXPECT_EQ(row.verdict, Entry_CheckNewKey(&set, row.target, {row.key, true})) << row.key;
 }
 
 TEST_F(EntryKeys, AreRefusedForEveryCharacterOfTheBlacklist)
@@ -159,9 +159,9 @@ TEST_F(EntryKeys, AreRefusedForEveryCharacterOfTheBlacklist)
     BibFile *file = Open("a.bib", "");
     for (char c : std::string("\"#%'(),={} ")) {
         std::string key = std::string("a") + c + "b";
-        EXPECT_EQ(KEY_BAD_CHARS, Entry_CheckNewKey(&set, file, key.c_str())) << key;
+        EXPECT_EQ(KEY_BAD_CHARS, Entry_CheckNewKey(&set, file, {key.c_str(), true})) << key;
         Bib_StripKeyChars(key.data());
-        EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, file, key.c_str())) << key;
+        EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, file, {key.c_str(), true})) << key;
     }
 }
 
@@ -169,8 +169,8 @@ TEST_F(EntryKeys, OfAFileThatIsListedTwiceAreNotTakenElsewhere)
 {
     BibFile *file = Open("a.bib", Talks);
     FileSet_Append(&set, file);
-    EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, file, "new1"));
-    EXPECT_EQ(KEY_TAKEN, Entry_CheckNewKey(&set, file, "Griske84"));
+    EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, file, {"new1", true}));
+    EXPECT_EQ(KEY_TAKEN, Entry_CheckNewKey(&set, file, {"Griske84", true}));
 }
 
 TEST_F(EntryKeys, AreCheckedForRenamedEntries)
@@ -186,7 +186,17 @@ TEST_F(EntryKeys, AreCheckedForRenamedEntries)
                       {"Griske84", KEY_SAME}, {"griske84", KEY_TAKEN},
                       {"OTHER", KEY_TAKEN},   {"ost77", KEY_TAKEN_ELSEWHERE}};
     for (const auto &row : rows)
-        EXPECT_EQ(row.verdict, Entry_CheckRename(&set, talks, entry, row.key)) << row.key;
+        EXPECT_EQ(row.verdict, Entry_CheckRename(&set, talks, entry, {row.key, true})) << row.key;
+}
+
+TEST_F(EntryKeys, AreRefusedForCharactersThatTheCodePageLacks)
+{
+    BibFile *file = Open("a.bib", "@misc{\xFF, note = {N}}\n");
+    EXPECT_EQ(KEY_EMPTY, Entry_CheckNewKey(&set, file, {"", false}));
+    for (const char *key : {"\xFF", "\xFF{", "\\", "b"}) {
+        EXPECT_EQ(KEY_MISFIT, Entry_CheckNewKey(&set, file, {key, false}));
+        EXPECT_EQ(KEY_MISFIT, Entry_CheckRename(&set, file, file->entries, {key, false}));
+    }
 }
 
 // --- New entries ---

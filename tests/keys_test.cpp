@@ -3,40 +3,41 @@
 #include "encoding/Encoding.h"
 #include "ui/Keys.h"
 
-TEST(KeyTyped, LosesBlanksAndControlCharacters)
+TEST(KeyRead, LosesBlanksAndControlCharacters)
 {
-    EXPECT_EQ("mykey", Key_Typed(L" my key\t\n\x01"));
-    EXPECT_EQ("", Key_Typed(L" \t "));
-    EXPECT_EQ("", Key_Typed(L""));
-    EXPECT_EQ("a{b}", Key_Typed(L"a{b}"));
-    EXPECT_EQ("mark", Key_Typed(L"\u00ABmark\u00BB")); // marks of abbreviations
+    EXPECT_EQ("mykey", Key_Read(L" my key\t\n\x01").text);
+    EXPECT_EQ("", Key_Read(L" \t ").text);
+    EXPECT_EQ("", Key_Read(L"").text);
+    EXPECT_EQ("a{b}", Key_Read(L"a{b}").text);
+    EXPECT_EQ("mark", Key_Read(L"\u00ABmark\u00BB").text); // marks of abbreviations
 }
 
-TEST(KeyTyped, IsTextOfTheCodePage)
+TEST(KeyRead, IsTextOfTheCodePage)
 {
-    EXPECT_EQ("M\xFCller", Key_Typed(L"M\u00FCller"));
+    EXPECT_EQ("M\xFCller", Key_Read(L"M\u00FCller").text);
     Enc_Select("CP1251");
-    EXPECT_EQ("\xE4", Key_Typed(L"\u0434"));
+    EXPECT_EQ("\xE4", Key_Read(L"\u0434").text);
 }
 
-TEST(KeyMisfit, TellsOfCharactersThatTheCodePageLacks)
+TEST(KeyRead, TellsWhatTheCodePageLacks)
 {
-    EXPECT_EQ("", Key_Misfit(L"M\u00FCller \u00FF"));
-    const char *text = "The key includes characters that can't be stored in CP1252.";
-    EXPECT_EQ(text, Key_Misfit(L"\u0141ukasz"));
-    EXPECT_EQ(text, Key_Misfit(L"a\U0001F600"));
+    EXPECT_TRUE(Key_Read(L"M\u00FCller \u00FF").fits);
+    EXPECT_FALSE(Key_Read(L"\u0141ukasz").fits);
+    EXPECT_FALSE(Key_Read(L"a\U0001F600").fits);
+    EXPECT_EQ("The key includes characters that can't be stored in CP1252.", Key_MisfitText());
     Enc_Select("CP1250");
-    EXPECT_EQ("", Key_Misfit(L"\u0141ukasz"));
-    EXPECT_NE("", Key_Misfit(L"\u00FF"));
+    EXPECT_TRUE(Key_Read(L"\u0141ukasz").fits);
+    EXPECT_FALSE(Key_Read(L"\u00FF").fits);
+    EXPECT_EQ("The key includes characters that can't be stored in CP1250.", Key_MisfitText());
 }
 
-TEST(KeyMisfit, TellsOfGuillemets)
+TEST(KeyRead, TellsOfGuillemets)
 {
-    EXPECT_NE("", Key_Misfit(L"my\u00AB1"));
-    EXPECT_NE("", Key_Misfit(L"\u00BB"));
+    EXPECT_FALSE(Key_Read(L"my\u00AB1").fits);
+    EXPECT_FALSE(Key_Read(L"\u00BB").fits);
 }
 
-TEST(KeyMisfit, PassesOverWhatIsDroppedAnyway)
+TEST(KeyRead, PassesOverWhatIsDroppedAnyway)
 {
-    EXPECT_EQ("", Key_Misfit(L"a\t\x02 b"));
+    EXPECT_TRUE(Key_Read(L"a\t\x02 b").fits);
 }

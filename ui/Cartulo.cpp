@@ -193,8 +193,8 @@ void Cartulo::CreateRows(int count)
         CreateRow(m_rowCount);
         m_rows[m_rowCount].remove->SetMinSize(m_rows[0].remove->GetBestSize());
     }
-    m_entryPane
-        ->OnInternalIdle(); // Tab knows the rows now, and not when there is nothing else to do
+    // Tab has to know the rows at once, not when there is nothing else to do.
+    m_entryPane->OnInternalIdle();
 }
 
 void Cartulo::CreateEntryPane()

@@ -126,7 +126,7 @@ private:
     bool ReplaceEntry(int type);
     void AddField(const std::string &key);
     bool TakeValue(int row, const wxString &text);
-    bool IsStoredRow(int row);
+    int RowForCommand(const char *logPrefix);
     void RemoveRow(int row);
     void SelectInList(BibEntry *entry);
     void ShowChanged(BibEntry *entry, int file);

@@ -49,22 +49,26 @@ void Cartulo::OnNewField(wxCommandEvent &)
     TNSMessage("INFO: Cartulo::OnNewField", "", TNS_ACTION);
     if (!m_editMode || !m_entry)
         return;
-    std::wstring typed = m_newFieldKey->GetValue().ToStdWstring();
-    std::string misfit = Key_Misfit(typed.c_str()), key = Key_Typed(typed.c_str());
-    FieldKeyVerdict verdict = FieldKey_CheckNew(key.c_str());
-    if (misfit.empty() && verdict == FIELD_KEY_OK) {
-        AddField(key);
-        return;
-    }
-    if (!misfit.empty())
-        ShowWarning(AddTitle, StoreText(misfit.c_str()));
-    else if (verdict == FIELD_KEY_EMPTY)
+    TypedKey key = Key_Read(m_newFieldKey->GetValue().ToStdWstring().c_str());
+    switch (FieldKey_CheckNew(key)) {
+    case FIELD_KEY_EMPTY:
         ShowWarning(AddTitle, "Field key is undefined.\nPlease enter key name or choose some "
                               "standard value in list of combo box.");
-    else if (verdict == FIELD_KEY_BAD_CHARS) // only the window for another name removes them
+        break;
+    case FIELD_KEY_BAD_CHARS: // only the window for another name removes them
         Box_WarnOrCancel(wxGetTopLevelParent(this), AddTitle, FieldKey_BadCharsText);
-    else
+        break;
+    case FIELD_KEY_MISFIT:
+        ShowWarning(AddTitle, StoreText(Key_MisfitText().c_str()));
+        break;
+    case FIELD_KEY_UNWRITABLE:
         ShowWarning(AddTitle, FieldKey_UnwritableText);
+        break;
+    case FIELD_KEY_OK:
+    case FIELD_KEY_TAKEN: // told when it is added
+        AddField(key.text);
+        return;
+    }
     m_newFieldKey->SetFocus();
 }
 
@@ -93,15 +97,17 @@ void Cartulo::AddField(const std::string &key)
 
 // --- Changing ---
 
-// The commands are for stored fields. False, with a word on it, when there is no such row.
-bool Cartulo::IsStoredRow(int row)
+// The row of a stored field, which a command is for: that with the cursor. -1, with a word on it,
+// when there is none.
+int Cartulo::RowForCommand(const char *logPrefix)
 {
-    if (!m_editMode)
-        return false;
-    if (row < 0)
+    int row = m_editMode ? FocusedRow() : -1;
+    if (row >= 0)
+        LogRow(logPrefix, row, m_grid.rows[row].key);
+    else if (m_editMode)
         ShowStatus(this,
                    "Put the cursor into a field first, one that was there before the editing.");
-    return row >= 0;
+    return row;
 }
 
 // False when the row can't hold the text: it keeps what it has.
@@ -121,14 +127,13 @@ bool Cartulo::TakeValue(int row, const wxString &text)
 
 void Cartulo::OnEditField(wxCommandEvent &)
 {
-    int row = FocusedRow();
-    if (!IsStoredRow(row))
+    int row = RowForCommand("INFO: Editing Field: ");
+    if (row < 0)
         return;
-    const std::string &key = m_grid.rows[row].key;
-    LogRow("INFO: Editing Field: ", row, key);
+    wxString key = StoreText(m_grid.rows[row].key.c_str());
     wxString text = m_rows[row].value->GetValue();
     for (bool taken = false; !taken;) {
-        Cartulo_EditField dialog(wxGetTopLevelParent(this), StoreText(key.c_str()), text);
+        Cartulo_EditField dialog(wxGetTopLevelParent(this), key, text);
         if (dialog.ShowModal() != wxID_OK)
             break;
         text = dialog.Value();
@@ -142,14 +147,13 @@ void Cartulo::OnEditField(wxCommandEvent &)
 
 void Cartulo::OnRenameField(wxCommandEvent &)
 {
-    int row = FocusedRow();
-    if (!IsStoredRow(row))
+    int row = RowForCommand("INFO: Renaming Field: ");
+    if (row < 0)
         return;
-    const std::string &key = m_grid.rows[row].key;
-    LogRow("INFO: Renaming Field: ", row, key);
+    wxString key = StoreText(m_grid.rows[row].key.c_str());
     ReadRows();
-    Cartulo_RenameField dialog(wxGetTopLevelParent(this), &m_grid, StoreText(key.c_str()),
-                               m_newFieldKey->GetStrings(), m_newFieldKey->GetValue());
+    Cartulo_RenameField dialog(wxGetTopLevelParent(this), &m_grid, key, m_newFieldKey->GetStrings(),
+                               m_newFieldKey->GetValue());
     if (dialog.ShowModal() == wxID_OK && !dialog.NewName().empty()) {
         Grid_Rename(&m_grid, row, dialog.NewName().c_str());
         WriteRows();

@@ -29,16 +29,17 @@ static bool IsLine(wxWindow *window)
 
 // GTK lets a button that Enter presses look pressed for a quarter of a second first. Who types on
 // meanwhile would type into the dialog, and with Esc give it up.
-static void OnCharHook(wxKeyEvent &event)
+static void AcceptByEnter(wxDialog *dialog, wxKeyEvent &event)
 {
     wxWindow *window = static_cast<wxWindow *>(event.GetEventObject());
     bool isEnter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
-    if (!isEnter || event.HasAnyModifiers() || !IsLine(window)) {
+    bool accepts = event.ControlDown() || (!event.HasAnyModifiers() && IsLine(window));
+    if (!isEnter || !accepts) {
         event.Skip();
         return;
     }
     wxCommandEvent press(wxEVT_BUTTON, wxID_OK);
-    wxGetTopLevelParent(window)->ProcessWindowEvent(press);
+    dialog->ProcessWindowEvent(press);
 }
 
 void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus)
@@ -50,7 +51,7 @@ void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus)
                 wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
     dialog->SetSizerAndFit(column);
     dialog->CentreOnParent();
-    dialog->Bind(wxEVT_CHAR_HOOK, OnCharHook);
+    dialog->Bind(wxEVT_CHAR_HOOK, [dialog](wxKeyEvent &event) { AcceptByEnter(dialog, event); });
     focus->SetFocus();
 }
 

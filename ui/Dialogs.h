@@ -16,7 +16,7 @@ void Dialog_AddRow(wxFlexGridSizer *rows, wxWindow *dialog, const wxString &labe
                    wxWindow *control);
 
 // Puts OK and Cancel below the content, fits and centres the dialog. `focus` gets the focus. Enter
-// in a field of one line is OK at once.
+// in a field of one line is OK at once, and Ctrl+Enter everywhere.
 void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus);
 
 void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text);

@@ -53,9 +53,9 @@ int EntryDialog::CurrentChoice() const
     return wxNOT_FOUND;
 }
 
-std::string EntryDialog::Key() const
+TypedKey EntryDialog::Key() const
 {
-    return Key_Typed(m_key->GetValue().ToStdWstring().c_str());
+    return Key_Read(m_key->GetValue().ToStdWstring().c_str());
 }
 
 void EntryDialog::Refuse(const wxString &text)
@@ -84,11 +84,6 @@ bool EntryDialog::AcceptDuplicate()
 
 bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)
 {
-    std::string misfit = Key_Misfit(m_key->GetValue().ToStdWstring().c_str());
-    if (!misfit.empty()) {
-        Refuse(StoreText(misfit.c_str()));
-        return false;
-    }
     switch (verdict) {
     case KEY_OK:
     case KEY_SAME:
@@ -98,6 +93,9 @@ bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)
         return false;
     case KEY_BAD_CHARS:
         ReplaceBadChars(key);
+        return false;
+    case KEY_MISFIT:
+        Refuse(StoreText(Key_MisfitText().c_str()));
         return false;
     case KEY_UNWRITABLE:
         Refuse("An entry with this key can't be written to a BIB file.");
@@ -171,11 +169,11 @@ int Cartulo_NewEntry::TargetFile() const
 
 void Cartulo_NewEntry::OnOK(wxCommandEvent &event)
 {
-    std::string key = Key();
+    TypedKey key = Key();
     int file = TargetFile();
     const BibFile *target = file >= 0 ? m_current.set->files[file] : nullptr;
-    KeyVerdict verdict = Entry_CheckNewKey(m_current.set, target, key.c_str());
-    if (Accept(verdict, key) && Create(file, key))
+    KeyVerdict verdict = Entry_CheckNewKey(m_current.set, target, key);
+    if (Accept(verdict, key.text) && Create(file, key.text))
         event.Skip(); // closes
 }
 
@@ -237,11 +235,11 @@ void Cartulo_RenameEntry::OnOK(wxCommandEvent &event)
         event.Skip();
         return;
     }
-    std::string key = Key();
+    TypedKey key = Key();
     BibFile *file = m_current.set->files[m_current.file];
-    KeyVerdict verdict = Entry_CheckRename(m_current.set, file, m_current.entry, key.c_str());
-    if (Accept(verdict, key)) {
-        Entry_Rename(file, m_current.entry, key.c_str());
+    KeyVerdict verdict = Entry_CheckRename(m_current.set, file, m_current.entry, key);
+    if (Accept(verdict, key.text)) {
+        Entry_Rename(file, m_current.entry, key.text.c_str());
         SetChanged(m_current.entry, m_current.file);
     } else if (verdict != KEY_EMPTY) {
         return; // stays open

@@ -42,7 +42,7 @@ protected:
     EntryDialog(wxWindow *parent, const EntryPlace &current, const Texts &texts);
 
     int CurrentChoice() const;
-    std::string Key() const; // as it was typed, as store text
+    TypedKey Key() const;
 
     // False when it can't be the key; the user knows why then, or has one without bad characters.
     bool Accept(KeyVerdict verdict, const std::string &key);

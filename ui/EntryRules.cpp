@@ -65,13 +65,15 @@ static int HasKey(const BibFile *file, const char *key)
     return 0;
 }
 
-static KeyVerdict CheckForm(const char *key)
+static KeyVerdict CheckForm(const TypedKey &key)
 {
-    if (!*key)
+    if (key.text.empty())
         return KEY_EMPTY;
-    if (Bib_HasBadKeyChars(key))
+    if (!key.fits)
+        return KEY_MISFIT;
+    if (Bib_HasBadKeyChars(key.text.c_str()))
         return KEY_BAD_CHARS;
-    return Bib_IsKey(key) ? KEY_OK : KEY_UNWRITABLE;
+    return Bib_IsKey(key.text.c_str()) ? KEY_OK : KEY_UNWRITABLE;
 }
 
 static KeyVerdict CheckFree(const BibFileSet *set, const BibFile *file, const char *key)
@@ -84,23 +86,24 @@ static KeyVerdict CheckFree(const BibFileSet *set, const BibFile *file, const ch
     return KEY_OK;
 }
 
-KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const char *key)
+KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const TypedKey &key)
 {
     KeyVerdict form = CheckForm(key);
     if (form != KEY_OK)
         return form;
-    return target ? CheckFree(set, target, key) : KEY_NO_FILE;
+    return target ? CheckFree(set, target, key.text.c_str()) : KEY_NO_FILE;
 }
 
+// An old key that could not be written may stay: that changes nothing.
 KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const BibEntry *entry,
-                             const char *key)
+                             const TypedKey &key)
 {
     KeyVerdict form = CheckForm(key);
-    if (form == KEY_EMPTY || form == KEY_BAD_CHARS)
+    if (form != KEY_OK && form != KEY_UNWRITABLE)
         return form;
-    if (strcmp(entry->key, key) == 0)
+    if (key.text == entry->key)
         return KEY_SAME;
-    return form == KEY_OK ? CheckFree(set, file, key) : form;
+    return form == KEY_OK ? CheckFree(set, file, key.text.c_str()) : form;
 }
 
 // --- New entries ---

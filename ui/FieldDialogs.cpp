@@ -30,7 +30,6 @@ static long WrapStyle(const wxString &value)
 
 wxBEGIN_EVENT_TABLE(Cartulo_EditField, wxDialog)
     EVT_BUTTON(wxID_OK, Cartulo_EditField::OnOK)
-    EVT_CHAR_HOOK(Cartulo_EditField::OnCharHook)
 wxEND_EVENT_TABLE()
 
 Cartulo_EditField::Cartulo_EditField(wxWindow *parent, const wxString &key, const wxString &value)
@@ -67,17 +66,6 @@ void Cartulo_EditField::OnOK(wxCommandEvent &event)
     event.Skip(); // closes
 }
 
-void Cartulo_EditField::OnCharHook(wxKeyEvent &event)
-{
-    int key = event.GetKeyCode();
-    if (!event.ControlDown() || (key != WXK_RETURN && key != WXK_NUMPAD_ENTER)) {
-        event.Skip();
-        return;
-    }
-    wxCommandEvent press(wxEVT_BUTTON, wxID_OK);
-    ProcessWindowEvent(press);
-}
-
 // --- The name ---
 
 wxBEGIN_EVENT_TABLE(Cartulo_RenameField, wxDialog)
@@ -94,7 +82,6 @@ Cartulo_RenameField::Cartulo_RenameField(wxWindow *parent, const FieldGrid *grid
     oldName->Disable();
     m_name = new wxComboBox(this, ID_FIELD_NEW_NAME, proposal, wxDefaultPosition, wxDefaultSize,
                             proposals);
-    m_name->SetValue(proposal);
     wxFlexGridSizer *rows = Dialog_CreateRows(this);
     Dialog_AddRow(rows, this, "Old Field Name:", oldName);
     Dialog_AddRow(rows, this, "New Field Name:", m_name);
@@ -102,18 +89,21 @@ Cartulo_RenameField::Cartulo_RenameField(wxWindow *parent, const FieldGrid *grid
 }
 
 // False when the user has to see to the name first. An empty one is accepted: nothing changes.
-bool Cartulo_RenameField::Accept(const std::string &name)
+bool Cartulo_RenameField::Accept(const TypedKey &name)
 {
-    switch (FieldKey_CheckNewName(m_grid, name.c_str())) {
+    switch (FieldKey_CheckNewName(m_grid, name)) {
     case FIELD_KEY_OK:
     case FIELD_KEY_EMPTY:
         return true;
     case FIELD_KEY_BAD_CHARS:
         if (Box_WarnOrCancel(this, GetTitle(), FieldKey_BadCharsText)) {
-            std::string stripped = name;
+            std::string stripped = name.text;
             Bib_StripKeyChars(stripped.data());
             m_name->SetValue(StoreText(stripped.c_str()));
         }
+        return false;
+    case FIELD_KEY_MISFIT:
+        Box_Warn(this, GetTitle(), StoreText(Key_MisfitText().c_str()));
         return false;
     case FIELD_KEY_UNWRITABLE:
         Box_Warn(this, GetTitle(), FieldKey_UnwritableText);
@@ -126,14 +116,9 @@ bool Cartulo_RenameField::Accept(const std::string &name)
 
 void Cartulo_RenameField::OnOK(wxCommandEvent &event)
 {
-    std::wstring typed = m_name->GetValue().ToStdWstring();
-    std::string misfit = Key_Misfit(typed.c_str()), name = Key_Typed(typed.c_str());
-    if (!misfit.empty()) {
-        Box_Warn(this, GetTitle(), StoreText(misfit.c_str()));
-        return;
-    }
+    TypedKey name = Key_Read(m_name->GetValue().ToStdWstring().c_str());
     if (!Accept(name))
         return;
-    m_newName = name;
+    m_newName = name.text;
     event.Skip(); // closes
 }

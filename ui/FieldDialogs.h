@@ -9,6 +9,7 @@
 class wxComboBox;
 class wxTextCtrl;
 struct FieldGrid;
+struct TypedKey;
 
 enum { ID_FIELD_KEY = 6001, ID_FIELD_VALUE = 6002, ID_FIELD_NEW_NAME = 6002 };
 
@@ -21,7 +22,6 @@ public:
 
 private:
     void OnOK(wxCommandEvent &event);
-    void OnCharHook(wxKeyEvent &event); // Ctrl+Enter is OK: Enter belongs to the text
 
     wxTextCtrl *m_value; // child window
 
@@ -39,7 +39,7 @@ public:
 
 private:
     void OnOK(wxCommandEvent &event);
-    bool Accept(const std::string &name);
+    bool Accept(const TypedKey &name);
 
     const FieldGrid *m_grid;
     wxComboBox *m_name; // child window

@@ -6,20 +6,23 @@
 
 #include "encoding/Encoding.h"
 
-std::string Key_Typed(const wchar_t *typed)
+static bool Fits(wchar_t c)
 {
-    std::vector<char> narrow(wcslen(typed) + 1);
-    std::string key = Enc_FromUnicode(narrow.data(), typed);
-    key.erase(std::remove_if(key.begin(), key.end(), [](unsigned char c) { return c <= 32; }),
-              key.end());
-    return key;
+    bool isMark = c == L'\xAB' || c == L'\xBB';
+    return c <= 32 || (Enc_Holds(c) && !isMark);
 }
 
-std::string Key_Misfit(const wchar_t *typed)
+TypedKey Key_Read(const wchar_t *typed)
 {
-    auto fits = [](wchar_t c) { return c <= 32 || (Enc_Holds(c) && c != L'\xAB' && c != L'\xBB'); };
-    if (std::all_of(typed, typed + wcslen(typed), fits))
-        return "";
+    std::vector<char> narrow(wcslen(typed) + 1);
+    std::string text = Enc_FromUnicode(narrow.data(), typed);
+    text.erase(std::remove_if(text.begin(), text.end(), [](unsigned char c) { return c <= 32; }),
+               text.end());
+    return {text, std::all_of(typed, typed + wcslen(typed), Fits)};
+}
+
+std::string Key_MisfitText()
+{
     return std::string("The key includes characters that can't be stored in ") +
            Enc_Current()->name + ".";
 }

@@ -3,11 +3,11 @@
 
 #include <string>
 
-// As store text, without characters of code 32 and below.
-std::string Key_Typed(const wchar_t *typed);
+struct TypedKey {
+    std::string text; // store text, without characters of code 32 and below
+    bool fits;        // false: `text` lacks guillemets, which mark abbreviations, or has other
+                      // characters for those that the code page lacks
+};
+TypedKey Key_Read(const wchar_t *typed);
 
-// What to say of characters that a key can't have in the code page (store text): Key_Typed would
-// drop guillemets, which mark abbreviations, and have other characters for those that the page
-// lacks.
-// "" when there are none.
-std::string Key_Misfit(const wchar_t *typed);
+std::string Key_MisfitText(); // what to say of a key that does not fit; store text
