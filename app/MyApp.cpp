@@ -198,8 +198,8 @@ void MyApp::OnActivateApp(wxActivateEvent &event)
     bool autoSave = !m_frame || m_frame->AutoSave();
     TNSMessage(autoSave ? "INFO: Cartulo is now+ " : "INFO: Cartulo is now- ",
                event.GetActive() ? "Activated" : "Disactivated", TNS_LIFECYCLE);
-    if (!event.GetActive() && m_frame)
-        m_frame->OnDeactivation();
+    if (m_frame)
+        m_frame->OnActivation(event.GetActive());
     event.Skip();
 }
 

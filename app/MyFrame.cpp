@@ -26,7 +26,7 @@
 
 enum { SMALLEST_WINDOW = 512, DEFAULT_PLACE = 50, TOOL_MARGIN = 4, SEARCH_WIDTH = 160 };
 enum { SMALLEST_SEARCH = 80 };
-enum { PLACING_TIME = 500 }; // milliseconds that a window manager may take
+enum { PLACING_TIME = 500, LEAVING_TIME = 250 }; // milliseconds that a window manager may take
 
 // The first row that matches handles the event.
 wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
@@ -44,6 +44,7 @@ wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
     EVT_CHAR_HOOK(MyFrame::OnCharHook)
     EVT_MOVE(MyFrame::OnMove)
     EVT_SIZE(MyFrame::OnSize)
+    EVT_TIMER(wxID_ANY, MyFrame::OnLeft)
     EVT_CLOSE(MyFrame::OnClose)
 wxEND_EVENT_TABLE()
 
@@ -77,7 +78,7 @@ private:
 // --- Construction ---
 
 MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *state)
-    : wxFrame(nullptr, wxID_ANY, title), m_state(state), m_dialogs(new DialogCount)
+    : wxFrame(nullptr, wxID_ANY, title), m_state(state), m_dialogs(new DialogCount), m_leaving(this)
 {
     Place();
     SetFont(wxFontInfo(10));
@@ -392,6 +393,19 @@ void MyFrame::OnCharHook(wxKeyEvent &event)
 }
 
 // --- Leaving and closing ---
+
+void MyFrame::OnActivation(bool active)
+{
+    if (active)
+        m_leaving.Stop();
+    else
+        m_leaving.StartOnce(LEAVING_TIME);
+}
+
+void MyFrame::OnLeft(wxTimerEvent &)
+{
+    OnDeactivation();
+}
 
 void MyFrame::OnDeactivation()
 {

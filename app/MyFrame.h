@@ -5,6 +5,7 @@
 #include <memory>
 
 #include <wx/frame.h>
+#include <wx/timer.h>
 
 #include "app/CommandLine.h"
 #include "app/FrameRules.h"
@@ -31,7 +32,10 @@ public:
     void SetAutoSave(bool on) { m_autoSave = on; }
     bool AutoSave() const { return m_autoSave; }
 
-    void OnDeactivation(); // the program lost the focus to another
+    // The program got the focus or lost it. A loss counts when it lasts: while one window of ours
+    // closes, there may be none with the focus for a moment.
+    void OnActivation(bool active);
+    void OnDeactivation(); // it lost the focus to another program
 
     // Command lines of other programs: only while nothing is being asked, loaded or saved. The
     // messages window and the About box may be open.
@@ -60,6 +64,7 @@ private:
     void Correct();
     void OnMove(wxMoveEvent &event);
     void OnSize(wxSizeEvent &event);
+    void OnLeft(wxTimerEvent &event);
     void OnClose(wxCloseEvent &event);
     bool MayClose(bool mayAsk);
     bool MayLoseChanges();
@@ -71,6 +76,7 @@ private:
     int m_toolsWidth = 0;             // of the tool bar without the search field
     wxMenu *m_contextMenu = nullptr;  // nobody fills it yet
     bool m_autoSave = true;
+    wxTimer m_leaving;           // runs while a loss of the focus does not count yet
     bool m_commandWaits = false; // for the end of editing
     wxRect m_place;              // where the window shall open
     int m_corrections = 2;       // tries that are left to put it there

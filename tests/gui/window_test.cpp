@@ -449,6 +449,29 @@ TEST_F(SaveQuestion, IsNotAskedWhenTheProgramLosesTheFocus)
     EXPECT_TRUE(IsSaved("a.bib") && IsSaved("c.bib"));
 }
 
+TEST_F(Window, SavesWhenTheLossOfTheFocusLasts)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    Change(0, "Changed");
+    frame->OnActivation(false);
+    EXPECT_EQ(OneEntry, folder.Read("a.bib"));
+    EXPECT_TRUE(WaitFor([this] { return !SaveEnabled(); }));
+    EXPECT_NE(OneEntry, folder.Read("a.bib"));
+}
+
+// As when a dialog closes under a slow window manager.
+TEST_F(Window, SavesNothingWhenTheFocusComesBackAtOnce)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    Change(0, "Changed");
+    frame->OnActivation(false);
+    frame->OnActivation(true);
+    wxTimer later;
+    later.StartOnce(500);
+    EXPECT_TRUE(WaitFor([&] { return !later.IsRunning(); }));
+    EXPECT_EQ(OneEntry, folder.Read("a.bib"));
+}
+
 TEST_F(SaveQuestion, IsNotAskedWhenTheWindowCloses)
 {
     frame->Close();
