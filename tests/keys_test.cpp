@@ -41,3 +41,30 @@ TEST(KeyRead, PassesOverWhatIsDroppedAnyway)
 {
     EXPECT_TRUE(Key_Read(L"a\t\x02 b").fits);
 }
+
+TEST(NameCheck, TellsWhatIsWrong)
+{
+    const struct {
+        const char *key;
+        NameVerdict verdict;
+    } rows[] = {{"author", NAME_OK},     {"date-added", NAME_OK},  {"x_1", NAME_OK},
+                {"", NAME_EMPTY},        {"1st", NAME_UNWRITABLE}, {"a\\b", NAME_UNWRITABLE},
+                {"1{st", NAME_BAD_CHARS}};
+    for (const auto &row : rows)
+        EXPECT_EQ(row.verdict, Name_Check({row.key, true})) << row.key;
+}
+
+TEST(NameCheck, RefusesEveryForbiddenCharacter)
+{
+    for (char c : std::string("\"#%'(),={} "))
+        EXPECT_EQ(NAME_BAD_CHARS, Name_Check({std::string("a") + c, true})) << c;
+}
+
+TEST(NameCheck, TellsOfCharactersThatTheCodePageLacksBeforeBadOnes)
+{
+    EXPECT_EQ(NAME_MISFIT, Name_Check({"\xFF"
+                                       "anr",
+                                       false}));
+    EXPECT_EQ(NAME_EMPTY, Name_Check({"", false}));
+    EXPECT_EQ(NAME_MISFIT, Name_Check({"\xFF{", false}));
+}

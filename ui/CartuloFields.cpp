@@ -50,22 +50,22 @@ void Cartulo::OnNewField(wxCommandEvent &)
     if (!m_editMode || !m_entry)
         return;
     TypedKey key = Key_Read(m_newFieldKey->GetValue().ToStdWstring().c_str());
-    switch (FieldKey_CheckNew(key)) {
-    case FIELD_KEY_EMPTY:
+    switch (Name_Check(key)) {
+    case NAME_EMPTY:
         ShowWarning(AddTitle, "Field key is undefined.\nPlease enter key name or choose some "
                               "standard value in list of combo box.");
         break;
-    case FIELD_KEY_BAD_CHARS: // only the window for another name removes them
+    case NAME_BAD_CHARS: // only the window for another name removes them
         Box_WarnOrCancel(wxGetTopLevelParent(this), AddTitle, FieldKey_BadCharsText);
         break;
-    case FIELD_KEY_MISFIT:
+    case NAME_MISFIT:
         ShowWarning(AddTitle, StoreText(Key_MisfitText().c_str()));
         break;
-    case FIELD_KEY_UNWRITABLE:
+    case NAME_UNWRITABLE:
         ShowWarning(AddTitle, FieldKey_UnwritableText);
         break;
-    case FIELD_KEY_OK:
-    case FIELD_KEY_TAKEN: // told when it is added
+    case NAME_OK:
+    case NAME_TAKEN: // told when it is added
         AddField(key.text);
         return;
     }

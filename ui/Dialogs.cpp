@@ -7,6 +7,9 @@
 #include <wx/textctrl.h>
 #include <wx/textentry.h>
 
+#include "store/BibStore.h"
+#include "ui/DisplayText.h"
+
 wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog)
 {
     wxFlexGridSizer *rows = new wxFlexGridSizer(2, dialog->FromDIP(wxSize(DIALOG_GAP, DIALOG_GAP)));
@@ -63,4 +66,13 @@ void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text)
 bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString &text)
 {
     return wxMessageBox(text, caption, wxOK | wxCANCEL | wxICON_WARNING, parent) == wxOK;
+}
+
+void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
+                       std::string key, wxTextEntry *entry)
+{
+    if (!Box_WarnOrCancel(parent, caption, text))
+        return;
+    Bib_StripKeyChars(key.data());
+    entry->ChangeValue(StoreText(key.c_str()));
 }

@@ -1,11 +1,14 @@
 // ui/Dialogs.h - what the program's windows and boxes have in common.
 #pragma once
 
+#include <string>
+
 #include <wx/string.h>
 
 class wxDialog;
 class wxFlexGridSizer;
 class wxSizer;
+class wxTextEntry;
 class wxWindow;
 
 enum { DIALOG_BORDER = 12, DIALOG_GAP = 8 }; // device-independent pixels
@@ -23,3 +26,8 @@ void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text);
 
 // A warning that may be cancelled; true for OK.
 bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString &text);
+
+// Offers to take the characters out of `key` (store text) that no key may hold; what is left goes
+// into `entry`, for the user to look at.
+void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
+                       std::string key, wxTextEntry *entry);

@@ -64,18 +64,6 @@ void EntryDialog::Refuse(const wxString &text)
     m_key->SetFocus();
 }
 
-void EntryDialog::ReplaceBadChars(std::string key)
-{
-    bool accepted = Box_WarnOrCancel(this, m_texts.caption,
-                                     "The key includes invalid characters.\n"
-                                     "We will remove them from key and continue.");
-    m_key->SetFocus();
-    if (!accepted)
-        return;
-    Bib_StripKeyChars(key.data());
-    m_key->ChangeValue(StoreText(key.c_str()));
-}
-
 bool EntryDialog::AcceptDuplicate()
 {
     return wxMessageBox(m_texts.takenElsewhere, m_texts.caption, wxYES_NO | wxICON_QUESTION,
@@ -92,7 +80,11 @@ bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)
         Refuse(m_texts.emptyKey);
         return false;
     case KEY_BAD_CHARS:
-        ReplaceBadChars(key);
+        Box_OfferStripped(this, m_texts.caption,
+                          "The key includes invalid characters.\n"
+                          "We will remove them from key and continue.",
+                          key, m_key);
+        m_key->SetFocus();
         return false;
     case KEY_MISFIT:
         Refuse(StoreText(Key_MisfitText().c_str()));

@@ -58,7 +58,6 @@ protected:
 
 private:
     void FillFiles();
-    void ReplaceBadChars(std::string key);
     bool AcceptDuplicate();
 
     Texts m_texts;

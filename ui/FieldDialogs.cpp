@@ -92,23 +92,19 @@ Cartulo_RenameField::Cartulo_RenameField(wxWindow *parent, const FieldGrid *grid
 bool Cartulo_RenameField::Accept(const TypedKey &name)
 {
     switch (FieldKey_CheckNewName(m_grid, name)) {
-    case FIELD_KEY_OK:
-    case FIELD_KEY_EMPTY:
+    case NAME_OK:
+    case NAME_EMPTY:
         return true;
-    case FIELD_KEY_BAD_CHARS:
-        if (Box_WarnOrCancel(this, GetTitle(), FieldKey_BadCharsText)) {
-            std::string stripped = name.text;
-            Bib_StripKeyChars(stripped.data());
-            m_name->SetValue(StoreText(stripped.c_str()));
-        }
+    case NAME_BAD_CHARS:
+        Box_OfferStripped(this, GetTitle(), FieldKey_BadCharsText, name.text, m_name);
         return false;
-    case FIELD_KEY_MISFIT:
+    case NAME_MISFIT:
         Box_Warn(this, GetTitle(), StoreText(Key_MisfitText().c_str()));
         return false;
-    case FIELD_KEY_UNWRITABLE:
+    case NAME_UNWRITABLE:
         Box_Warn(this, GetTitle(), FieldKey_UnwritableText);
         return false;
-    case FIELD_KEY_TAKEN:
+    case NAME_TAKEN:
         Box_Warn(this, GetTitle(), FieldKey_TakenText);
     }
     return false;

@@ -4,10 +4,10 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
-#include <cwchar>
 
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
+#include "ui/Values.h"
 
 static bool SameName(const char *a, const char *b)
 {
@@ -224,11 +224,7 @@ static bool IsChanged(const GridRow *row)
 
 static std::string ValueOf(const GridRow *row)
 {
-    if (!IsChanged(row))
-        return row->stored;
-    std::string value(row->text.size() + 1, 0);
-    value.resize(strlen(Enc_FromUnicode(value.data(), row->text.c_str())));
-    return value;
+    return IsChanged(row) ? Value_Read(row->text) : row->stored;
 }
 
 // A heap copy of that; null when memory is out.
@@ -338,118 +334,38 @@ std::string Grid_Question(const GridChanges *changes)
 
 // --- Losses ---
 
-static bool IsGuillemet(uint32_t c)
-{
-    return c == 0xAB || c == 0xBB;
-}
-
-static bool HoldsGuillemets(const std::wstring &text)
-{
-    return std::any_of(text.begin(), text.end(),
-                       [](wchar_t c) { return IsGuillemet(static_cast<uint32_t>(c)); });
-}
-
-// As text: a mark is not in the code page, only shown as one.
-static bool StoresGuillemets(const std::string &value)
-{
-    const uint32_t *map = Enc_Current()->map;
-    return std::any_of(value.begin(), value.end(),
-                       [map](char c) { return IsGuillemet(map[static_cast<unsigned char>(c)]); });
-}
-
-// The characters that would not come back, each once, in their order.
-static std::wstring LostCharacters(const GridRow *row)
-{
-    std::wstring lost;
-    for (wchar_t c : row->text)
-        if (!Enc_Holds(c) && lost.find(c) == lost.npos)
-            lost += c;
-    return lost;
-}
-
-static std::wstring Visible(wchar_t c)
-{
-    bool isControl = c < 32 || (c >= 127 && c < 160);
-    if (!isControl)
-        return std::wstring(1, c);
-    wchar_t name[16];
-    swprintf(name, sizeof name / sizeof *name, L"U+%04X", static_cast<unsigned>(c));
-    return name;
-}
-
-// The first twenty, with blanks between.
-static std::wstring ListCharacters(const std::wstring &characters)
-{
-    static const size_t most = 20;
-    std::wstring list;
-    for (size_t i = 0; i < characters.size() && i < most; ++i)
-        list += (i > 0 ? L" " : L"") + Visible(characters[i]);
-    return characters.size() > most ? list + L" ..." : list;
-}
-
-static bool StoresGuillemets(const BibEntry *entry)
+static bool HoldsGuillemets(const BibEntry *entry)
 {
     return std::any_of(entry->fields, entry->fields + entry->fieldCount,
-                       [](const BibField &field) { return StoresGuillemets(field.value); });
-}
-
-// What the store makes of it.
-static std::wstring Stored(wchar_t c)
-{
-    const wchar_t character[] = {c, 0};
-    char byte[2];
-    std::wstring stored;
-    return Enc_ToUnicode(stored, Enc_FromUnicode(byte, character));
+                       [](const BibField &field) { return Value_HoldsGuillemets(field.value); });
 }
 
 static std::wstring RowLosses(const GridRow *row, bool textGuillemets)
 {
-    std::wstring key, page, text;
+    std::wstring key;
     Enc_ToUnicode(key, row->key.c_str());
-    Enc_ToUnicode(page, Enc_Current()->name);
-    std::wstring lost = LostCharacters(row);
-    if (!lost.empty())
-        text += L"`" + key + L"': " + ListCharacters(lost) + L" can't be stored in " + page +
-                L" and would become " + Stored(lost[0]) + L".\n";
-    if (textGuillemets && HoldsGuillemets(row->text))
-        text += L"`" + key + L"': \xAB and \xBB will mark an abbreviation, not stand as text.\n";
-    return text;
+    return Value_Losses(key, row->text, textGuillemets);
 }
 
 std::wstring Grid_Losses(const FieldGrid *grid)
 {
     bool textGuillemets =
-        StoresGuillemets(grid->entry) || (grid->parent && StoresGuillemets(grid->parent));
+        HoldsGuillemets(grid->entry) || (grid->parent && HoldsGuillemets(grid->parent));
     std::wstring text;
     for (int i = 0; i < grid->count; ++i)
         if (IsChanged(&grid->rows[i]))
             text += RowLosses(&grid->rows[i], textGuillemets);
-    return text.empty() ? text : text + L"\nDo you want to accept these changes anyway ?";
+    return text.empty() ? text : text + Value_LossesQuestion;
 }
 
 // --- Checking ---
-
-static bool HasReadableNames(const std::string &value)
-{
-    for (size_t open = value.find(BIB_OPEN_ABBREVIATION); open != value.npos;
-         open = value.find(BIB_OPEN_ABBREVIATION, open + 1)) {
-        size_t close = value.find(BIB_CLOSE_ABBREVIATION, open);
-        if (!Bib_IsName(value.substr(open + 1, close - open - 1).c_str()))
-            return false;
-    }
-    return true;
-}
 
 const char *Grid_CheckRow(const GridRow *row)
 {
     if (row->inherited)
         return nullptr;
     std::string value = ValueOf(row);
-    const char *reason = Bib_CheckValue(value.c_str());
-    if (!reason && IsChanged(row) && !HasReadableNames(value))
-        reason = "The name of an abbreviation is missing, begins with a digit, or holds a "
-                 "backslash or a control character";
-    return reason;
+    return IsChanged(row) ? Value_Check(value.c_str()) : Bib_CheckValue(value.c_str());
 }
 
 // Whether the key of row i is neither in the table already nor brought there by an earlier row.

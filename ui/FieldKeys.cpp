@@ -7,21 +7,10 @@ const char FieldKey_UnwritableText[] = "A field of this name can't be written to
                                        "or control character.";
 const char FieldKey_TakenText[] = "Field with specified key is already exists.";
 
-FieldKeyVerdict FieldKey_CheckNew(const TypedKey &key)
+NameVerdict FieldKey_CheckNewName(const FieldGrid *grid, const TypedKey &name)
 {
-    if (key.text.empty())
-        return FIELD_KEY_EMPTY;
-    if (!key.fits)
-        return FIELD_KEY_MISFIT;
-    if (Bib_HasBadKeyChars(key.text.c_str()))
-        return FIELD_KEY_BAD_CHARS;
-    return Bib_IsName(key.text.c_str()) ? FIELD_KEY_OK : FIELD_KEY_UNWRITABLE;
-}
-
-FieldKeyVerdict FieldKey_CheckNewName(const FieldGrid *grid, const TypedKey &name)
-{
-    FieldKeyVerdict form = FieldKey_CheckNew(name);
-    if (form != FIELD_KEY_OK)
+    NameVerdict form = Name_Check(name);
+    if (form != NAME_OK)
         return form;
-    return Grid_MayRename(grid, name.text.c_str()) ? FIELD_KEY_OK : FIELD_KEY_TAKEN;
+    return Grid_MayRename(grid, name.text.c_str()) ? NAME_OK : NAME_TAKEN;
 }

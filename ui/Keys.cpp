@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "encoding/Encoding.h"
+#include "store/BibStore.h"
 
 static bool Fits(wchar_t c)
 {
@@ -25,4 +26,15 @@ std::string Key_MisfitText()
 {
     return std::string("The key includes characters that can't be stored in ") +
            Enc_Current()->name + ".";
+}
+
+NameVerdict Name_Check(const TypedKey &name)
+{
+    if (name.text.empty())
+        return NAME_EMPTY;
+    if (!name.fits)
+        return NAME_MISFIT;
+    if (Bib_HasBadKeyChars(name.text.c_str()))
+        return NAME_BAD_CHARS;
+    return Bib_IsName(name.text.c_str()) ? NAME_OK : NAME_UNWRITABLE;
 }

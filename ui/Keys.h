@@ -1,4 +1,4 @@
-// ui/Keys.h - what users type for the key of an entry or the name of a field.
+// ui/Keys.h - what users type for the key of an entry, or the name of a field or an abbreviation.
 #pragma once
 
 #include <string>
@@ -11,3 +11,17 @@ struct TypedKey {
 TypedKey Key_Read(const wchar_t *typed);
 
 std::string Key_MisfitText(); // what to say of a key that does not fit; store text
+
+// --- Names of fields and abbreviations ---
+
+enum NameVerdict {
+    NAME_OK,
+    NAME_EMPTY,
+    NAME_MISFIT,     // see Key_MisfitText; first, as a stripped name takes the typed one's place
+    NAME_BAD_CHARS,  // holds characters that no key may hold; Bib_StripKeyChars removes them
+    NAME_UNWRITABLE, // the parser would not read it back
+    NAME_TAKEN
+};
+
+// All but NAME_TAKEN.
+NameVerdict Name_Check(const TypedKey &name);
