@@ -29,8 +29,10 @@
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/Messages.h"
+#include "ui/Preamble.h"
 #include "ui/QListBox.h"
 #include "ui/Schema.h"
+#include "ui/Strings.h"
 #include "ui/Theme.h"
 
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, HELP_HEIGHT = 40 };
@@ -47,8 +49,8 @@ wxBEGIN_EVENT_TABLE(Cartulo, wxSplitterWindow)
     ON_COMMAND(ID_SAVE, Cartulo::OnSave)
     ON_COMMAND(ID_MESSAGES, Cartulo::OnShowMessages)
     ON_COMMAND(ID_CITE, Cartulo::OnInsertCite)
-    ON_COMMAND(ID_STRINGS, Cartulo::OnUnavailable)
-    ON_COMMAND(ID_PREAMBLE, Cartulo::OnUnavailable)
+    ON_COMMAND(ID_STRINGS, Cartulo::OnEditStrings)
+    ON_COMMAND(ID_PREAMBLE, Cartulo::OnEditPreamble)
     ON_COMMAND(ID_NEW_ENTRY, Cartulo::OnNewEntry)
     ON_COMMAND(ID_REMOVE_ENTRY, Cartulo::OnRemoveEntry)
     ON_COMMAND(ID_RENAME_ENTRY, Cartulo::OnRenameEntry)
@@ -446,6 +448,23 @@ void Cartulo::OnShowMessages(wxCommandEvent &)
     m_messages = nullptr;
 }
 
+// A field that can be edited gets what is chosen.
+void Cartulo::OnEditStrings(wxCommandEvent &)
+{
+    int row = RowWithFocus(m_grid.count);
+    TNSMessage("INFO: Cartulo::OnEditStrings, mode=", row < 0 ? "Edit" : "Insert", TNS_ACTION);
+    Cartulo_Strings dialog(this, row < 0 ? nullptr : m_rows[row].value);
+    dialog.ShowModal();
+    if (row >= 0)
+        FocusRow(row);
+}
+
+void Cartulo::OnEditPreamble(wxCommandEvent &)
+{
+    TNSMessage("INFO: Cartulo::OnEditPreamble", "", TNS_ACTION);
+    Cartulo_Preamble(this).ShowModal();
+}
+
 // --- Other programs ---
 
 void Cartulo::OnInsertCite(wxCommandEvent &)
@@ -458,11 +477,6 @@ void Cartulo::OnInsertCite(wxCommandEvent &)
     Native_BringForward(m_state->companionWindow);
     if (!SendCommand(m_state->companionService, command.utf8_str()))
         ShowStatusError(this, "ERROR: The editor of the document does not answer.");
-}
-
-void Cartulo::OnUnavailable(wxCommandEvent &)
-{
-    ShowStatusError(this, "This version of Cartulo can't do that yet.");
 }
 
 // --- Saving ---

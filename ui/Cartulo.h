@@ -28,6 +28,7 @@ public:
     ~Cartulo() override;
 
     const BibFileSet *Files() const { return &m_set; }
+    const std::string &Ini() const { return m_ini; }         // path of the INI file
     const BibEntry *CurrentEntry() const { return m_entry; } // null for none
     bool InEditMode() const { return m_editMode; }
     bool IsBusy() const { return m_busy; } // loading, saving, or asking about it or a commit
@@ -141,7 +142,8 @@ private:
     void OnSave(wxCommandEvent &event);
     void OnShowMessages(wxCommandEvent &event);
     void OnInsertCite(wxCommandEvent &event);
-    void OnUnavailable(wxCommandEvent &event);
+    void OnEditStrings(wxCommandEvent &event);
+    void OnEditPreamble(wxCommandEvent &event);
     void OnNewEntry(wxCommandEvent &event);
     void OnRenameEntry(wxCommandEvent &event);
     void OnRemoveEntry(wxCommandEvent &event);

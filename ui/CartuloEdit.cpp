@@ -27,7 +27,6 @@
 
 enum { LABEL_WIDTH = 96 };                   // in the narrowest window
 enum { NOTE_INDEX = 3 };                     // of the note on missing fields, in its row
-enum { LONGEST_TIP = 1000 };                 // characters
 enum { LONGEST_TYPE = 300 };                 // what is shown of one
 enum { KEY_WIDTH = 160, SMALLEST_KEY = 40 }; // of the box for the key of a new field
 
@@ -35,16 +34,10 @@ static const char CommitTitle[] = "Commit of Bibliography Entry - Question";
 
 // --- Rows and their controls ---
 
-// The part of a long text that a tip can show.
-static wxString TipText(const wxString &text)
-{
-    return text.length() > LONGEST_TIP ? text.Left(LONGEST_TIP) + L"\x2026" : text;
-}
-
 static bool Fits(const wxTextCtrl *value)
 {
     wxString text = value->GetValue();
-    return text.length() <= LONGEST_TIP &&
+    return BoundedText(text) == text &&
            value->GetSizeFromTextSize(value->GetTextExtent(text)).x <= value->GetSize().x;
 }
 
@@ -60,7 +53,7 @@ void Cartulo::FitRow(int row)
     if (m_grid.rows[row].locked)
         value->SetToolTip("This value is too long to be shown in full.");
     else
-        value->SetToolTip(Fits(value) ? wxString() : TipText(value->GetValue()));
+        value->SetToolTip(Fits(value) ? wxString() : BoundedText(value->GetValue()));
 }
 
 // A text control holds no more than 65,534 bytes, and nothing behind a NUL: what it cannot hold is

@@ -68,6 +68,11 @@ bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString 
     return wxMessageBox(text, caption, wxOK | wxCANCEL | wxICON_WARNING, parent) == wxOK;
 }
 
+bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, long style)
+{
+    return wxMessageBox(text, caption, wxYES_NO | wxICON_QUESTION | style, parent) == wxYES;
+}
+
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
                        std::string key, wxTextEntry *entry)
 {
@@ -75,4 +80,5 @@ void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString
         return;
     Bib_StripKeyChars(key.data());
     entry->ChangeValue(StoreText(key.c_str()));
+    entry->SetInsertionPointEnd();
 }

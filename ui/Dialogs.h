@@ -11,7 +11,12 @@ class wxSizer;
 class wxTextEntry;
 class wxWindow;
 
-enum { DIALOG_BORDER = 12, DIALOG_GAP = 8 }; // device-independent pixels
+// Device-independent pixels.
+enum {
+    DIALOG_BORDER = 12,
+    DIALOG_GAP = 8,
+    DIALOG_ITEM = 400 // the widest item of a choice
+};
 
 // Two columns, labels and controls; the second one grows.
 wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog);
@@ -26,6 +31,9 @@ void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text);
 
 // A warning that may be cancelled; true for OK.
 bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString &text);
+
+// True for Yes. `style` may be wxNO_DEFAULT.
+bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, long style = 0);
 
 // Offers to take the characters out of `key` (store text) that no key may hold; what is left goes
 // into `entry`, for the user to look at.

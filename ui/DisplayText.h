@@ -6,6 +6,7 @@
 #include <wx/string.h>
 
 class wxWindow;
+struct BibFile;
 
 wxString StoreText(const char *text); // contents of BIB files, in the selected code page
 wxString PathText(const char *text);  // names of files, and messages that hold them
@@ -14,6 +15,15 @@ std::wstring PathTextWide(const char *text);
 // `text`, its middle left out where it is wider than `width` (device-independent pixels) in the
 // control's font. For controls that grow with their text.
 wxString ShortText(wxWindow *control, const wxString &text, int width);
+
+wxString FileTip(const BibFile *file); // its path, and whether it is read-only
+
+// The beginning of a very long text, for windows that show one whole: tips, boxes, lists.
+wxString BoundedText(const wxString &text);
+
+// How a control for several lines wraps this text: between words, unless one is so long that this
+// would take minutes.
+long WrapStyle(const wxString &text);
 
 // A file name as the system wants it.
 std::string PathBytes(const wxString &path);

@@ -13,7 +13,7 @@
 #include "ui/Schema.h"
 #include "ui/TypeChoice.h"
 
-enum { KEY_WIDTH = 280, LONGEST_ITEM = 400 };
+enum { KEY_WIDTH = 280 };
 
 // --- What both windows have ---
 
@@ -28,7 +28,7 @@ EntryDialog::EntryDialog(wxWindow *parent, const EntryPlace &current, const Text
     m_key->SetMinSize(FromDIP(wxSize(KEY_WIDTH, -1)));
     m_type = new wxChoice(this, ID_ENTRY_TYPE);
     FillFiles();
-    TypeChoice_Fill(m_type, LONGEST_ITEM);
+    TypeChoice_Fill(m_type, DIALOG_ITEM);
     if (current.entry)
         TypeChoice_Select(m_type, current.entry->type);
     m_rows = Dialog_CreateRows(this);
@@ -41,7 +41,7 @@ void EntryDialog::FillFiles()
 {
     for (int file : m_files)
         m_file->Append(ShortText(
-            m_file, PathText(Entry_FileLabel(m_current.set, m_files, file).c_str()), LONGEST_ITEM));
+            m_file, PathText(Entry_FileLabel(m_current.set, m_files, file).c_str()), DIALOG_ITEM));
 }
 
 // The item of the current file; wxNOT_FOUND when that can't be written.
@@ -66,8 +66,7 @@ void EntryDialog::Refuse(const wxString &text)
 
 bool EntryDialog::AcceptDuplicate()
 {
-    return wxMessageBox(m_texts.takenElsewhere, m_texts.caption, wxYES_NO | wxICON_QUESTION,
-                        this) == wxYES;
+    return Box_Ask(this, m_texts.caption, m_texts.takenElsewhere);
 }
 
 bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)

@@ -1,7 +1,5 @@
 #include "ui/FieldDialogs.h"
 
-#include <algorithm>
-
 #include <wx/combobox.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
@@ -13,20 +11,7 @@
 #include "ui/FieldKeys.h"
 #include "ui/Keys.h"
 
-enum { LONG_WORD = 1000 }; // characters
-
 // --- The value ---
-
-// To break a very long word between its letters only where blanks do not help takes minutes.
-static long WrapStyle(const wxString &value)
-{
-    int length = 0, longest = 0;
-    for (wxUniChar c : value) {
-        length = c == ' ' || c == '\n' ? 0 : length + 1;
-        longest = std::max(longest, length);
-    }
-    return longest > LONG_WORD ? wxTE_CHARWRAP : wxTE_BESTWRAP;
-}
 
 wxBEGIN_EVENT_TABLE(Cartulo_EditField, wxDialog)
     EVT_BUTTON(wxID_OK, Cartulo_EditField::OnOK)

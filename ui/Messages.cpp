@@ -27,6 +27,11 @@ static Colour HeadingColour(MessagesVerdict verdict)
     }
 }
 
+static wxString TextOf(const BibFileSet *set)
+{
+    return wxString(Messages_Text(set, PathTextWide));
+}
+
 Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
     : wxDialog(parent, wxID_ANY, "Bibliography File Loading Error Messages", wxDefaultPosition,
                wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER)
@@ -34,7 +39,8 @@ Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
     SetFont(wxFontInfo(10));
     m_heading = new wxStaticText(this, wxID_ANY, "");
     m_text = new wxTextCtrl(this, ID_MESSAGES_TEXT, "There is no messages ...", wxDefaultPosition,
-                            wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY);
+                            wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY | WrapStyle(TextOf(set)));
+    m_text->SetFont(wxFontInfo(10).Family(wxFONTFAMILY_TELETYPE));
     m_text->SetMinSize(FromDIP(wxSize(600, 200)));
     Fill(set);
 
@@ -54,7 +60,7 @@ void Cartulo_Messages::Fill(const BibFileSet *set)
     MessagesVerdict verdict = Messages_Verdict(set);
     m_heading->SetLabelText(Messages_Heading(verdict));
     Theme_SetTextColour(m_heading, HeadingColour(verdict));
-    m_text->ChangeValue(wxString(Messages_Text(set, PathTextWide)));
+    m_text->ChangeValue(TextOf(set));
 }
 
 void Cartulo_Messages::OnOK(wxCommandEvent &event)

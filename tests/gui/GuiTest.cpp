@@ -345,6 +345,12 @@ void CartuloWindow::Change(int file, const char *value)
     Panel()->SetModified(file);
 }
 
+void CartuloWindow::Run(int command)
+{
+    wxCommandEvent event(wxEVT_MENU, command);
+    Panel()->ProcessWindowEvent(event);
+}
+
 // --- The program ---
 
 class GuiTestApp : public wxApp

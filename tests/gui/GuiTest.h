@@ -179,6 +179,7 @@ protected:
     // `key`; `hardware` is the number of the key on the keyboard.
     void PressShortcut(int key, bool alt, bool ctrl, int typed = 0, unsigned hardware = 0);
     void Press(wxWindowID button);
+    void Run(int command); // at once, as keys do
 
     // Changes the first field of the first file's first entry.
     void Change(int file, const char *value);

@@ -164,8 +164,8 @@ private:
 static const struct Command {
     int id, inList, inEditing, inField;
 } Commands[] = {
-    {ID_OPEN, 1, 1, 1},           {ID_SAVE, 0, 0, 0},         {ID_STRINGS, 0, 0, 0},
-    {ID_PREAMBLE, 0, 0, 0},       {ID_MESSAGES, 1, 1, 1},     {ID_CITE, 0, 0, 0},
+    {ID_OPEN, 1, 1, 1},           {ID_SAVE, 0, 0, 0},         {ID_STRINGS, 1, 1, 1},
+    {ID_PREAMBLE, 1, 1, 1},       {ID_MESSAGES, 1, 1, 1},     {ID_CITE, 0, 0, 0},
     {ID_NEW_ENTRY, 1, 1, 1},      {ID_REMOVE_ENTRY, 1, 1, 1}, {ID_RENAME_ENTRY, 1, 1, 1},
     {ID_EDIT_ENTRY, 0, 0, 0},     {ID_COMMIT_ENTRY, 0, 1, 1}, {ID_NEW_FIELD, 0, 0, 0},
     {ID_RENAME_FIELD, 0, 0, 1},   {ID_REMOVE_FIELD, 0, 0, 0}, {ID_EDIT_FIELD, 0, 0, 1},

@@ -1,6 +1,6 @@
 // The commands that add, rename and remove entries, and their windows.
 
-#include "tests/gui/GuiTest.h"
+#include "tests/gui/DialogTest.h"
 
 #include <cstdlib>
 
@@ -25,31 +25,24 @@ namespace
 using UseNew = UseDialog<Cartulo_NewEntry>;
 using UseRename = UseDialog<Cartulo_RenameEntry>;
 
-template <class Control> Control *Child(wxDialog &dialog, int id)
-{
-    Control *control = dynamic_cast<Control *>(dialog.FindWindow(id));
-    EXPECT_TRUE(control) << id;
-    return control;
-}
-
 wxChoice *FileOf(wxDialog &dialog)
 {
-    return Child<wxChoice>(dialog, ID_ENTRY_FILE);
+    return Find<wxChoice>(dialog, ID_ENTRY_FILE);
 }
 
 wxTextCtrl *KeyOf(wxDialog &dialog)
 {
-    return Child<wxTextCtrl>(dialog, ID_ENTRY_KEY);
+    return Find<wxTextCtrl>(dialog, ID_ENTRY_KEY);
 }
 
 wxChoice *TypeOf(wxDialog &dialog)
 {
-    return Child<wxChoice>(dialog, ID_ENTRY_TYPE);
+    return Find<wxChoice>(dialog, ID_ENTRY_TYPE);
 }
 
 wxCheckBox *CheckOf(wxDialog &dialog)
 {
-    return Child<wxCheckBox>(dialog, ID_ENTRY_CHILD);
+    return Find<wxCheckBox>(dialog, ID_ENTRY_CHILD);
 }
 
 using ::PressOK;
@@ -59,23 +52,6 @@ bool PressOK(wxDialog &dialog, const wxString &key)
 {
     KeyOf(dialog)->SetValue(key);
     return PressOK(dialog);
-}
-
-std::vector<wxString> Items(const wxChoice *choice)
-{
-    std::vector<wxString> items;
-    for (unsigned i = 0; i < choice->GetCount(); ++i)
-        items.push_back(choice->GetString(i));
-    return items;
-}
-
-std::vector<wxString> Labels(const wxDialog &dialog)
-{
-    std::vector<wxString> labels;
-    for (wxWindow *child : dialog.GetChildren())
-        if (wxStaticText *text = dynamic_cast<wxStaticText *>(child))
-            labels.push_back(text->GetLabelText());
-    return labels;
 }
 
 const char Adding[] = "Adding New Entry", Renaming[] = "Renaming Entry";
@@ -107,12 +83,6 @@ protected:
         std::filesystem::create_directory(folder.Path("Cartulo"));
         folder.Write("Cartulo/cartulo.ini",
                      "[misc]\nnote=\n[book]\nauthor=*editor\neditor=*author\ntitle=*\nyear=\n");
-    }
-
-    void Run(int command)
-    {
-        wxCommandEvent event(wxEVT_MENU, command);
-        Panel()->ProcessWindowEvent(event);
     }
 
     // Files that have errors show their messages.
@@ -149,24 +119,9 @@ protected:
         return folder.Read(name);
     }
 
-    // Runs a command whose window is really shown; `steps` run once it has come up.
-    template <class Dialog> void Show(int command, std::function<void(Dialog &)> steps)
+    template <class Dialog> void Show(int command, const std::function<void(Dialog &)> &steps)
     {
-        AllowDialogs allow;
-        bool ran = false;
-        frame->CallAfter([&] {
-            Dialog *dialog = nullptr;
-            ASSERT_TRUE(WaitFor([&] {
-                for (wxWindow *window : wxTopLevelWindows)
-                    if (Dialog *one = dynamic_cast<Dialog *>(window))
-                        dialog = one;
-                return dialog && dialog->IsShownOnScreen() && dialog->IsActive();
-            }));
-            ran = true;
-            steps(*dialog);
-        });
-        Run(command);
-        EXPECT_TRUE(ran);
+        ShowDialog<Dialog>([&] { Run(command); }, steps);
     }
 
     wxUIActionSimulator keys;
@@ -195,10 +150,7 @@ TEST_F(NewEntry, AsksForFileKeyTypeAndParent)
         EXPECT_TRUE(CheckOf(dialog)->IsEnabled());
         for (int button : {wxID_OK, wxID_CANCEL})
             EXPECT_TRUE(dialog.FindWindow(button)) << button;
-        for (wxWindow *child : dialog.GetChildren()) {
-            EXPECT_GE(child->GetSize().x, child->GetBestSize().x) << child->GetLabel();
-            EXPECT_GE(child->GetSize().y, child->GetBestSize().y) << child->GetLabel();
-        }
+        ExpectRoom(dialog);
     };
     wxTEST_DIALOG(Run(ID_NEW_ENTRY), UseNew(look));
     EXPECT_EQ(wxID_CANCEL, Panel()->DialogResult());

@@ -1,0 +1,125 @@
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+
+#include "store/BibFileSet.h"
+#include "tests/support/LoadText.h"
+#include "ui/PreambleText.h"
+
+static const char TwoPieces[] = "\\def\\a{x}\r\n\\def\\b{y}\r\n";
+
+TEST(PreambleRead, KeepsWhatWasNotTouched)
+{
+    EXPECT_EQ(TwoPieces, Preamble_Read(L"\\def\\a{x}\r\n\\def\\b{y}\r\n"));
+    EXPECT_EQ("{a\nb}\r\n", Preamble_Read(L"{a\nb}\r\n"));
+    EXPECT_EQ("", Preamble_Read(L""));
+}
+
+TEST(PreambleRead, EndsAPieceWithAnEnterOutsideBraces)
+{
+    EXPECT_EQ("a\r\nb{}\r\nc\r\n", Preamble_Read(L"a\nb{}\nc\r\n"));
+    EXPECT_EQ("a\r\n\r\nb\r\n", Preamble_Read(L"a\n\nb"));
+}
+
+TEST(PreambleRead, KeepsAnEnterInsideBracesInItsPiece)
+{
+    EXPECT_EQ("\\def\\a{x\n{y\n}\n}\r\nz\r\n", Preamble_Read(L"\\def\\a{x\n{y\n}\n}\nz\r\n"));
+}
+
+TEST(PreambleRead, TakesAClosingBraceTooManyForNone)
+{
+    EXPECT_EQ("a}\r\nb\r\n", Preamble_Read(L"a}\nb\r\n"));
+    EXPECT_EQ("a}{\nb\r\n", Preamble_Read(L"a}{\nb\r\n"));
+}
+
+TEST(PreambleRead, EndsWhatStandsBehindTheLastPiece)
+{
+    EXPECT_EQ("a\r\nb\r\n", Preamble_Read(L"a\r\nb"));
+    EXPECT_EQ("a\r\n", Preamble_Read(L"a"));
+    EXPECT_EQ("a {\n\r\n", Preamble_Read(L"a {\n"));
+}
+
+TEST(PreambleRead, MakesNothingOfLineEndsAlone)
+{
+    EXPECT_EQ("", Preamble_Read(L"\r\n\n\r\n"));
+    EXPECT_EQ(" \r\n", Preamble_Read(L" "));
+}
+
+TEST(PreambleRead, KeepsTheEndsOfPiecesInsideBraces)
+{
+    EXPECT_EQ("a{\r\nb!\r\n", Preamble_Read(L"a{\r\nb!\r\n"));
+    EXPECT_EQ("a{\r\nb\r\n{\n}\r\n", Preamble_Read(L"a{\r\nb\n{\n}\r\n"));
+}
+
+TEST(PreambleRead, MakesMarksOfGuillemets)
+{
+    EXPECT_EQ("a \2jan\5\r\n", Preamble_Read(L"a \u00ABjan\u00BB\r\n"));
+}
+
+TEST(PreambleCheckSize, AllowsWhatAFileHolds)
+{
+    EXPECT_EQ("", Preamble_CheckSize(std::string(8191, 'x')));
+    EXPECT_EQ("The preamble of a file can have 8191 bytes, with two for the end of each piece.\n"
+              "This one has 8192, 1 too many.\n\nShorten it to continue.",
+              Preamble_CheckSize(std::string(8192, 'x')));
+}
+
+TEST(PreambleCheck, NamesEachWrongPiece)
+{
+    EXPECT_TRUE(Preamble_Check("").empty());
+    EXPECT_TRUE(Preamble_Check(TwoPieces).empty());
+    std::vector<PreambleFault> faults =
+        Preamble_Check("good\r\na}\r\n{b\nc\r\n\2 \5\r\n\0021\5\r\n");
+    ASSERT_EQ(4u, faults.size());
+    EXPECT_EQ("a}", faults[0].piece);
+    EXPECT_STREQ("Unbalanced braces (extra `}')", faults[0].reason);
+    EXPECT_EQ("{b\nc", faults[1].piece);
+    EXPECT_STREQ("Unbalanced braces (too few closing braces)", faults[1].reason);
+    EXPECT_STREQ("Invalid char in abbreviation", faults[2].reason);
+    EXPECT_THAT(faults[3].reason, testing::StartsWith("The name of an abbreviation"));
+}
+
+TEST(PreambleStore, FillsTheBuffer)
+{
+    BibFile *file = LoadText("@preamble{{a}}\n");
+    Preamble_Store(file, std::string(8191, 'x'));
+    EXPECT_EQ(8191u, strlen(file->preamble));
+    Preamble_Store(file, "b\r\n");
+    EXPECT_STREQ("b\r\n", file->preamble);
+    Bib_FreeFile(file);
+}
+
+class PreambleFiles : public testing::Test
+{
+protected:
+    PreambleFiles()
+    {
+        for (int i = 0; i < 3; ++i)
+            records[i].baseName = names[i];
+        set.files = files;
+        set.count = 3;
+    }
+
+    char names[3][8] = {"refs", "Refs", "refs"};
+    BibFile records[3] = {};
+    BibFile *files[3] = {&records[0], &records[1], &records[2]};
+    BibFileSet set = {};
+};
+
+TEST_F(PreambleFiles, BeginWithTheRememberedOneOrTheLast)
+{
+    EXPECT_EQ(0, Preamble_FitFile(&set, 0));
+    EXPECT_EQ(2, Preamble_FitFile(&set, 2));
+    EXPECT_EQ(2, Preamble_FitFile(&set, 3));
+    set.count = 0;
+    EXPECT_EQ(-1, Preamble_FitFile(&set, 0));
+}
+
+TEST_F(PreambleFiles, AreTheLastOfTheirName)
+{
+    EXPECT_EQ(2, Preamble_FindFile(&set, "refs"));
+    EXPECT_EQ(1, Preamble_FindFile(&set, "Refs"));
+    EXPECT_EQ(-1, Preamble_FindFile(&set, "REFS"));
+}

@@ -1,0 +1,220 @@
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <string>
+#include <vector>
+
+#include "store/BibFileSet.h"
+#include "tests/support/LoadText.h"
+#include "tests/support/TempFolder.h"
+#include "ui/StringSources.h"
+
+using Lines = std::vector<std::string>;
+using testing::ElementsAre;
+
+class StringSourcesTest : public testing::Test
+{
+protected:
+    StringSourcesTest() { Bib_Initialize(); }
+    ~StringSourcesTest() override { FileSet_Free(&set); }
+
+    BibFile *Load(const std::string &text)
+    {
+        BibFile *file = LoadText(text);
+        FileSet_Append(&set, file);
+        return file;
+    }
+
+    StringSources Read(const std::string &ini)
+    {
+        return Strings_Sources(&set, folder.Write("a.ini", ini));
+    }
+
+    // The source at a position of the choice.
+    static int At(const StringSources &sources, int position)
+    {
+        return position - Strings_FirstFile(&sources);
+    }
+
+    Lines LinesAt(const StringSources &sources, int position)
+    {
+        return Strings_Lines(&sources, At(sources, position));
+    }
+
+    Lines NamesIn(const BibFile *file)
+    {
+        Lines names;
+        for (const BibString *string = file->strings; string; string = string->next)
+            names.push_back(string->name);
+        return names;
+    }
+
+    TempFolder folder;
+    BibFileSet set = {};
+};
+
+static const char TwoLists[] = "[String]\nMonths = *Months\nno list\nOther = *Other\n"
+                               "[*Months]\njan = January\nfeb=February\nstray line\n; note\n"
+                               "[*Other]\nx = \"quoted\"\n";
+
+// --- Sources ---
+
+using StringsSources = StringSourcesTest;
+
+TEST_F(StringsSources, AreTheListsOfTheIniFileThenAllFilesThenEachFile)
+{
+    Load("@string{a = {A}}\n");
+    Load("@string{b = {B} # a}\n@string{c = 12}\n");
+    StringSources sources = Read(TwoLists);
+    EXPECT_THAT(sources.lists, ElementsAre("Months", "Other"));
+    EXPECT_EQ(3, Strings_FirstFile(&sources));
+    EXPECT_THAT(LinesAt(sources, 0), ElementsAre("jan = January", "feb = February", "stray line"));
+    EXPECT_THAT(LinesAt(sources, 1), ElementsAre("x = \"quoted\""));
+    EXPECT_THAT(LinesAt(sources, 2), ElementsAre("a = A", "b = B\2a\5", "c = 12"));
+    EXPECT_THAT(LinesAt(sources, 3), ElementsAre("a = A"));
+    EXPECT_THAT(LinesAt(sources, 4), ElementsAre("b = B\2a\5", "c = 12"));
+}
+
+TEST_F(StringsSources, NeedNoIniFile)
+{
+    StringSources sources = Strings_Sources(&set, "/no/such/file");
+    EXPECT_TRUE(sources.lists.empty());
+    EXPECT_EQ(1, Strings_FirstFile(&sources));
+    EXPECT_THAT(Strings_Lines(&sources, STRINGS_OF_ALL_FILES), ElementsAre());
+}
+
+TEST_F(StringsSources, ReadNoMoreThanTheirBuffersTake)
+{
+    std::string ini = "[String]\nA = *A\n[*A]\n";
+    for (int i = 0; i < 1000; ++i)
+        ini += "k" + std::to_string(1000 + i) + "=v\n"; // 8 bytes with the end of each
+    StringSources sources = Read(ini);
+    EXPECT_EQ(512u, LinesAt(sources, 0).size()); // the last one is cut
+    ini = "[String]\n";
+    for (int i = 0; i < 1000; ++i)
+        ini += "k" + std::to_string(1000 + i) + "=v\n";
+    EXPECT_EQ(128u, Read(ini).lists.size());
+    EXPECT_THAT(LinesAt(Read("[String]\nA = *" + std::string(63, 'x') + "\n[*" +
+                             std::string(62, 'x') + "]\nk = v\n"),
+                        0),
+                ElementsAre("k = v"));
+}
+
+TEST_F(StringsSources, BeginWithTheOnlyFile)
+{
+    Load("");
+    StringSources sources = Read(TwoLists);
+    for (int remembered : {-3, -1, 0, 7})
+        EXPECT_EQ(0, Strings_FitSource(&sources, remembered)) << remembered;
+}
+
+TEST_F(StringsSources, BeginWithTheRememberedOneWhileItIsThere)
+{
+    StringSources none = Read(TwoLists);
+    EXPECT_EQ(STRINGS_OF_ALL_FILES, Strings_FitSource(&none, 0));
+    Load("");
+    Load("");
+    StringSources sources = Read(TwoLists);
+    for (int there : {-3, -2, -1, 0, 1})
+        EXPECT_EQ(there, Strings_FitSource(&sources, there));
+    for (int gone : {-4, -100, 2, 100})
+        EXPECT_EQ(STRINGS_OF_ALL_FILES, Strings_FitSource(&sources, gone)) << gone;
+}
+
+TEST_F(StringsSources, CanBeChangedWhenTheyAreAWritableFile)
+{
+    BibFile *writable = Load("@string{a = {A}}\n");
+    Load("@string{a = {A}}\n")->readOnly = 1;
+    StringSources sources = Read(TwoLists);
+    EXPECT_EQ(writable, Strings_WritableFile(&sources, 0));
+    for (int source : {-3, -2, -1, 1, 2})
+        EXPECT_EQ(nullptr, Strings_WritableFile(&sources, source)) << source;
+}
+
+TEST(StringsKeyOf, EndsAtTheFirstBlank)
+{
+    EXPECT_EQ("jan", Strings_KeyOf("jan = January"));
+    EXPECT_EQ("stray", Strings_KeyOf("stray line"));
+    EXPECT_EQ("alone", Strings_KeyOf("alone"));
+}
+
+TEST(StringsFindCommand, KnowsThreeLetters)
+{
+    const struct {
+        int key, id;
+        const char *label;
+    } rows[] = {{'A', 6003, "Add New String ..."},
+                {'D', 6004, "Delete String ..."},
+                {'E', 6005, "Edit String ..."}};
+    for (const auto &row : rows) {
+        const StringCommand *command = Strings_FindCommand(row.key);
+        ASSERT_TRUE(command);
+        EXPECT_EQ(row.id, command->id);
+        EXPECT_STREQ(row.label, command->label);
+    }
+    for (int key : {0, int('B'), int('a'), 27})
+        EXPECT_EQ(nullptr, Strings_FindCommand(key)) << key;
+}
+
+// --- One file's abbreviations ---
+
+using StringKeys = StringSourcesTest;
+
+TEST_F(StringKeys, AreTakenInTheSameFileInAnyCase)
+{
+    BibFile *file = Load("@string{Acm = {A}}\n");
+    BibFile *other = Load("@string{other = {O}}\n");
+    EXPECT_EQ(NAME_TAKEN, String_CheckNewKey(file, {"ACM", true}));
+    EXPECT_EQ(NAME_OK, String_CheckNewKey(other, {"ACM", true}));
+    EXPECT_EQ(NAME_OK, String_CheckNewKey(file, {"ac", true}));
+}
+
+TEST_F(StringKeys, HaveToBeReadable)
+{
+    BibFile *file = Load("");
+    EXPECT_EQ(NAME_EMPTY, String_CheckNewKey(file, {"", true}));
+    EXPECT_EQ(NAME_BAD_CHARS, String_CheckNewKey(file, {"a#b", true}));
+    EXPECT_EQ(NAME_UNWRITABLE, String_CheckNewKey(file, {"1st", true}));
+    EXPECT_EQ(NAME_MISFIT, String_CheckNewKey(file, {"\xFF", false}));
+}
+
+using StringList = StringSourcesTest;
+
+TEST_F(StringList, GetsNewOnesAtItsEnd)
+{
+    BibFile *file = Load("@string{b = {B}}\n");
+    EXPECT_EQ(1, String_Add(file, "a", "A \2b\5"));
+    EXPECT_EQ(1, String_Add(file, "c", ""));
+    EXPECT_THAT(NamesIn(file), ElementsAre("b", "a", "c"));
+    EXPECT_STREQ("A \2b\5", file->strings->next->value);
+    BibFile *empty = Load("");
+    EXPECT_EQ(1, String_Add(empty, "a", "A"));
+    EXPECT_THAT(NamesIn(empty), ElementsAre("a"));
+}
+
+TEST_F(StringList, LosesAnyOfItsOwn)
+{
+    BibFile *file = Load("@string{a = {A}}\n@string{b = {B}}\n@string{c = {C}}\n");
+    String_Remove(file, file->strings->next);
+    EXPECT_THAT(NamesIn(file), ElementsAre("a", "c"));
+    String_Remove(file, file->strings);
+    String_Remove(file, file->strings);
+    EXPECT_EQ(nullptr, file->strings);
+}
+
+TEST_F(StringList, TakesAnotherValue)
+{
+    BibFile *file = Load("@string{a = {A}}\n");
+    EXPECT_EQ(1, String_SetValue(file->strings, "Another"));
+    EXPECT_STREQ("Another", file->strings->value);
+}
+
+TEST_F(StringList, FindsTheOneInARowAmongNamesakes)
+{
+    BibFile *file = Load("@string{a = {1}}\n@string{b = {2}}\n@string{A = {3}}\n");
+    EXPECT_STREQ("1", String_Find(file, 0, "a")->value);
+    EXPECT_STREQ("3", String_Find(file, 2, "a")->value);
+    EXPECT_STREQ("1", String_Find(file, 1, "a")->value); // that row has another name
+    EXPECT_STREQ("1", String_Find(file, 9, "a")->value);
+    EXPECT_EQ(nullptr, String_Find(file, 0, "c"));
+}

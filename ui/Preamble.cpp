@@ -1,0 +1,209 @@
+#include "ui/Preamble.h"
+
+#include <wx/choice.h>
+#include <wx/clipbrd.h>
+#include <wx/msgdlg.h>
+#include <wx/sizer.h>
+#include <wx/textbuf.h>
+#include <wx/textctrl.h>
+
+#include "app/Companion.h"
+#include "app/Log.h"
+#include "ui/Cartulo.h"
+#include "ui/Dialogs.h"
+#include "ui/DisplayText.h"
+#include "ui/PreambleText.h"
+#include "ui/QListBox.h"
+#include "ui/Values.h"
+
+static const char QuestionCaption[] = "Editing Preamble Question";
+
+wxBEGIN_EVENT_TABLE(Cartulo_Preamble, wxDialog)
+    EVT_TEXT_PASTE(ID_PREAMBLE_TEXT, Cartulo_Preamble::OnPaste)
+    EVT_CHOICE(ID_PREAMBLE_FILE, Cartulo_Preamble::OnFile)
+    EVT_BUTTON(wxID_OK, Cartulo_Preamble::OnOK)
+wxEND_EVENT_TABLE()
+
+static wxString AllPreambles(const BibFileSet *set)
+{
+    wxString text;
+    for (int i = 0; i < set->count; ++i)
+        text += StoreText(set->files[i]->preamble) + "\n";
+    return text;
+}
+
+Cartulo_Preamble::Cartulo_Preamble(Cartulo *panel)
+    : wxDialog(wxGetTopLevelParent(panel), wxID_ANY, "Editing Preamble", wxDefaultPosition,
+               wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
+      m_panel(panel)
+{
+    SetFont(wxFontInfo(10));
+    m_file = new wxChoice(this, ID_PREAMBLE_FILE);
+    m_text =
+        new wxTextCtrl(this, ID_PREAMBLE_TEXT, "There is no editable BIB-files", wxDefaultPosition,
+                       wxDefaultSize, wxTE_MULTILINE | WrapStyle(AllPreambles(panel->Files())));
+    m_text->SetFont(wxFontInfo(10).Family(wxFONTFAMILY_TELETYPE));
+    m_text->SetMinSize(FromDIP(wxSize(600, 200)));
+    FillFiles();
+
+    wxFlexGridSizer *heading = Dialog_CreateRows(this);
+    Dialog_AddRow(heading, this, "Show Preamble of BIB-file:", m_file);
+    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
+    column->Add(heading, wxSizerFlags().Expand().Border(wxBOTTOM, FromDIP(DIALOG_BORDER)));
+    column->Add(m_text, wxSizerFlags(1).Expand());
+    Dialog_Finish(this, column, m_text);
+}
+
+void Cartulo_Preamble::FillFiles()
+{
+    const BibFileSet *set = m_panel->Files();
+    if (set->count == 0) {
+        TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR);
+        m_text->SetEditable(false);
+        return;
+    }
+    for (int i = 0; i < set->count; ++i)
+        m_file->Append(ShortText(m_file, PathText(set->files[i]->baseName), DIALOG_ITEM));
+    PreambleFile = Preamble_FitFile(set, PreambleFile);
+    m_file->SetSelection(PreambleFile);
+    UpdatePreamble();
+}
+
+// Of files with one name, the last is shown, and chosen.
+void Cartulo_Preamble::UpdatePreamble()
+{
+    const BibFileSet *set = m_panel->Files();
+    const char *name = set->files[PreambleFile]->baseName;
+    TNSMessage("INFO: Cartulo_Preamble::UpdatePreamble ", PathText(name).utf8_str(), TNS_ACTION);
+    PreambleFile = Preamble_FindFile(set, name);
+    const BibFile *file = set->files[PreambleFile];
+    m_file->SetSelection(PreambleFile);
+    m_file->SetToolTip(FileTip(file));
+    m_text->ChangeValue(StoreText(file->preamble));
+    m_text->SetInsertionPoint(0);
+    m_text->SetEditable(!file->readOnly);
+    m_filled = m_text->GetValue();
+}
+
+// The file that is shown, with what `text` becomes of its preamble; null when that can't be
+// changed, or is what it was.
+BibFile *Cartulo_Preamble::ChangedFile(std::string *text) const
+{
+    const BibFileSet *set = m_panel->Files();
+    BibFile *file = set->count > 0 ? set->files[PreambleFile] : nullptr;
+    if (!file || file->readOnly || m_text->GetValue() == m_filled)
+        return nullptr;
+    *text = Preamble_Read(m_text->GetValue().ToStdWstring());
+    return *text == file->preamble ? nullptr : file;
+}
+
+// False when it is too long, or the user does not want to lose what can't be stored.
+bool Cartulo_Preamble::MayStore(BibFile *file, const std::string &text)
+{
+    std::string reason = Preamble_CheckSize(text);
+    if (!reason.empty()) {
+        Box_Warn(this, GetTitle(), StoreText(reason.c_str()));
+        return false;
+    }
+    std::wstring losses = Value_Losses(L"PREAMBLE", m_text->GetValue().ToStdWstring(),
+                                       Value_HoldsGuillemets(file->preamble));
+    return losses.empty() ||
+           Box_Ask(this, QuestionCaption, losses + Value_LossesQuestion, wxNO_DEFAULT);
+}
+
+void Cartulo_Preamble::Store(BibFile *file, const std::string &text)
+{
+    Preamble_Store(file, text);
+    m_panel->SetModified(PreambleFile);
+}
+
+// False when the user wants to stay, or has to.
+bool Cartulo_Preamble::LeaveFile()
+{
+    std::string text;
+    BibFile *file = ChangedFile(&text);
+    if (!file)
+        return true;
+    int answer = wxMessageBox("There are changes in current preamble text.\n\n Do you want to "
+                              "accept they ?",
+                              QuestionCaption, wxYES_NO | wxICON_QUESTION, this);
+    if (answer != wxYES)
+        return answer == wxNO;
+    if (!MayStore(file, text))
+        return false;
+    Store(file, text);
+    return true;
+}
+
+void Cartulo_Preamble::OnFile(wxCommandEvent &)
+{
+    int chosen = m_file->GetSelection();
+    if (chosen == PreambleFile)
+        return;
+    if (!LeaveFile()) {
+        m_file->SetSelection(PreambleFile);
+        return;
+    }
+    PreambleFile = chosen;
+    UpdatePreamble();
+}
+
+// Its line ends are those of Enter: CR LF would end pieces within braces.
+void Cartulo_Preamble::OnPaste(wxClipboardTextEvent &event)
+{
+    wxClipboardLocker lock;
+    wxTextDataObject data;
+    if (!lock || !m_text->IsEditable() || !wxTheClipboard->GetData(data)) {
+        event.Skip();
+        return;
+    }
+    m_text->WriteText(wxTextBuffer::Translate(data.GetText(), wxTextFileType_Unix));
+}
+
+static bool CopyText(const wxString &text)
+{
+    wxString unixText = wxTextBuffer::Translate(text, wxTextFileType_Unix);
+    wxClipboardLocker lock;
+    return !!lock && wxTheClipboard->SetData(new wxTextDataObject(unixText));
+}
+
+// Tells of the pieces that can't be written. True when there are some; what was typed is in the
+// clipboard then, as the window closes.
+bool Cartulo_Preamble::Refuse(const std::string &text)
+{
+    std::vector<PreambleFault> faults = Preamble_Check(text);
+    for (const PreambleFault &fault : faults)
+        Box_Warn(this, "Editing Preamble - Syntax Error",
+                 BoundedText(StoreText(fault.piece.c_str())) + "\n:" + fault.reason +
+                     "\n\nWrong preamble can;t be accepted.\nFix it and then try again.");
+    return !faults.empty();
+}
+
+// False when the window has to stay open.
+bool Cartulo_Preamble::Accept()
+{
+    std::string text;
+    BibFile *file = ChangedFile(&text);
+    if (!file) {
+        AppLog("Editing Preamble: ", "Preamble was not changed");
+        return true;
+    }
+    AppLog("Editing Preamble: ", "Preamble was changed - save it.");
+    if (!Refuse(text)) {
+        bool stored = MayStore(file, text);
+        if (stored)
+            Store(file, text);
+        return stored;
+    }
+    if (!CopyText(m_text->GetValue()))
+        return false;
+    ShowStatus(m_panel, "The preamble is as it was; what you typed is in the clipboard.");
+    return true;
+}
+
+void Cartulo_Preamble::OnOK(wxCommandEvent &event)
+{
+    TNSMessage("INFO: ", "Cartulo_Preamble::OnOK", TNS_ACTION);
+    if (Accept())
+        event.Skip(); // closes
+}

@@ -1,0 +1,41 @@
+// ui/Preamble.h - the window for the preambles of the open files.
+#pragma once
+
+#include <wx/dialog.h>
+
+#include <string>
+
+#include "store/BibStore.h"
+
+class Cartulo;
+class wxChoice;
+class wxClipboardTextEvent;
+class wxTextCtrl;
+
+enum { ID_PREAMBLE_FILE = 6001, ID_PREAMBLE_TEXT };
+
+class Cartulo_Preamble : public wxDialog
+{
+public:
+    explicit Cartulo_Preamble(Cartulo *panel); // outlives the dialog
+
+private:
+    void FillFiles();
+    void UpdatePreamble();
+    BibFile *ChangedFile(std::string *text) const;
+    bool MayStore(BibFile *file, const std::string &text);
+    void Store(BibFile *file, const std::string &text);
+    bool LeaveFile();
+    bool Refuse(const std::string &text);
+    bool Accept();
+    void OnFile(wxCommandEvent &event);
+    void OnPaste(wxClipboardTextEvent &event);
+    void OnOK(wxCommandEvent &event);
+
+    Cartulo *m_panel;
+    wxChoice *m_file; // child windows
+    wxTextCtrl *m_text;
+    wxString m_filled; // what m_text was filled with
+
+    wxDECLARE_EVENT_TABLE();
+};

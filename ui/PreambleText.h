@@ -1,0 +1,36 @@
+// ui/PreambleText.h - the preamble of a file, as the text of a control and back.
+//
+// In the store each piece of a preamble ends with CR LF, and a line feed belongs to the piece that
+// it stands in. The control is filled with the same characters, and adds a line feed for each
+// Enter.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "store/BibFileSet.h"
+
+extern int PreambleFile; // index of the file that the window showed last
+
+// The index to begin with: the remembered one, or the last file's. -1 without files.
+int Preamble_FitFile(const BibFileSet *set, int index);
+
+// The last one of the files of this name; -1 for none.
+int Preamble_FindFile(const BibFileSet *set, const char *baseName);
+
+// What the control holds, as the store keeps it. The ends of pieces stay; a line feed outside
+// braces ends a piece, one inside is part of it.
+std::string Preamble_Read(const std::wstring &typed);
+
+// Why the text can't be stored, for the user; "" when it is short enough.
+std::string Preamble_CheckSize(const std::string &text);
+
+// A piece that can't be written as BibTeX.
+struct PreambleFault {
+    std::string piece;  // store text
+    const char *reason; // static text
+};
+std::vector<PreambleFault> Preamble_Check(const std::string &text);
+
+// The text is of an allowed size.
+void Preamble_Store(BibFile *file, const std::string &text);

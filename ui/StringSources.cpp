@@ -1,0 +1,184 @@
+#include "ui/StringSources.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <cstring>
+
+#include "store/Ascii.h"
+#include "store/Profile.h"
+
+// Of buffers, in bytes with the end: what does not fit is not read.
+enum { NAMES_SIZE = 1024, SECTION_NAME_SIZE = 64, LIST_SIZE = 4096 };
+
+int StringSource = STRINGS_OF_ALL_FILES;
+
+// --- Sources ---
+
+static std::vector<std::string> ReadSection(const char *section, size_t size, const char *ini)
+{
+    std::vector<char> buffer(size);
+    Profile_GetSection(section, buffer.data(), size, ini);
+    std::vector<std::string> lines;
+    for (const char *line = buffer.data(); *line; line += strlen(line) + 1)
+        lines.push_back(line);
+    return lines;
+}
+
+StringSources Strings_Sources(const BibFileSet *set, const std::string &ini)
+{
+    StringSources sources = {set, ini, {}};
+    for (const std::string &line : ReadSection("String", NAMES_SIZE, ini.c_str())) {
+        size_t equals = line.find('=');
+        if (equals != line.npos)
+            sources.lists.push_back(line.substr(0, equals));
+    }
+    return sources;
+}
+
+int Strings_FirstFile(const StringSources *sources)
+{
+    return static_cast<int>(sources->lists.size()) + 1;
+}
+
+int Strings_FitSource(const StringSources *sources, int source)
+{
+    if (sources->set->count == 1)
+        return 0;
+    bool isThere = source < sources->set->count && source >= -Strings_FirstFile(sources);
+    return isThere ? source : STRINGS_OF_ALL_FILES;
+}
+
+// --- Lines ---
+
+static std::string Line(const std::string &key, const std::string &value)
+{
+    return key + " = " + value;
+}
+
+static std::vector<std::string> ListLines(const std::string &list, const char *ini)
+{
+    char section[SECTION_NAME_SIZE];
+    Profile_GetString("String", list.c_str(), "", section, sizeof section, ini);
+    std::vector<std::string> lines = ReadSection(section, LIST_SIZE, ini);
+    for (std::string &line : lines) {
+        size_t equals = line.find('=');
+        if (equals != line.npos)
+            line = Line(line.substr(0, equals), line.substr(equals + 1));
+    }
+    return lines;
+}
+
+static void AppendLines(std::vector<std::string> *lines, const BibFile *file)
+{
+    for (const BibString *string = file->strings; string; string = string->next)
+        lines->push_back(Line(string->name, string->value));
+}
+
+std::vector<std::string> Strings_Lines(const StringSources *sources, int source)
+{
+    if (source < STRINGS_OF_ALL_FILES)
+        return ListLines(sources->lists[source + Strings_FirstFile(sources)], sources->ini.c_str());
+    std::vector<std::string> lines;
+    for (int i = 0; i < sources->set->count; ++i)
+        if (source == i || source == STRINGS_OF_ALL_FILES)
+            AppendLines(&lines, sources->set->files[i]);
+    return lines;
+}
+
+std::string Strings_KeyOf(const std::string &line)
+{
+    return line.substr(0, line.find(' '));
+}
+
+BibFile *Strings_WritableFile(const StringSources *sources, int source)
+{
+    if (source < 0 || source >= sources->set->count)
+        return nullptr;
+    BibFile *file = sources->set->files[source];
+    return file->readOnly ? nullptr : file;
+}
+
+// --- Commands ---
+
+static const StringCommand Commands[] = {
+    {'A', ID_STRING_ADD, "Add New String ..."},
+    {'D', ID_STRING_REMOVE, "Delete String ..."},
+    {'E', ID_STRING_EDIT, "Edit String ..."},
+};
+
+const StringCommand *Strings_FindCommand(int key)
+{
+    for (const StringCommand &command : Commands)
+        if (command.key == key)
+            return &command;
+    return nullptr;
+}
+
+// --- One file's abbreviations ---
+
+static bool GoesBy(const BibString *string, const char *key)
+{
+    return Ascii_Compare(string->name, key) == 0;
+}
+
+BibString *String_Find(const BibFile *file, int row, const char *key)
+{
+    BibString *first = nullptr;
+    for (BibString *string = file->strings; string; string = string->next, --row) {
+        if (!GoesBy(string, key))
+            continue;
+        if (row == 0)
+            return string;
+        if (!first)
+            first = string;
+    }
+    return first;
+}
+
+NameVerdict String_CheckNewKey(const BibFile *file, const TypedKey &key)
+{
+    NameVerdict form = Name_Check(key);
+    if (form != NAME_OK)
+        return form;
+    return String_Find(file, 0, key.text.c_str()) ? NAME_TAKEN : NAME_OK;
+}
+
+int String_Add(BibFile *file, const char *key, const char *value)
+{
+    BibString *string = static_cast<BibString *>(Bib_Alloc(sizeof(BibString)));
+    char *name = Bib_CopyText(key, strlen(key));
+    char *copy = Bib_CopyText(value, strlen(value));
+    if (!string || !name || !copy) {
+        free(string);
+        free(name);
+        free(copy);
+        return 0;
+    }
+    *string = {nullptr, name, copy};
+    BibString **end = &file->strings;
+    while (*end)
+        end = &(*end)->next;
+    *end = string;
+    return 1;
+}
+
+int String_SetValue(BibString *string, const char *value)
+{
+    char *copy = Bib_CopyText(value, strlen(value));
+    if (!copy)
+        return 0;
+    free(string->value);
+    string->value = copy;
+    return 1;
+}
+
+void String_Remove(BibFile *file, BibString *string)
+{
+    BibString **link = &file->strings;
+    while (*link != string)
+        link = &(*link)->next;
+    *link = string->next;
+    free(string->value);
+    free(string->name);
+    free(string);
+}

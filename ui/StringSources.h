@@ -1,0 +1,64 @@
+// ui/StringSources.h - the abbreviations that the strings window shows and changes.
+//
+// A source tells whose they are: the index of a file, STRINGS_OF_ALL_FILES, or, below that, a list
+// of the INI file (-2 is the last list). So the lists, all files and each file stand in this order
+// in a choice, and a source becomes a position there when the position of the first file is added.
+//
+// Names and values are store text.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "store/BibFileSet.h"
+#include "ui/Keys.h"
+
+enum { STRINGS_OF_ALL_FILES = -1 };
+enum { ID_STRING_SOURCE = 6001, ID_STRING_ADD = 6003, ID_STRING_REMOVE, ID_STRING_EDIT };
+
+extern int StringSource; // what the window showed last; of all files at first
+
+struct StringSources {
+    const BibFileSet *set;          // outlives the record
+    std::string ini;                // path of the INI file
+    std::vector<std::string> lists; // the names of its lists, as [String] has them
+};
+StringSources Strings_Sources(const BibFileSet *set, const std::string &ini);
+
+// Position of the first file in the choice.
+int Strings_FirstFile(const StringSources *sources);
+
+// The source to begin with: of the only file, of the remembered source, or of all files when that
+// is gone.
+int Strings_FitSource(const StringSources *sources, int source);
+
+// A line for each abbreviation, like "jan = January"; those of a file in the order of its list.
+std::vector<std::string> Strings_Lines(const StringSources *sources, int source);
+std::string Strings_KeyOf(const std::string &line); // its text up to the first blank
+
+// The file whose abbreviations may be changed now; null when the source is no file or read-only.
+BibFile *Strings_WritableFile(const StringSources *sources, int source);
+
+// The key that stands for a command in the window; null for none. `key` is an upper-case letter.
+struct StringCommand {
+    int key;
+    int id;
+    const char *label; // for the log
+};
+const StringCommand *Strings_FindCommand(int key);
+
+// --- One file's abbreviations ---
+
+// For a new one: taken when the file has it already, ignoring case; other files do not matter.
+NameVerdict String_CheckNewKey(const BibFile *file, const TypedKey &key);
+
+// The abbreviation in a row of the file's lines if it goes by `key`, ignoring case, else the first
+// that does (a file may define one name more than once); null for none.
+BibString *String_Find(const BibFile *file, int row, const char *key);
+
+// These return 0, with nothing changed, when memory is out.
+int String_Add(BibFile *file, const char *key, const char *value); // at the end of its list
+int String_SetValue(BibString *string, const char *value);
+
+// Unlinks and frees it; entries may refer to it still. It is one of that file.
+void String_Remove(BibFile *file, BibString *string);

@@ -1,0 +1,397 @@
+#include "ui/Strings.h"
+
+#include <algorithm>
+
+#include <wx/choice.h>
+#include <wx/listbox.h>
+#include <wx/msgdlg.h>
+#include <wx/sizer.h>
+#include <wx/stattext.h>
+#include <wx/textctrl.h>
+
+#include "app/Companion.h"
+#include "app/Icons.h"
+#include "app/Log.h"
+#include "app/Native.h"
+#include "ui/Cartulo.h"
+#include "ui/Dialogs.h"
+#include "ui/DisplayText.h"
+#include "ui/QListBox.h"
+#include "ui/Values.h"
+
+static const char Caption[] = "Editing Strings"; // also of the boxes
+
+// --- The list ---
+
+wxBEGIN_EVENT_TABLE(Cartulo_Strings, wxDialog)
+    EVT_BUTTON(wxID_OK, Cartulo_Strings::OnOK)
+    EVT_CHOICE(ID_STRING_SOURCE, Cartulo_Strings::OnSource)
+    EVT_BUTTON(ID_STRING_ADD, Cartulo_Strings::OnAdd)
+    EVT_BUTTON(ID_STRING_REMOVE, Cartulo_Strings::OnRemove)
+    EVT_BUTTON(ID_STRING_EDIT, Cartulo_Strings::OnEdit)
+    EVT_LISTBOX_DCLICK(wxID_ANY, Cartulo_Strings::OnActivate)
+    EVT_CHAR_HOOK(Cartulo_Strings::OnCharHook)
+wxEND_EVENT_TABLE()
+
+Cartulo_Strings::Cartulo_Strings(Cartulo *panel, wxTextCtrl *target)
+    : wxDialog(wxGetTopLevelParent(panel), wxID_ANY, Caption, wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
+      m_panel(panel), m_target(target), m_sources(Strings_Sources(panel->Files(), panel->Ini()))
+{
+    TNSMessage("INFO: Cartulo_Strings::Cartulo_Strings ", "Initialize", TNS_LIFECYCLE);
+    SetFont(wxFontInfo(10));
+    wxSizer *sourceRow = CreateSourceRow();
+    m_list = new wxListBox(this, wxID_ANY);
+    m_list->SetMinSize(FromDIP(wxSize(500, 300)));
+    wxBoxSizer *middle = new wxBoxSizer(wxHORIZONTAL);
+    middle->Add(m_list, wxSizerFlags(1).Expand());
+    middle->Add(CreateCommands(), wxSizerFlags().Border(wxLEFT, FromDIP(DIALOG_GAP)));
+
+    const int border = FromDIP(DIALOG_BORDER);
+    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
+    column->Add(sourceRow, wxSizerFlags().Expand().Border(wxALL, border));
+    column->Add(middle, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
+    column->Add(CreateClosers(), wxSizerFlags().Expand().Border(wxALL, border));
+    FillSources();
+    UpdateStrings();
+    SetSizerAndFit(column);
+    CentreOnParent();
+    m_list->SetFocus();
+}
+
+wxSizer *Cartulo_Strings::CreateSourceRow()
+{
+    m_source = new wxChoice(this, ID_STRING_SOURCE);
+    wxFlexGridSizer *row = Dialog_CreateRows(this);
+    Dialog_AddRow(row, this, "Show Strings of BIB-file:", m_source);
+    return row;
+}
+
+wxSizer *Cartulo_Strings::CreateCommands()
+{
+    static const struct {
+        int id;
+        const char *label, *tip, *icon;
+    } buttons[] = {
+        {ID_STRING_ADD, "&Add", "Add new string (Alt+A)", "list-add"},
+        {ID_STRING_REMOVE, "&Delete", "Remove currently selected string (Alt+D)", "list-remove"},
+        {ID_STRING_EDIT, "&Edit", "Edit value of currently selected string (Alt+E)", "list-edit"},
+    };
+    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
+    for (const auto &button : buttons) {
+        xBitmapButton *window = new xBitmapButton(this, button.id, button.label, button.icon);
+        window->SetToolTip(button.tip);
+        column->Add(window, wxSizerFlags().Expand().Border(wxBOTTOM, FromDIP(DIALOG_GAP)));
+    }
+    return column;
+}
+
+wxSizer *Cartulo_Strings::CreateClosers()
+{
+    wxButton *insert = new wxButton(this, wxID_OK, "Insert");
+    insert->Enable(m_target != nullptr);
+    wxStdDialogButtonSizer *buttons = new wxStdDialogButtonSizer;
+    buttons->AddButton(insert);
+    buttons->AddButton(new wxButton(this, wxID_CANCEL, "Close"));
+    buttons->Realize();
+    SetAffirmativeId(wxID_OK);
+    SetEscapeId(wxID_CANCEL);
+    return buttons;
+}
+
+void Cartulo_Strings::FillSources()
+{
+    const BibFileSet *set = m_sources.set;
+    wxArrayString items;
+    for (const std::string &list : m_sources.lists)
+        items.Add(StoreText(list.c_str()));
+    items.Add("*All Files*");
+    for (int i = 0; i < set->count; ++i)
+        items.Add(ShortText(m_source, PathText(set->files[i]->baseName), DIALOG_ITEM));
+    m_source->Append(items);
+    StringSource = Strings_FitSource(&m_sources, StringSource);
+    m_source->SetSelection(StringSource + Strings_FirstFile(&m_sources));
+}
+
+BibFile *Cartulo_Strings::SourceFile() const
+{
+    return Strings_WritableFile(&m_sources, StringSource);
+}
+
+void Cartulo_Strings::UpdateStrings()
+{
+    TNSMessage("INFO: Cartulo_Strings::UpdateStrings ", "", TNS_ACTION);
+    int row = std::max(m_list->GetSelection(), 0);
+    m_lines = Strings_Lines(&m_sources, StringSource);
+    wxArrayString items;
+    for (const std::string &line : m_lines)
+        items.Add(BoundedText(StoreText(line.c_str())));
+    m_list->Set(items);
+    Select(row);
+    m_source->SetToolTip(StringSource < 0 ? "" : FileTip(m_sources.set->files[StringSource]));
+    for (int id : {ID_STRING_ADD, ID_STRING_REMOVE, ID_STRING_EDIT})
+        FindWindow(id)->Enable(SourceFile() != nullptr);
+}
+
+// That row, or the last one when there are not so many.
+void Cartulo_Strings::Select(int row)
+{
+    row = std::min(row, int(m_lines.size()) - 1);
+    if (row < 0)
+        return;
+    m_list->SetSelection(row);
+    m_list->EnsureVisible(row);
+}
+
+std::string Cartulo_Strings::SelectedKey() const // "" when no row is selected
+{
+    int row = m_list->GetSelection();
+    return row == wxNOT_FOUND ? "" : Strings_KeyOf(m_lines[row]);
+}
+
+// Null when there is none that can be changed.
+BibString *Cartulo_Strings::SelectedString() const
+{
+    int row = m_list->GetSelection();
+    const BibFile *file = SourceFile();
+    if (!file || row == wxNOT_FOUND)
+        return nullptr;
+    std::string key = SelectedKey();
+    BibString *string = String_Find(file, row, key.c_str());
+    if (!string)
+        AppLog("INTERNAL-ERROR: Can't locate string key: ", key.c_str());
+    return string;
+}
+
+void Cartulo_Strings::OnSource(wxCommandEvent &)
+{
+    int source = m_source->GetSelection() - Strings_FirstFile(&m_sources);
+    if (source == StringSource)
+        return;
+    StringSource = source;
+    UpdateStrings();
+}
+
+// The new one is the last of its file.
+void Cartulo_Strings::OnAdd(wxCommandEvent &)
+{
+    TNSMessage("INFO: ", "Cartulo_Strings::OnAdd", TNS_ACTION);
+    if (!SourceFile())
+        return;
+    Cartulo_Strings_Edit dialog(this, "Creating New String Entry", nullptr);
+    if (dialog.ShowModal() != wxID_OK)
+        return;
+    UpdateStrings();
+    m_panel->SetModified(StringSource);
+    Select(int(m_lines.size()) - 1);
+}
+
+void Cartulo_Strings::OnEdit(wxCommandEvent &)
+{
+    TNSMessage("INFO: ", "Cartulo_Strings::OnEdit", TNS_ACTION);
+    BibString *string = SelectedString();
+    if (!string)
+        return;
+    Cartulo_Strings_Edit dialog(this, "Editing the String Entry", string);
+    if (dialog.ShowModal() != wxID_OK)
+        return;
+    UpdateStrings();
+    if (dialog.IsChanged())
+        m_panel->SetModified(StringSource);
+}
+
+void Cartulo_Strings::OnRemove(wxCommandEvent &)
+{
+    TNSMessage("INFO: ", "Cartulo_Strings::OnRemove", TNS_ACTION);
+    BibString *string = SelectedString();
+    if (!string)
+        return;
+    wxString line = m_list->GetStringSelection();
+    String_Remove(SourceFile(), string);
+    UpdateStrings();
+    m_panel->SetModified(StringSource);
+    ShowStatus(m_panel, "The string is deleted: " + line);
+}
+
+void Cartulo_Strings::OnActivate(wxCommandEvent &)
+{
+    wxCommandEvent press(wxEVT_BUTTON, m_target ? int(wxID_OK) : int(ID_STRING_EDIT));
+    ProcessWindowEvent(press);
+}
+
+void Cartulo_Strings::Insert(const wxString &text)
+{
+    AppLog("INFO:(1) ", text.utf8_str());
+    long at = m_target->GetInsertionPoint();
+    AppLog(wxString::Format("INFO: at %ld insert ", at).utf8_str(), text.utf8_str());
+    wxString before = m_target->GetValue();
+    m_target->Replace(at, at, text);
+    if (m_target->GetValue().length() == before.length() + text.length())
+        return;
+    m_target->ChangeValue(before);
+    m_target->SetInsertionPoint(at);
+    Box_Warn(this, Caption,
+             "The value would be too long: a field can be edited up to 65,534 bytes.");
+}
+
+void Cartulo_Strings::OnOK(wxCommandEvent &event)
+{
+    TNSMessage("INFO: ", "Cartulo_Strings::OnOK", TNS_ACTION);
+    event.Skip(); // closes
+    if (!m_target)
+        return;
+    AppLog("Cartulo_Strings::OnOK, Insert ");
+    if (m_list->GetSelection() == wxNOT_FOUND)
+        TNSMessage("WARNING: ", "Cartulo_Strings::OnOK has no selection.", TNS_WARNING);
+    else
+        Insert(L"\xAB" + StoreText(SelectedKey().c_str()) + L"\xBB");
+}
+
+// The letters do what they do with Alt, wherever the focus is: nothing is typed here.
+void Cartulo_Strings::OnCharHook(wxKeyEvent &event)
+{
+    TNSMessage("INFO: Cartulo_Strings::OnCharHook ", "", TNS_LIFECYCLE);
+    int key = event.GetKeyCode();
+    const StringCommand *command = Strings_FindCommand(key ? key : Native_LatinLetter(event));
+    if (!command) {
+        event.Skip();
+        return;
+    }
+    if (!SourceFile()) {
+        wxBell();
+        return;
+    }
+    TNSMessage("INFO: Cartulo_Strings::OnCharHook ", command->label, TNS_LIFECYCLE);
+    wxCommandEvent press(wxEVT_BUTTON, command->id);
+    ProcessWindowEvent(press);
+}
+
+// --- One abbreviation ---
+
+wxBEGIN_EVENT_TABLE(Cartulo_Strings_Edit, wxDialog)
+    EVT_BUTTON(wxID_OK, Cartulo_Strings_Edit::OnOK)
+wxEND_EVENT_TABLE()
+
+Cartulo_Strings_Edit::Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxString &title,
+                                           BibString *string)
+    : wxDialog(strings, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
+      m_file(strings->SourceFile()), m_string(string)
+{
+    SetFont(wxFontInfo(10));
+    m_key = new wxTextCtrl(this, ID_STRING_KEY);
+    m_value = new wxTextCtrl(this, ID_STRING_VALUE);
+    if (string)
+        Fill();
+    wxFlexGridSizer *rows = Dialog_CreateRows(this);
+    Dialog_AddRow(rows, this, "String Key:", m_key);
+    Dialog_AddRow(rows, this, "String Value:", m_value);
+    Dialog_Finish(this, rows, string ? m_value : m_key);
+    SetSize(strings->GetSize().x, GetSize().y);
+    CentreOnParent();
+}
+
+// A value that the control can't hold stays as it is.
+void Cartulo_Strings_Edit::Fill()
+{
+    m_key->ChangeValue(StoreText(m_string->name));
+    m_key->Disable();
+    wxString value = StoreText(m_string->value);
+    m_value->ChangeValue(value);
+    m_filled = m_value->GetValue();
+    if (m_filled == value)
+        return;
+    m_value->SetEditable(false);
+    m_value->SetToolTip("This value is too long to be shown in full.");
+}
+
+void Cartulo_Strings_Edit::Refuse(const wxString &text, wxTextCtrl *at)
+{
+    Box_Warn(this, Caption, text);
+    at->SetFocus();
+}
+
+// False when the user has to see to the key first.
+bool Cartulo_Strings_Edit::AcceptKey(const std::string &key, NameVerdict verdict)
+{
+    switch (verdict) {
+    case NAME_OK:
+        return true;
+    case NAME_EMPTY:
+        Refuse("Please enter key for new string.", m_key);
+        return false;
+    case NAME_MISFIT:
+        Refuse(StoreText(Key_MisfitText().c_str()), m_key);
+        return false;
+    case NAME_BAD_CHARS:
+        Box_OfferStripped(this, Caption,
+                          "String  key includes invalid characters.\n"
+                          "We will remove them and continue.",
+                          key, m_key);
+        m_key->SetFocus();
+        return false;
+    case NAME_UNWRITABLE:
+        Refuse("A string of this name can't be written to a BIB file.\nIt must not begin with a "
+               "digit, and hold no backslash or control character.",
+               m_key);
+        return false;
+    case NAME_TAKEN:
+        Refuse("String with the same key is already defined in this BIB-file.\nPlease choose "
+               "another key or use edit function to modify the string",
+               m_key);
+    }
+    return false;
+}
+
+bool Cartulo_Strings_Edit::AcceptValue(const std::string &value)
+{
+    const char *reason = Value_Check(value.c_str());
+    if (!reason)
+        return AcceptLosses();
+    Refuse(wxString("Wrong string syntax:\n\n") + reason + "\n\nFix the problem to continue.",
+           m_value);
+    return false;
+}
+
+bool Cartulo_Strings_Edit::AcceptLosses()
+{
+    bool textGuillemets = m_string && Value_HoldsGuillemets(m_string->value);
+    std::wstring losses = Value_Losses(m_key->GetValue().ToStdWstring(),
+                                       m_value->GetValue().ToStdWstring(), textGuillemets);
+    if (losses.empty() || Box_Ask(this, Caption, losses + Value_LossesQuestion, wxNO_DEFAULT))
+        return true;
+    m_value->SetFocus();
+    return false;
+}
+
+// `stored`: whether there was memory for it.
+bool Cartulo_Strings_Edit::Finish(int stored)
+{
+    m_isChanged = stored;
+    if (!stored)
+        Refuse("There is not enough memory for the string.", m_value);
+    return stored;
+}
+
+bool Cartulo_Strings_Edit::Add()
+{
+    TypedKey key = Key_Read(m_key->GetValue().ToStdWstring().c_str());
+    if (!AcceptKey(key.text, String_CheckNewKey(m_file, key)))
+        return false;
+    std::string value = Value_Read(m_value->GetValue().ToStdWstring());
+    return AcceptValue(value) && Finish(String_Add(m_file, key.text.c_str(), value.c_str()));
+}
+
+bool Cartulo_Strings_Edit::Edit()
+{
+    std::string value = Value_Read(m_value->GetValue().ToStdWstring());
+    if (m_value->GetValue() == m_filled || value == m_string->value)
+        return true;
+    return AcceptValue(value) && Finish(String_SetValue(m_string, value.c_str()));
+}
+
+void Cartulo_Strings_Edit::OnOK(wxCommandEvent &event)
+{
+    if (m_string ? Edit() : Add())
+        event.Skip(); // closes
+}

@@ -1,0 +1,82 @@
+// ui/Strings.h - the windows for abbreviations: the list of a source, and one of them.
+#pragma once
+
+#include <wx/dialog.h>
+
+#include <string>
+#include <vector>
+
+#include "ui/StringSources.h"
+
+class Cartulo;
+class wxChoice;
+class wxListBox;
+class wxTextCtrl;
+
+class Cartulo_Strings : public wxDialog
+{
+public:
+    // "Insert" puts the selected abbreviation into `target`, at its cursor; null: there is nothing
+    // to insert into. Both outlive the dialog.
+    Cartulo_Strings(Cartulo *panel, wxTextCtrl *target);
+
+    BibFile *SourceFile() const; // whose abbreviations can be changed now; null for none
+
+private:
+    wxSizer *CreateSourceRow();
+    wxSizer *CreateCommands();
+    wxSizer *CreateClosers();
+    void FillSources();
+    void UpdateStrings();
+    void Select(int row);
+    std::string SelectedKey() const;
+    BibString *SelectedString() const;
+    void Insert(const wxString &text);
+    void OnSource(wxCommandEvent &event);
+    void OnAdd(wxCommandEvent &event);
+    void OnRemove(wxCommandEvent &event);
+    void OnEdit(wxCommandEvent &event);
+    void OnActivate(wxCommandEvent &event);
+    void OnOK(wxCommandEvent &event);
+    void OnCharHook(wxKeyEvent &event);
+
+    Cartulo *m_panel;
+    wxTextCtrl *m_target;
+    StringSources m_sources;
+    std::vector<std::string> m_lines; // of the list, as the store has them
+    wxChoice *m_source;               // child windows
+    wxListBox *m_list;
+
+    wxDECLARE_EVENT_TABLE();
+};
+
+enum { ID_STRING_KEY = 6001, ID_STRING_VALUE };
+
+class Cartulo_Strings_Edit : public wxDialog
+{
+public:
+    // `string` is one of the file that `strings` shows; null: a new one for that.
+    Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxString &title, BibString *string);
+
+    bool IsChanged() const { return m_isChanged; } // the file's abbreviations are others now
+
+private:
+    void Fill();
+    void Refuse(const wxString &text, wxTextCtrl *at);
+    bool AcceptKey(const std::string &key, NameVerdict verdict);
+    bool AcceptValue(const std::string &value);
+    bool AcceptLosses();
+    bool Finish(int stored);
+    bool Add();
+    bool Edit();
+    void OnOK(wxCommandEvent &event);
+
+    BibFile *m_file;     // both outlive the dialog
+    BibString *m_string; // null for a new one
+    wxTextCtrl *m_key;   // child windows
+    wxTextCtrl *m_value;
+    wxString m_filled; // what the value's control made of the stored value
+    bool m_isChanged = false;
+
+    wxDECLARE_EVENT_TABLE();
+};
