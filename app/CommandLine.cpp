@@ -114,12 +114,18 @@ const char *NextToken(const char *text, char *out, size_t size)
 
 // --- The start of the program ---
 
+// The first option, which may be a capital letter, too.
+static bool IsBaseFolder(const char *token)
+{
+    return Ascii_CompareN(token, "-d", 2) == 0;
+}
+
 StartUp Command_StartUp(const char *commandLine)
 {
     StartUp start = {"Cartulo", "", commandLine};
     char first[TOKEN_SIZE];
     const char *rest = NextToken(commandLine, first, sizeof first);
-    if (!rest || Ascii_CompareN(first, "-d", 2) != 0)
+    if (!rest || !IsBaseFolder(first))
         return start;
     start.baseFolder = first + 2;
     if (start.baseFolder.size() >= BASE_FOLDER_SIZE) {
@@ -192,9 +198,15 @@ struct Command {
 
 } // namespace
 
+// With what an earlier command line has taken off the list.
 static void MoveToPrevious(Command *command)
 {
     BibFileSet *set = command->set;
+    for (int i = 0; i < set->asideCount; ++i)
+        FileSet_Append(set, set->aside[i]);
+    free(set->aside);
+    set->aside = nullptr;
+    set->asideCount = 0;
     command->previous.files = set->files;
     command->previous.count = set->count;
     set->files = nullptr;
@@ -211,10 +223,11 @@ static bool IsListed(const BibFileSet *set, const BibFile *file)
     return false;
 }
 
-// Saves a file that leaves the list. When that fails it goes back on, so that the user can act.
-static bool SaveOrKeep(Command *command, BibFile *file)
+// Saves a file that leaves the list, with one of the two functions for that. When it fails the file
+// goes back on, so that the user can act.
+static bool SaveOrKeep(Command *command, BibFile *file, int (*save)(BibFileSet *, BibFile *))
 {
-    if (!file->modified || FileSet_SaveOne(command->set, file))
+    if (!file->modified || save(command->set, file))
         return true;
     FileSet_Append(command->set, file);
     FileSet_AppendError(command->set,
@@ -239,6 +252,14 @@ static void SetBaseFolder(Command *command, const char *folder)
     ++command->result.errors;
 }
 
+// Drops those that are listed (again).
+static void KeepAside(BibFileSet *set)
+{
+    auto isListed = [set](const BibFile *file) { return IsListed(set, file); };
+    BibFile **end = set->aside + set->asideCount;
+    set->asideCount = static_cast<int>(std::remove_if(set->aside, end, isListed) - set->aside);
+}
+
 // Option i. The files that leave the list here are not closed.
 static void EmptyList(Command *command)
 {
@@ -249,7 +270,9 @@ static void EmptyList(Command *command)
     set->count = 0;
     for (int i = 0; i < count; ++i)
         if (!IsListed(set, files[i])) // else it is here twice and could not be saved
-            SaveOrKeep(command, files[i]);
+            SaveOrKeep(command, files[i], FileSet_SaveOne);
+    for (int i = 0; i < count; ++i)
+        FileSet_PutAside(set, files[i]);
     free(files);
 }
 
@@ -303,7 +326,7 @@ static void TakeOption(Command *command, const char *token)
 static void CloseFile(Command *command, BibFile *file)
 {
     AppLog("Close Unused Bib file: ", file->path);
-    if (!SaveOrKeep(command, file))
+    if (!SaveOrKeep(command, file, FileSet_SaveLast))
         return;
     Sys_UnlockFile(file->lockHandle);
     Bib_FreeFile(file);
@@ -378,12 +401,15 @@ static void TakeTokens(Command *command, const char *line)
 {
     char token[TOKEN_SIZE];
     line = SkipBlanks(line);
+    const char *first = line;
     while (const char *next = NextToken(line, token, sizeof token)) {
         if (next == line) {
             RefuseRest(command, line);
             return;
         }
-        if (*token == '-')
+        if (line == first && IsBaseFolder(token))
+            SetBaseFolder(command, token + 2);
+        else if (*token == '-')
             TakeOption(command, token);
         else
             TakeFile(command, token);
@@ -421,6 +447,7 @@ CommandResult Command_Process(BibFileSet *set, CommandState *state, const char *
     AppLog("Command: ", commandLine);
     TakeTokens(&command, commandLine);
     CloseUnused(&command, nullptr);
+    KeepAside(set);
     // Rows name their file by its place in the list, which reuse alone can change.
     if (command.result.changes == 0 && !SameList(set, &command.previous))
         command.result.changes = 1;

@@ -61,5 +61,5 @@ int Command_ResolveName(const CommandState *state, const char *token, std::strin
 // is refused as a whole. Where the tokenizer gets no further, the rest is refused.
 //
 // No changes are lost: a file that cannot be saved stays open, at the end of the list. Files that
-// the option -i takes off the list stay in memory and locked, and nobody lists them any more.
+// the option -i takes off the list are saved and stay locked until the next command line.
 CommandResult Command_Process(BibFileSet *set, CommandState *state, const char *commandLine);

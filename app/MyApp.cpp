@@ -95,17 +95,18 @@ bool MyApp::TakeInstance(const std::string &name)
     return !othersHoldIt;
 }
 
-bool MyApp::IsFirst(const char *commandLine)
+bool MyApp::IsFirst()
 {
     std::string name = "Quarlo-" + m_start.instance + "-" + Sys_LoginName();
     TNSMessage("INFO: Cartulo::Single ", name.c_str(), TNS_LIFECYCLE);
-    return TakeInstance(name) || !HandOver(name, commandLine);
+    return TakeInstance(name) || !HandOver(name);
 }
 
 // To the first instance, which may still be loading its files. False when that one has ended
 // instead, so that this is now the first.
-bool MyApp::HandOver(const std::string &name, const char *commandLine)
+bool MyApp::HandOver(const std::string &name)
 {
+    const char *commandLine = BuildLine();
     int32_t end = Sys_Milliseconds() + HAND_OVER_TIME;
     long window = FindFrame(m_start.instance.c_str());
     if (window != 0)
@@ -157,7 +158,7 @@ bool MyApp::OnInit()
         return false;
     m_start = Command_StartUp(commandLine);
     m_service = "/tmp/Quarlo-DDE-" + m_start.instance;
-    if (!m_start.baseFolder.empty() && !IsFirst(commandLine))
+    if (!m_start.baseFolder.empty() && !IsFirst())
         return false;
     wxInitAllImageHandlers();
     AppLog("Cartulo::OnInit --- ", "Names");

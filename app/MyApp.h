@@ -27,9 +27,9 @@ protected:
 private:
     const char *BuildLine();
     bool CheckParser();
-    bool IsFirst(const char *commandLine);
+    bool IsFirst();
     bool TakeInstance(const std::string &name);
-    bool HandOver(const std::string &name, const char *commandLine);
+    bool HandOver(const std::string &name);
     void Publish(long window);
     void OpenConfig();
     void OnActivateApp(wxActivateEvent &event);

@@ -355,10 +355,12 @@ static int KeyOf(const wxKeyEvent &event)
     }
 }
 
-// Enter presses the button that has the focus, as everywhere.
-static bool IsForButton(int key)
+// Enter presses the button that has the focus, as everywhere, and searches in the search field.
+bool MyFrame::IsForFocus(int key) const
 {
-    return key == WXK_RETURN && dynamic_cast<wxButton *>(wxWindow::FindFocus());
+    wxWindow *focus = FindFocus();
+    return key == WXK_RETURN && focus &&
+           (dynamic_cast<wxButton *>(focus) || (m_search && m_search->IsDescendant(focus)));
 }
 
 void MyFrame::OnCharHook(wxKeyEvent &event)
@@ -374,7 +376,7 @@ void MyFrame::OnCharHook(wxKeyEvent &event)
         return;
     bool alt = event.AltDown(), ctrl = event.ControlDown();
     int key = KeyOf(event);
-    if (IsForButton(key)) {
+    if (IsForFocus(key)) {
         event.Skip();
         return;
     }

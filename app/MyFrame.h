@@ -61,6 +61,7 @@ private:
     void OnSearch(wxCommandEvent &event);
     void OnCharHook(wxKeyEvent &event);
     bool LeaveSearch(int key);
+    bool IsForFocus(int key) const;
     void Correct();
     void OnMove(wxMoveEvent &event);
     void OnSize(wxSizeEvent &event);

@@ -13,16 +13,26 @@
 
 // --- The set ---
 
-void FileSet_Append(BibFileSet *set, BibFile *file)
+static void AppendFile(BibFile ***files, int *count, BibFile *file)
 {
-    size_t size = (static_cast<size_t>(set->count) + 1) * sizeof *set->files;
-    BibFile **files = static_cast<BibFile **>(realloc(set->files, size));
-    if (!files) {
+    size_t size = (static_cast<size_t>(*count) + 1) * sizeof **files;
+    BibFile **larger = static_cast<BibFile **>(realloc(*files, size));
+    if (!larger) {
         fprintf(stderr, "Can't allocate %d bytes\n", static_cast<int>(size));
         exit(1);
     }
-    set->files = files;
-    set->files[set->count++] = file;
+    *files = larger;
+    larger[(*count)++] = file;
+}
+
+void FileSet_Append(BibFileSet *set, BibFile *file)
+{
+    AppendFile(&set->files, &set->count, file);
+}
+
+void FileSet_PutAside(BibFileSet *set, BibFile *file)
+{
+    AppendFile(&set->aside, &set->asideCount, file);
 }
 
 static void AppendText(char **heapText, const std::string &more)
@@ -72,6 +82,8 @@ static void ClearSaveErrors(BibFileSet *set)
 
 void FileSet_Free(BibFileSet *set)
 {
+    for (int i = 0; i < set->asideCount; ++i)
+        FileSet_Append(set, set->aside[i]);
     for (int i = set->count - 1; i >= 0; --i) {
         if (IsRepeated(set, i))
             continue;
@@ -79,11 +91,12 @@ void FileSet_Free(BibFileSet *set)
         Bib_FreeFile(set->files[i]);
     }
     free(set->files);
+    free(set->aside);
     free(set->loadErrors);
     ClearSaveErrors(set);
-    set->files = nullptr;
+    set->files = set->aside = nullptr;
     set->loadErrors = nullptr;
-    set->count = 0;
+    set->count = set->asideCount = 0;
 }
 
 int FileSet_EntryCount(const BibFileSet *set)
@@ -188,7 +201,7 @@ int FileSet_Open(BibFileSet *set, const char *path)
 
 // --- Saving ---
 
-static int SaveRecord(BibFileSet *set, BibFile *file)
+static int SaveRecord(BibFileSet *set, BibFile *file, int isLast)
 {
     int wasLocked = file->lockHandle != 0;
     Sys_UnlockFile(file->lockHandle);
@@ -197,7 +210,7 @@ static int SaveRecord(BibFileSet *set, BibFile *file)
     if (!saved)
         AppendText(&set->saveErrors,
                    "File: `" + std::string(file->path) + "'\n" + Bib_SaveReason() + "\n");
-    if (!wasLocked)
+    if (!wasLocked || (saved && isLast))
         return saved;
     file->lockHandle = Sys_LockFile(file->path);
     if (file->lockHandle == 0)
@@ -208,7 +221,13 @@ static int SaveRecord(BibFileSet *set, BibFile *file)
 int FileSet_SaveOne(BibFileSet *set, BibFile *file)
 {
     ClearSaveErrors(set);
-    return SaveRecord(set, file);
+    return SaveRecord(set, file, 0);
+}
+
+int FileSet_SaveLast(BibFileSet *set, BibFile *file)
+{
+    ClearSaveErrors(set);
+    return SaveRecord(set, file, 1);
 }
 
 int FileSet_SaveAll(BibFileSet *set)
@@ -220,7 +239,7 @@ int FileSet_SaveAll(BibFileSet *set)
         if (!IsModified(set, i))
             continue;
         ++modified;
-        failed += !SaveRecord(set, set->files[i]);
+        failed += !SaveRecord(set, set->files[i], 0);
     }
     return modified > 0 && failed == 0;
 }

@@ -7,6 +7,8 @@
 struct BibFileSet {
     BibFile **files; // heap, `count` pointers, in the order of the command line
     int count;
+    BibFile **aside;  // heap, `asideCount` pointers: open files that a command line has taken off
+    int asideCount;   // the list; the next one lists them again or closes them
     char *loadErrors; // heap: what could not be opened, for the messages window; null when nothing
     char *saveErrors; // heap: what the last FileSet_SaveAll or FileSet_SaveOne could not write, one
                       // "File: `path'\nreason\n" each; null when it wrote everything
@@ -16,6 +18,7 @@ struct BibFileSet {
 };
 
 void FileSet_Append(BibFileSet *set, BibFile *file);
+void FileSet_PutAside(BibFileSet *set, BibFile *file);
 void FileSet_AppendError(BibFileSet *set, const char *format, ...)
     __attribute__((format(printf, 2, 3))); // to loadErrors
 void FileSet_Free(BibFileSet *set);        // unlocks and frees every file; saves nothing
@@ -36,6 +39,9 @@ int FileSet_Open(BibFileSet *set, const char *path);
 // Unlocks, writes and locks one file again. 1, or 0 when the write failed. A failed lock is
 // shown and logged, and leaves the file saved and unlocked.
 int FileSet_SaveOne(BibFileSet *set, BibFile *file);
+
+// The same for a file that is closed next: once it is saved, it stays unlocked.
+int FileSet_SaveLast(BibFileSet *set, BibFile *file);
 
 // Saves every modified file. -1 is never returned here: the question is the panel's.
 // 0 when nothing was modified or a write failed, 1 when all were saved.

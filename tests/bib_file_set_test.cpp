@@ -390,6 +390,21 @@ TEST_F(FileSet, LocksTheNewFileAfterSaving)
     EXPECT_EQ(2u, folder.Names().size());
 }
 
+TEST_F(FileSet, LeavesAFileUnlockedThatIsSavedForTheLastTime)
+{
+    BibFile *file = Open("a.bib", Good);
+    file->modified = 1;
+    EXPECT_EQ(1, FileSet_SaveLast(&set, file));
+    EXPECT_EQ(0, file->lockHandle);
+    EXPECT_FALSE(IsLocked(file->path));
+
+    BibFile *failing = Open("b.bib", Good);
+    failing->modified = 1;
+    failing->readOnly = 1;
+    EXPECT_EQ(0, FileSet_SaveLast(&set, failing));
+    EXPECT_NE(0, failing->lockHandle);
+}
+
 TEST_F(FileSet, LocksTheOldFileAgainAfterAFailure)
 {
     BibFile *file = Open("a.bib", Good);

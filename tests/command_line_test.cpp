@@ -814,6 +814,15 @@ TEST_F(CommandProcess, ResolvesLaterNamesAgainstTheFolderOfOptionD)
     EXPECT_STREQ("", state.baseFolder);
 }
 
+TEST_F(CommandProcess, TakesACapitalLetterForTheFolderThatComesFirst)
+{
+    fs::create_directory(folder + "sub");
+    WriteBib("sub/b.bib");
+    EXPECT_EQ(0, Run("\"-D" + folder + "sub/\" b").errors);
+    EXPECT_EQ((Tokens{"b.bib"}), Names());
+    EXPECT_EQ(folder + "sub/", state.baseFolder);
+}
+
 TEST_F(CommandProcess, RefusesAFolderThatDoesNotFit)
 {
     std::string longest(BASE_FOLDER_SIZE - 1, 'x');
@@ -846,17 +855,40 @@ TEST_F(CommandProcess, TakesFilesOffTheListAtOptionIWithoutClosingThem)
     EXPECT_EQ(1, file->inUse);
     EXPECT_NE(0, file->lockHandle);
     EXPECT_EQ(0, Logged("Cartulo: Close Unused Bib file: " + path));
-    FileSet_Append(&set, file); // to be freed
+}
+
+TEST_F(CommandProcess, ListsFilesAgainThatAnEarlierOptionITookOff)
+{
+    std::string path = WriteBib("a.bib");
+    WriteBib("b.bib");
+    Run("a");
+    BibFile *file = set.files[0];
+    Run("a -i b");
+    EXPECT_EQ(0, Run("b a").errors);
+    EXPECT_EQ((Tokens{"b.bib", "a.bib"}), Names());
+    EXPECT_EQ(file, set.files[1]);
+    EXPECT_EQ(0, file->readOnly);
+    EXPECT_NE(0, file->lockHandle);
+    EXPECT_EQ(0, set.asideCount);
+}
+
+TEST_F(CommandProcess, ClosesFilesThatAnEarlierOptionITookOff)
+{
+    std::string path = WriteBib("a.bib");
+    Run("a");
+    Run("a -i");
+    EXPECT_FALSE(CanBeLocked(path));
+    Run("");
+    EXPECT_EQ(1, Logged("Cartulo: Close Unused Bib file: " + path));
+    EXPECT_TRUE(CanBeLocked(path));
 }
 
 TEST_F(CommandProcess, ReportsAChangeWhenOptionIEmptiesTheList)
 {
     WriteBib("a.bib");
     Run("a");
-    BibFile *file = set.files[0];
     EXPECT_EQ(1, Run("a -i").changes);
     EXPECT_EQ(0, set.count);
-    FileSet_Append(&set, file);
 }
 
 TEST_F(CommandProcess, ListsAFileAgainThatIsNamedAfterOptionI)
@@ -889,7 +921,6 @@ TEST_F(CommandProcess, SavesModifiedFilesThatOptionITakesOffTheList)
     EXPECT_EQ(0, file->modified);
     EXPECT_NE(0, file->lockHandle);
     EXPECT_NE(std::string::npos, ReadText(path).find("Saved"));
-    FileSet_Append(&set, file);
 }
 
 TEST_F(CommandProcess, KeepsAFileListedThatCannotBeSavedAtOptionI)

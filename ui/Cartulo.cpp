@@ -34,6 +34,7 @@
 #include "ui/Schema.h"
 #include "ui/Strings.h"
 #include "ui/Theme.h"
+#include "ui/Values.h"
 
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, HELP_HEIGHT = 40 };
 enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window
@@ -383,8 +384,11 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *)
     if (m_list)
         m_list->Drop_Index();
     m_busy = true;
+    const EncodingRecord *encoding = Enc_Current();
     CommandResult result = Command_Process(&m_set, m_state, commandLine);
     m_busy = false;
+    if (Enc_Current() != encoding)
+        m_search = Value_Read(m_searchText);
     if (m_list) {
         m_list->Update_Index(IsOpen(&m_set, file, path) ? entry : nullptr, m_search.c_str());
         Arrange();
@@ -580,9 +584,8 @@ void Cartulo::OnSearch(wxCommandEvent &event)
         TNSMessage("ERROR: Cartulo::OnSearch ", "Uknown source", TNS_ERROR);
         return;
     }
-    std::wstring text = field->GetValue().ToStdWstring();
-    std::vector<char> narrow(text.size() + 1);
-    m_search = Enc_FromUnicode(narrow.data(), text.c_str());
+    m_searchText = field->GetValue().ToStdWstring();
+    m_search = Value_Read(m_searchText);
     TNSMessage("INFO: Cartulo::OnSearch ", StoreText(m_search.c_str()).utf8_str(), TNS_ACTION);
     m_list->Update_Index(m_entry, m_search.c_str());
     bool found = m_list->GetItemCount() > 0 || m_search.empty();

@@ -165,7 +165,8 @@ private:
     BibEntry *m_entry = nullptr; // owned by its file; null whenever that may be freed
     int m_file = -1;             // index of the file that holds m_entry
     std::string m_typeName;      // of the current entry, as it is chosen now
-    std::string m_search;        // store text
+    std::wstring m_searchText;   // what the search field holds
+    std::string m_search;        // the same as store text
     bool m_isPainted = false;
     bool m_editMode = false; // else the list is in use
     bool m_busy = false;     // see IsBusy

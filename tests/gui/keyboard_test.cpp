@@ -6,6 +6,7 @@
 #include <wx/srchctrl.h>
 #include <wx/uiaction.h>
 
+#include "app/Companion.h"
 #include "app/Ids.h"
 #include "ui/Cartulo.h"
 #include "ui/QListBox.h"
@@ -35,6 +36,25 @@ TEST_F(Keyboard, MovesThroughTheListWithTheArrows)
     keys.Char(WXK_DOWN);
     EXPECT_TRUE(WaitFor([this] { return List()->GetSelection() == 1; }));
     EXPECT_EQ((Field{"title", "Second"}), ShownFields().at(0));
+}
+
+TEST_F(Keyboard, SearchesWithEnterInTheSearchField)
+{
+    keys.Char('F', wxMOD_CONTROL);
+    ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
+    keys.Text("second");
+    EXPECT_TRUE(WaitFor([this] { return List()->GetItemCount() == 1; }));
+    for (int key : {int(WXK_RETURN), int(WXK_NUMPAD_ENTER)}) {
+        ForgetLog();
+        keys.Char(key);
+        std::vector<LogLine> log;
+        EXPECT_TRUE(WaitFor([&] {
+            for (const LogLine &line : TakeLog("INFO: Cartulo::On"))
+                log.push_back(line);
+            return !log.empty();
+        })) << key;
+        EXPECT_EQ((std::vector<LogLine>{{"INFO: Cartulo::OnSearch second", TNS_ACTION}}), log);
+    }
 }
 
 TEST_F(Keyboard, SearchesWithCtrlFAndGoesDownIntoTheList)

@@ -110,6 +110,17 @@ TEST_F(ListInWindow, KeepsTheEntryThatWasFoundWhenTheSearchIsCleared)
     EXPECT_EQ((std::vector<Field>{{"note", "Monkey puzzle"}}), ShownFields());
 }
 
+TEST_F(ListInWindow, SearchesForTheSameLettersInAnotherCodePage)
+{
+    Open(folder.Write("a.bib", "@misc{one, note = {\xE9}}\n@misc{two, note = {\xFD}}\n"));
+    SearchFor(L"\u00E9");
+    EXPECT_EQ((std::vector<wxString>{"one (a)"}), Rows());
+    frame->TakeCommand((folder.Path("a.bib") + " -eCP852").c_str());
+    EXPECT_TRUE(Rows().empty());
+    frame->TakeCommand((folder.Path("a.bib") + " -eCP1252").c_str());
+    EXPECT_EQ((std::vector<wxString>{"one (a)"}), Rows());
+}
+
 TEST_F(ListInWindow, RefusesASearchFromElsewhere)
 {
     wxCommandEvent event(wxEVT_TEXT, ID_SEARCH);
