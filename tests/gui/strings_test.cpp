@@ -18,7 +18,7 @@ static const char Title[] = "Editing Strings";
 static const long Refusal = wxOK | wxICON_EXCLAMATION, Offer = wxOK | wxCANCEL | wxICON_EXCLAMATION;
 
 static const char TwoStrings[] = "@string{jgo = {Good Order}}\n@string{acm = {A} # jgo}\n"
-                                 "@article{one, title = {Old Maps}, journal = jgo}\n";
+                                 "@article{one, title = {Old Maps}, series = jgo}\n";
 static const char Lists[] = "[String]\nMonths=*Months\n[*Months]\njan=January\nfeb=February\n"
                             "[article]\ntitle=*\n";
 
@@ -259,7 +259,7 @@ TEST_F(Strings, AreDeletedWithoutAQuestionEvenWhenTheyAreUsed)
               TakeLog("INFO: Cartulo_Strings::OnRemove"));
     EXPECT_EQ("The string is deleted: jgo = Good Order", Status());
     EXPECT_EQ("@STRING{acm = {A} # jgo}\n\n@article{one,\n\ttitle = {Old Maps},\n"
-              "\tjournal = jgo\n}\n",
+              "\tseries = jgo\n}\n",
               Saved());
 }
 
@@ -466,7 +466,7 @@ TEST_F(NewString, StandsAtTheEndAndIsSelected)
     wxTEST_DIALOG(Send(ID_STRINGS), UseStrings(press), UseString(type));
     EXPECT_TRUE(SaveEnabled());
     EXPECT_EQ("@STRING{jgo = {Good Order}}\n@STRING{acm = {A} # jgo}\n@STRING{new = {Value}}\n\n"
-              "@article{one,\n\ttitle = {Old Maps},\n\tjournal = jgo\n}\n",
+              "@article{one,\n\ttitle = {Old Maps},\n\tseries = jgo\n}\n",
               Saved());
 }
 
@@ -614,7 +614,7 @@ TEST_F(ChangedString, KeepsItsKey)
     EXPECT_EQ((Lines{{"INFO: Cartulo_Strings::OnEdit", TNS_ACTION}}),
               TakeLog("INFO: Cartulo_Strings::OnEdit"));
     EXPECT_EQ("@STRING{jgo = {Good Order}}\n@STRING{acm = jgo # { and others}}\n\n"
-              "@article{one,\n\ttitle = {Old Maps},\n\tjournal = jgo\n}\n",
+              "@article{one,\n\ttitle = {Old Maps},\n\tseries = jgo\n}\n",
               Saved());
 }
 
