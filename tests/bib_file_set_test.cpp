@@ -9,6 +9,7 @@
 #include <vector>
 
 #include <fcntl.h>
+#include <pthread.h>
 #include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -126,6 +127,32 @@ TEST_F(FileSet, ProtectsAFileWithErrors)
     EXPECT_EQ(0, set.files[0]->lockHandle);
     EXPECT_FALSE(IsLocked(path));
     EXPECT_EQ("", LoadErrors());
+}
+
+TEST_F(FileSet, KeepsAFileWithWarningsAloneWritable)
+{
+    std::string path = folder.Write("refs.bib", "junk\n@misc{k, title = {x}}\n");
+    EXPECT_EQ(0, FileSet_Open(&set, path.c_str()));
+    ASSERT_EQ(1, set.count);
+    EXPECT_EQ(1, set.files[0]->warningCount);
+    EXPECT_EQ(0, set.files[0]->errorCount);
+    EXPECT_EQ(0, set.files[0]->readOnly);
+    EXPECT_EQ(0, set.files[0]->readOnlyByErrors);
+    EXPECT_NE(0, set.files[0]->lockHandle);
+    EXPECT_TRUE(IsLocked(path));
+}
+
+TEST_F(FileSet, IsLockedWhileItLoads)
+{
+    std::string path = folder.Write("refs.bib", Good);
+    static const std::string *loading = &path;
+    static int locked = 0;
+    // When the process of the parser is about to start.
+    pthread_atfork([] { locked = loading && IsLocked(*loading); }, nullptr, nullptr);
+    EXPECT_EQ(0, FileSet_Open(&set, path.c_str()));
+    loading = nullptr;
+    EXPECT_EQ(1, locked);
+    EXPECT_TRUE(IsLocked(path));
 }
 
 TEST_F(FileSet, TellsThatAnotherProgramHasTheFile)

@@ -10,6 +10,7 @@
 #include <unistd.h>
 
 #include "tests/support/LoadText.h"
+#include "tests/support/LogCapture.h"
 
 namespace
 {
@@ -106,6 +107,20 @@ TEST(BibItemSize, RefusesAnUnknownKind)
 {
     for (int kind : {-1, BIB_ITEM_END + 1, 0x7FFFFFFF})
         EXPECT_EQ(-1, Size(Item(kind, 0, "")));
+}
+
+TEST(BibItemStore, LogsAnItemThatItDoesNotKnow)
+{
+    auto logOf = [](int metatype) {
+        return LogOf(nullptr, [metatype] {
+            BibFile file = {};
+            if (BibItem_Store(&file, Item(BIB_ITEM_STRANGE, metatype, "").data()) != BIB_STORED ||
+                file.entries || file.errorCount)
+                _exit(1);
+        });
+    };
+    EXPECT_EQ("Cartulo: ERROR: There is unknown entry in BIB-file\n", logOf(0));
+    EXPECT_EQ("Cartulo: ERROR: There is strange entry in BIB-file\n", logOf(5));
 }
 
 #ifndef __SANITIZE_ADDRESS__ // which needs all address space

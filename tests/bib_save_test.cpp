@@ -490,6 +490,13 @@ TEST_F(BibSave, NamesBackupsByAttempt)
     EXPECT_EQ(".Backup-NOWB", BackupSuffix(file, 27));
 }
 
+TEST_F(BibSave, NamesBackupsByTheLocalTime)
+{
+    setenv("TZ", "Far-05:45", 1);
+    tzset();
+    EXPECT_EQ(".Backup-NOW", BackupSuffix(file, 0));
+}
+
 TEST_F(BibSave, NamesBackupsOfLongPaths)
 {
     Make(std::string(10000, 'p'));

@@ -5,7 +5,10 @@
 #include <cstring>
 #include <string>
 
+#include <sys/resource.h>
+
 #include "tests/support/LoadText.h"
+#include "tests/support/LogCapture.h"
 
 namespace
 {
@@ -123,6 +126,31 @@ TEST_F(BibNewEntry, MayHaveNoFields)
     EXPECT_EQ(0, Bib_EntryContains(entry, "x"));
     EXPECT_EQ(0, Bib_EntryContains(entry, ""));
 }
+
+TEST_F(BibNewEntry, LogsEachItemAndEachFieldThatItTakes)
+{
+    EXPECT_EQ("Cartulo: Adding Entry: new\n"
+              "Cartulo: Count: author=*\n"
+              "Cartulo: Count: note=\n"
+              "Cartulo: Count: *x=*\n"
+              "Cartulo: Count: nonsense\n"
+              "Cartulo: Adding empty field: author\n",
+              LogOf("1", [this] { Bib_NewEntry(file, "new", "Book", Specs, 0); }));
+}
+
+#ifndef __SANITIZE_ADDRESS__ // which needs all address space
+TEST_F(BibStore, TellsHowMuchMemoryThereIsNot)
+{
+    EXPECT_EQ("Can't allocate 16000032 bytes\n", LogOf("6", [] {
+                  struct rlimit limit;
+                  getrlimit(RLIMIT_AS, &limit);
+                  limit.rlim_cur = 4096; // nothing more than there is
+                  setrlimit(RLIMIT_AS, &limit);
+                  if (Bib_AllocEntry(1000000))
+                      _exit(1);
+              }));
+}
+#endif
 
 TEST_F(BibStore, FindsTheFirstFieldOfAName)
 {
