@@ -3,6 +3,7 @@
 #include "tests/gui/GuiTest.h"
 
 #include <cstdlib>
+#include <cstring>
 
 #include <sys/stat.h>
 
@@ -14,6 +15,7 @@
 
 #include "app/AboutDlg.h"
 #include "app/Companion.h"
+#include "app/Icons.h"
 #include "app/Ids.h"
 #include "app/Native.h"
 #include "ui/Cartulo.h"
@@ -37,6 +39,13 @@ protected:
     {
         wxCommandEvent event(wxEVT_MENU, id);
         frame->ProcessWindowEvent(event);
+    }
+
+    // As a button of the panel does that has this number.
+    void SendFromButton(int id)
+    {
+        wxCommandEvent event(wxEVT_BUTTON, id);
+        Panel()->ProcessWindowEvent(event);
     }
 
     // A program for the frame to start, which leaves its arguments in a file.
@@ -120,6 +129,24 @@ TEST_F(Frame, ShowsTheMessagesOfLaterFilesWithoutATool)
     wxTEST_DIALOG(PressShortcut('M', true, false), messages);
 }
 
+TEST_F(Frame, LogsThatItShowsTheMessages)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    EXPECT_EQ(Lines(), TakeLog("INFO: Forcing"));
+    frame->TakeCommand(folder.Write("b.bib", Broken).c_str());
+    EXPECT_EQ((Lines{{"INFO: Forcing displayign messages box. ", TNS_LIFECYCLE}}),
+              TakeLog("INFO: Forcing"));
+    wxTEST_DIALOG(HandleQueuedEvents(), ExpectMessages("There are errors in loading BIB files"));
+}
+
+TEST_F(Frame, LogsASearch)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    ForgetLog();
+    SearchFor("First");
+    EXPECT_EQ((Lines{{"INFO: MyFrame::OnSearch ", TNS_ACTION}}), TakeLog("INFO: MyFrame::"));
+}
+
 TEST_F(Frame, StartsWithNothingToSave)
 {
     Open(folder.Write("a.bib", OneEntry));
@@ -192,6 +219,29 @@ TEST_F(Frame, LeavesTheFocusWhereThereIsNoRoomForTheSearchField)
     PressShortcut('F', true, false);
     EXPECT_TRUE(List()->HasFocus());
     EXPECT_EQ("The window is too narrow for the search field.", Status());
+}
+
+// --- Looks ---
+
+TEST_F(Frame, HasTheIconOfTheProgram)
+{
+    Open("");
+    wxIconBundle expected = Icon_Program(), icons = frame->GetIcons();
+    ASSERT_LT(0u, expected.GetIconCount());
+    ASSERT_EQ(expected.GetIconCount(), icons.GetIconCount());
+    for (size_t i = 0; i < icons.GetIconCount(); ++i) {
+        wxImage image = wxBitmap(icons.GetIconByIndex(i)).ConvertToImage();
+        wxImage own = wxBitmap(expected.GetIconByIndex(i)).ConvertToImage();
+        ASSERT_EQ(own.GetSize(), image.GetSize());
+        EXPECT_EQ(0, memcmp(own.GetData(), image.GetData(), 3 * own.GetWidth() * own.GetHeight()));
+    }
+}
+
+// Runs on desktops of different fonts.
+TEST_F(Frame, HasAFontOfTenPoints)
+{
+    Open("");
+    EXPECT_EQ(10, frame->GetFont().GetPointSize());
 }
 
 // --- Place and size ---
@@ -354,12 +404,16 @@ TEST_F(Frame, SaysThatThereIsNoHelpProgram)
     EXPECT_EQ((Lines{{"ERROR: MyFrame::OnHelp Can't find <Program>metahelp", TNS_ERROR}}),
               TakeLog("ERROR: MyFrame::OnHelp"));
     EXPECT_EQ("ERROR: The help program \"metahelp\" can't be found.", Status());
+    frame->SetStatusText("");
+    SendFromButton(ID_HELP);
+    EXPECT_EQ("ERROR: The help program \"metahelp\" can't be found.", Status());
 }
 
 TEST_F(Frame, ShowsTheAboutBox)
 {
     Open("");
     wxTEST_DIALOG(Send(ID_ABOUT), wxExpectDismissableModal<AboutDlg>(wxID_CANCEL));
+    wxTEST_DIALOG(SendFromButton(ID_ABOUT), wxExpectDismissableModal<AboutDlg>(wxID_CANCEL));
 }
 
 TEST_F(Frame, HasNoContextMenuYet)
