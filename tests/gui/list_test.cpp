@@ -3,6 +3,7 @@
 #include "tests/gui/GuiTest.h"
 
 #include <cstring>
+#include <regex>
 
 #include <wx/srchctrl.h>
 #include <wx/scrolwin.h>
@@ -54,6 +55,31 @@ TEST_F(ListInWindow, ShowsTheEntryOfTheSelectedRow)
     EXPECT_EQ("misc", TextAfter("Entry Type:"));
     EXPECT_EQ(folder.Path("plants.bib"), TextAfter("BIB File:"));
     EXPECT_EQ((std::vector<Field>{{"note", "Monkey puzzle"}}), ShownFields());
+}
+
+TEST_F(ListInWindow, ShowsTheEntryOfARowThatIsDoubleClicked)
+{
+    List()->SetSelection(2);
+    ForgetLog();
+    wxMouseEvent event(wxEVT_LEFT_DCLICK);
+    event.SetPosition(List()->GetItemRect(2).GetTopLeft());
+    List()->ProcessWindowEvent(event);
+    std::vector<LogLine> expected = {
+        {"INFO: Cartulo::OnIndexActivate to knight (plants)", TNS_ACTION}};
+    EXPECT_EQ(expected, TakeLog("INFO: Cartulo::On"));
+    EXPECT_EQ((std::vector<Field>{{"note", "Monkey puzzle"}}), ShownFields());
+    EXPECT_FALSE(Panel()->InEditMode());
+}
+
+TEST_F(ListInWindow, LogsADoubleClickOnNoRow)
+{
+    SearchFor("nowhere");
+    ForgetLog();
+    wxCommandEvent event(wxEVT_LISTBOX_DCLICK, ID_INDEX);
+    List()->ProcessWindowEvent(event);
+    std::vector<LogLine> expected = {
+        {"WARNING: Cartulo::OnIndexActivate no selection in index", TNS_WARNING}};
+    EXPECT_EQ(expected, TakeLog(""));
 }
 
 TEST_F(ListInWindow, NarrowsToWhatTheSearchFinds)
@@ -128,6 +154,8 @@ TEST_F(ListInWindow, RefusesASearchFromElsewhere)
     event.SetString("Oak");
     frame->ProcessWindowEvent(event);
     EXPECT_EQ(5u, Rows().size());
+    std::vector<LogLine> expected = {{"ERROR: Cartulo::OnSearch Uknown source", TNS_ERROR}};
+    EXPECT_EQ(expected, TakeLog("ERROR: "));
 }
 
 TEST_F(ListInWindow, FindsAKeyByItsFirstLetters)
@@ -191,7 +219,20 @@ TEST_F(ListInWindow, LogsEachKeyInAWholeLine)
         std::string start = std::string(prefix) + "Key=" + row.character + ", Time=2000-";
         EXPECT_EQ(start, lines[0].text.substr(0, start.size()));
         EXPECT_EQ(" ms", lines[0].text.substr(lines[0].text.size() - 3));
+        EXPECT_EQ(TNS_LIFECYCLE, lines[0].level);
     }
+}
+
+TEST_F(ListInWindow, LogsHowLongItTakesToFill)
+{
+    ForgetLog();
+    EXPECT_EQ(1, List()->Update_Index(nullptr, ""));
+    std::vector<LogLine> lines = TakeLog("");
+    ASSERT_EQ(1u, lines.size());
+    EXPECT_TRUE(
+        std::regex_match(lines[0].text, std::regex("QListBox::Update_Index Time: [0-9]+ ms")))
+        << lines[0].text;
+    EXPECT_EQ(TNS_ACTION, lines[0].level);
 }
 
 TEST_F(ListInWindow, ReturnsZeroWithoutFilesAndNeverReadsTheOldRows)

@@ -63,6 +63,34 @@ TEST_F(EditorPanel, FollowsTheNumberOfFilesAndEntries)
     }
 }
 
+// The heading of the pane that holds this control.
+static wxStaticText *HeadingOver(const wxWindow *control)
+{
+    for (wxWindow *child : control->GetParent()->GetChildren())
+        if (wxStaticText *text = dynamic_cast<wxStaticText *>(child))
+            return text;
+    return nullptr;
+}
+
+TEST_F(EditorPanel, SaysWhatEachPaneIsFor)
+{
+    Open("");
+    auto expectHeading = [this](int id, const wxString &text) {
+        ASSERT_TRUE(IsShowing(id));
+        const wxStaticText *heading = HeadingOver(Panel()->FindWindow(id));
+        ASSERT_TRUE(heading && heading->IsShownOnScreen());
+        EXPECT_EQ(text, heading->GetLabelText());
+        EXPECT_EQ(wxFONTWEIGHT_BOLD, heading->GetFont().GetWeight());
+    };
+    expectHeading(ID_OPEN, "To open TeX Bibliography file (BIB) click the button:");
+    EXPECT_EQ("Open", Panel()->FindWindow(ID_OPEN)->GetLabel());
+    EXPECT_EQ("Click to open BIB-file.", Panel()->FindWindow(ID_OPEN)->GetToolTipText());
+    frame->TakeCommand(folder.Write("new.bib", "").c_str());
+    expectHeading(ID_NEW_ENTRY, "To add new enrty click the button:");
+    frame->TakeCommand(folder.Write("a.bib", OneEntry).c_str());
+    expectHeading(ID_TYPE, "Records of currently selected bibliography entry");
+}
+
 TEST_F(EditorPanel, OffersToAddAnEntryWhileTheSearchFindsNone)
 {
     Open(folder.Write("a.bib", OneEntry));
@@ -264,6 +292,29 @@ TEST_F(EditorPanel, PutsTheSashWhereItWasBeforeTheFilesWereClosed)
     frame->TakeCommand("");
     frame->TakeCommand(folder.Path("a.bib").c_str());
     EXPECT_EQ(350, frame->ToDIP(Panel()->GetSashPosition()));
+}
+
+TEST_F(EditorPanel, LogsWhereTheSashWasMoved)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    ForgetLog();
+    wxSplitterEvent event(wxEVT_SPLITTER_SASH_POS_CHANGED, Panel());
+    event.SetSashPosition(345);
+    Panel()->ProcessWindowEvent(event);
+    wxSize left = Panel()->GetWindow1()->GetSize(), right = Panel()->GetWindow2()->GetSize();
+    wxString text = wxString::Format("INFO: Cartulo::OnSashMOve sash pos=345, w1=%dx%d, w2=%dx%d",
+                                     left.x, left.y, right.x, right.y);
+    EXPECT_EQ((Lines{{text.ToStdString(), TNS_ACTION}}), TakeLog("INFO: "));
+}
+
+// --- Saving ---
+
+TEST_F(EditorPanel, LogsThatItSavesEvenWithoutChanges)
+{
+    Open(folder.Write("a.bib", OneEntry));
+    ForgetLog();
+    EXPECT_EQ(0, Panel()->SaveAll(true));
+    EXPECT_EQ((Lines{{"INFO: Cartulo::SaveAll", TNS_ACTION}}), TakeLog("INFO: "));
 }
 
 // --- Citing ---
