@@ -24,6 +24,7 @@ TEST_F(Edit, ChangesBetweenTheModes)
     EXPECT_TRUE(Value("title")->IsEnabled());
     EXPECT_TRUE(Remover(0)->IsEnabled());
     EXPECT_TRUE(IsShowing(ID_COMMIT_ENTRY));
+    EXPECT_TRUE(EntryPaneSays("Add Field:"));
     EXPECT_TRUE(WaitFor([this] { return Type()->HasFocus(); }));
     for (int id : {ID_NEW_ENTRY, ID_REMOVE_ENTRY, ID_RENAME_ENTRY, ID_EDIT_ENTRY})
         EXPECT_FALSE(ToolEnabled(id));
@@ -32,7 +33,31 @@ TEST_F(Edit, ChangesBetweenTheModes)
     EXPECT_TRUE(List()->IsEnabled());
     EXPECT_FALSE(Value("title")->IsEnabled());
     EXPECT_FALSE(IsShowing(ID_COMMIT_ENTRY));
+    EXPECT_FALSE(EntryPaneSays("Add Field:"));
     EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+}
+
+TEST_F(Edit, LogsItsSteps)
+{
+    OpenText(Article);
+    ForgetLog();
+    StartEditing();
+    EXPECT_EQ((Lines{{"INFO: Cartulo::OnEditEntry to one (a)", TNS_ACTION},
+                     {"INFO: Cartulo::Update_Tools(): EditMode", TNS_LIFECYCLE},
+                     {"INFO: Update_Field_Colors for article", TNS_LIFECYCLE}}),
+              TakeLog("INFO: "));
+    Choose("book");
+    EXPECT_EQ((Lines{{"INFO: Cartulo::OnChangeType to ...", TNS_ACTION},
+                     {"INFO: Cartulo::OnChangeType to book", TNS_ACTION},
+                     {"INFO: Update_Field_Colors for book", TNS_LIFECYCLE}}),
+              TakeLog("INFO: "));
+    Choose("article");
+    ForgetLog();
+    Send(ID_COMMIT_ENTRY);
+    EXPECT_EQ((Lines{{"INFO: Cartulo::OnCommitEntry", TNS_ACTION},
+                     {"INFO: Cartulo::Update_Tools(): ListMode", TNS_LIFECYCLE},
+                     {"INFO: Update_Field_Colors for article", TNS_LIFECYCLE}}),
+              TakeLog("INFO: "));
 }
 
 TEST_F(Edit, StartsAndEndsWithEscape)

@@ -1,5 +1,6 @@
 // The commands on the fields of the entry that is edited, and their windows.
 
+#include "tests/gui/DialogTest.h"
 #include "tests/gui/EditTest.h"
 
 #include <algorithm>
@@ -110,7 +111,9 @@ TEST_F(NewField, OverridesAnInheritedOne)
 TEST_F(NewField, NeedsAnEntryThatIsEdited)
 {
     OpenText(Article);
+    ForgetLog();
     Send(ID_NEW_FIELD);
+    EXPECT_EQ((Lines{{"INFO: Cartulo::OnNewField", TNS_ACTION}}), TakeLog(""));
     EXPECT_EQ(3u, ShownFields().size());
 }
 
@@ -240,11 +243,13 @@ TEST_F(EditField, ShowsItsValueInALargeWindow)
     ForgetLog();
     auto change = [](Cartulo_EditField &dialog) {
         EXPECT_EQ("Editing Field", dialog.GetTitle());
+        EXPECT_EQ((std::vector<wxString>{"Field Key:", "title"}), Labels(dialog));
         EXPECT_EQ("title", dialog.FindWindow(ID_FIELD_KEY)->GetLabel());
         EXPECT_EQ(10, dialog.GetFont().GetPointSize());
         wxTextCtrl *value = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_VALUE));
         EXPECT_EQ("T", value->GetValue());
         EXPECT_TRUE(value->IsMultiLine());
+        EXPECT_EQ(dialog.FromDIP(wxSize(600, 200)), value->GetMinSize());
         value->SetValue("Large");
     };
     wxTEST_DIALOG(PressShortcut('E', true, false),
@@ -365,6 +370,7 @@ TEST_F(RenameField, ChangesTheKey)
     ForgetLog();
     auto change = [this](Cartulo_RenameField &dialog) {
         EXPECT_EQ("Renaming Field", dialog.GetTitle());
+        EXPECT_EQ((std::vector<wxString>{"Old Field Name:", "New Field Name:"}), Labels(dialog));
         wxTextCtrl *old = dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_KEY));
         EXPECT_EQ("title", old->GetValue());
         EXPECT_FALSE(old->IsEnabled());
