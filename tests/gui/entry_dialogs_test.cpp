@@ -555,6 +555,18 @@ TEST_F(RenameEntry, TakesTheChildrenBeforeItAlong)
               Saved("a.bib"));
 }
 
+TEST_F(RenameEntry, SelectsTheEntryAmongThoseThatTheSearchFinds)
+{
+    Open(folder.Write("a.bib", "@misc{a, note = x}\n@misc{b, note = y}\n@misc{c, note = x}\n"));
+    SearchFor("x");
+    ASSERT_EQ("a (a)", Selected());
+    auto press = [](Cartulo_RenameEntry &dialog) { EXPECT_TRUE(PressOK(dialog, "d")); };
+    wxTEST_DIALOG(Run(ID_RENAME_ENTRY), UseRename(press));
+    EXPECT_EQ((std::vector<wxString>{"c (a)", "d (a)"}), Rows());
+    EXPECT_EQ("d (a)", Selected());
+    EXPECT_STREQ("d", Panel()->CurrentEntry()->key);
+}
+
 // --- Removing ---
 
 TEST_F(RemoveEntry, AsksFirst)
