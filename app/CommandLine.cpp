@@ -202,11 +202,7 @@ struct Command {
 static void MoveToPrevious(Command *command)
 {
     BibFileSet *set = command->set;
-    for (int i = 0; i < set->asideCount; ++i)
-        FileSet_Append(set, set->aside[i]);
-    free(set->aside);
-    set->aside = nullptr;
-    set->asideCount = 0;
+    FileSet_TakeBack(set);
     command->previous.files = set->files;
     command->previous.count = set->count;
     set->files = nullptr;
@@ -252,8 +248,8 @@ static void SetBaseFolder(Command *command, const char *folder)
     ++command->result.errors;
 }
 
-// Drops those that are listed (again).
-static void KeepAside(BibFileSet *set)
+// Of those that were put aside.
+static void DropListed(BibFileSet *set)
 {
     auto isListed = [set](const BibFile *file) { return IsListed(set, file); };
     BibFile **end = set->aside + set->asideCount;
@@ -351,14 +347,25 @@ static void CloseUnused(Command *command, const char *path)
     }
 }
 
-// Only what was open before this command line counts: a new file that it names twice is loaded
-// twice.
+static BibFile *FindIn(BibFile **files, int count, const char *path)
+{
+    BibFileSet set = {};
+    set.files = files;
+    set.count = count;
+    int found = FileSet_Find(&set, path);
+    return found < 0 ? nullptr : files[found];
+}
+
+// Only what was open before this command line counts, and what it has put aside: a new file that it
+// names twice is loaded twice.
 static bool Reuse(Command *command, const char *path)
 {
-    int found = FileSet_Find(&command->previous, path);
-    if (found < 0)
+    const BibFileSet *set = command->set;
+    BibFile *file = FindIn(command->previous.files, command->previous.count, path);
+    if (!file)
+        file = FindIn(set->aside, set->asideCount, path);
+    if (!file)
         return false;
-    BibFile *file = command->previous.files[found];
     file->inUse = 1;
     FileSet_Append(command->set, file);
     AppLog("Reused Bib file: ", file->path);
@@ -447,7 +454,7 @@ CommandResult Command_Process(BibFileSet *set, CommandState *state, const char *
     AppLog("Command: ", commandLine);
     TakeTokens(&command, commandLine);
     CloseUnused(&command, nullptr);
-    KeepAside(set);
+    DropListed(set);
     // Rows name their file by its place in the list, which reuse alone can change.
     if (command.result.changes == 0 && !SameList(set, &command.previous))
         command.result.changes = 1;

@@ -106,7 +106,7 @@ bool MyApp::IsFirst()
 // instead, so that this is now the first.
 bool MyApp::HandOver(const std::string &name)
 {
-    const char *commandLine = BuildLine();
+    const char *commandLine = BuildLine(); // the whole line again, as the log shows
     int32_t end = Sys_Milliseconds() + HAND_OVER_TIME;
     long window = FindFrame(m_start.instance.c_str());
     if (window != 0)

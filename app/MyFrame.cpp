@@ -26,6 +26,7 @@
 
 enum { SMALLEST_WINDOW = 512, DEFAULT_PLACE = 50, TOOL_MARGIN = 4, SEARCH_WIDTH = 160 };
 enum { SMALLEST_SEARCH = 80 };
+enum { LEAVING_TIMER = 1 };
 enum { PLACING_TIME = 500, LEAVING_TIME = 250 }; // milliseconds that a window manager may take
 
 // The first row that matches handles the event.
@@ -44,7 +45,7 @@ wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
     EVT_CHAR_HOOK(MyFrame::OnCharHook)
     EVT_MOVE(MyFrame::OnMove)
     EVT_SIZE(MyFrame::OnSize)
-    EVT_TIMER(wxID_ANY, MyFrame::OnLeft)
+    EVT_TIMER(LEAVING_TIMER, MyFrame::OnLeft)
     EVT_CLOSE(MyFrame::OnClose)
 wxEND_EVENT_TABLE()
 
@@ -78,7 +79,8 @@ private:
 // --- Construction ---
 
 MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *state)
-    : wxFrame(nullptr, wxID_ANY, title), m_state(state), m_dialogs(new DialogCount), m_leaving(this)
+    : wxFrame(nullptr, wxID_ANY, title), m_state(state), m_dialogs(new DialogCount),
+      m_leaving(this, LEAVING_TIMER)
 {
     Place();
     SetFont(wxFontInfo(10));
@@ -332,11 +334,16 @@ static void LogKey(const wxKeyEvent &event)
     TNSMessage("INFO: MyFrame::OnCharHook ", text.utf8_str(), TNS_LIFECYCLE);
 }
 
+bool MyFrame::SearchHasFocus() const
+{
+    wxWindow *focus = FindFocus();
+    return m_search && focus && m_search->IsDescendant(focus);
+}
+
 // The arrow leads from the search field down into what it found.
 bool MyFrame::LeaveSearch(int key)
 {
-    wxWindow *focus = FindFocus();
-    if (key != WXK_DOWN || !m_panel || !focus || !m_search->IsDescendant(focus))
+    if (key != WXK_DOWN || !m_panel || !SearchHasFocus())
         return false;
     m_panel->FocusList();
     return true;
@@ -355,12 +362,10 @@ static int KeyOf(const wxKeyEvent &event)
     }
 }
 
-// Enter presses the button that has the focus, as everywhere, and searches in the search field.
-bool MyFrame::IsForFocus(int key) const
+// Whether the control with the focus does: a button is pressed, and the search field searches.
+bool MyFrame::TakesEnter() const
 {
-    wxWindow *focus = FindFocus();
-    return key == WXK_RETURN && focus &&
-           (dynamic_cast<wxButton *>(focus) || (m_search && m_search->IsDescendant(focus)));
+    return SearchHasFocus() || dynamic_cast<wxButton *>(FindFocus());
 }
 
 void MyFrame::OnCharHook(wxKeyEvent &event)
@@ -376,7 +381,7 @@ void MyFrame::OnCharHook(wxKeyEvent &event)
         return;
     bool alt = event.AltDown(), ctrl = event.ControlDown();
     int key = KeyOf(event);
-    if (IsForFocus(key)) {
+    if (key == WXK_RETURN && TakesEnter()) {
         event.Skip();
         return;
     }

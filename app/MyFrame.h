@@ -35,7 +35,8 @@ public:
     // The program got the focus or lost it. A loss counts when it lasts: while one window of ours
     // closes, there may be none with the focus for a moment.
     void OnActivation(bool active);
-    void OnDeactivation(); // it lost the focus to another program
+    bool IsLeaving() const { return m_leaving.IsRunning(); } // lost, and it does not count yet
+    void OnDeactivation();                                   // it lost the focus to another program
 
     // Command lines of other programs: only while nothing is being asked, loaded or saved. The
     // messages window and the About box may be open.
@@ -61,7 +62,8 @@ private:
     void OnSearch(wxCommandEvent &event);
     void OnCharHook(wxKeyEvent &event);
     bool LeaveSearch(int key);
-    bool IsForFocus(int key) const;
+    bool SearchHasFocus() const;
+    bool TakesEnter() const;
     void Correct();
     void OnMove(wxMoveEvent &event);
     void OnSize(wxSizeEvent &event);

@@ -35,6 +35,15 @@ void FileSet_PutAside(BibFileSet *set, BibFile *file)
     AppendFile(&set->aside, &set->asideCount, file);
 }
 
+void FileSet_TakeBack(BibFileSet *set)
+{
+    for (int i = 0; i < set->asideCount; ++i)
+        FileSet_Append(set, set->aside[i]);
+    free(set->aside);
+    set->aside = nullptr;
+    set->asideCount = 0;
+}
+
 static void AppendText(char **heapText, const std::string &more)
 {
     size_t length = *heapText ? strlen(*heapText) : 0;
@@ -82,8 +91,7 @@ static void ClearSaveErrors(BibFileSet *set)
 
 void FileSet_Free(BibFileSet *set)
 {
-    for (int i = 0; i < set->asideCount; ++i)
-        FileSet_Append(set, set->aside[i]);
+    FileSet_TakeBack(set);
     for (int i = set->count - 1; i >= 0; --i) {
         if (IsRepeated(set, i))
             continue;
@@ -91,12 +99,11 @@ void FileSet_Free(BibFileSet *set)
         Bib_FreeFile(set->files[i]);
     }
     free(set->files);
-    free(set->aside);
     free(set->loadErrors);
     ClearSaveErrors(set);
-    set->files = set->aside = nullptr;
+    set->files = nullptr;
     set->loadErrors = nullptr;
-    set->count = set->asideCount = 0;
+    set->count = 0;
 }
 
 int FileSet_EntryCount(const BibFileSet *set)

@@ -10,7 +10,7 @@ struct BibFileSet {
     BibFile **aside;  // heap, `asideCount` pointers: open files that a command line has taken off
     int asideCount;   // the list; the next one lists them again or closes them
     char *loadErrors; // heap: what could not be opened, for the messages window; null when nothing
-    char *saveErrors; // heap: what the last FileSet_SaveAll or FileSet_SaveOne could not write, one
+    char *saveErrors; // heap: what the last of the FileSet_Save functions could not write, one
                       // "File: `path'\nreason\n" each; null when it wrote everything
     // Shows a warning with an OK button and returns when it is closed. Null: only the log.
     void (*box)(void *owner, const char *caption, const char *text);
@@ -18,7 +18,8 @@ struct BibFileSet {
 };
 
 void FileSet_Append(BibFileSet *set, BibFile *file);
-void FileSet_PutAside(BibFileSet *set, BibFile *file);
+void FileSet_PutAside(BibFileSet *set, BibFile *file); // the caller takes it off the list
+void FileSet_TakeBack(BibFileSet *set);                // lists all that were put aside, at the end
 void FileSet_AppendError(BibFileSet *set, const char *format, ...)
     __attribute__((format(printf, 2, 3))); // to loadErrors
 void FileSet_Free(BibFileSet *set);        // unlocks and frees every file; saves nothing

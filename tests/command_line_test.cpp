@@ -872,6 +872,17 @@ TEST_F(CommandProcess, ListsFilesAgainThatAnEarlierOptionITookOff)
     EXPECT_EQ(0, set.asideCount);
 }
 
+TEST_F(CommandProcess, ListsANewFileAgainThatOptionITookOff)
+{
+    std::string path = WriteBib("a.bib");
+    CommandResult result = Run("a -i a");
+    EXPECT_EQ(0, result.errors);
+    EXPECT_EQ((Tokens{"a.bib"}), Names());
+    EXPECT_EQ(0, set.files[0]->readOnly);
+    EXPECT_EQ(0, set.asideCount);
+    EXPECT_EQ(1, Logged("Cartulo: Loading: " + path));
+}
+
 TEST_F(CommandProcess, ClosesFilesThatAnEarlierOptionITookOff)
 {
     std::string path = WriteBib("a.bib");

@@ -1,7 +1,6 @@
 #include "ui/Cartulo.h"
 
 #include <cstdlib>
-#include <vector>
 
 #include <wx/button.h>
 #include <wx/choice.h>

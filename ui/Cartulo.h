@@ -126,7 +126,6 @@ private:
     bool CheckRows();
     bool ReplaceEntry(int type);
     void AddField(const std::string &key);
-    bool TakeValue(int row, const wxString &text);
     int RowForCommand(const char *logPrefix);
     void RemoveRow(int row);
     void SelectInList(BibEntry *entry);

@@ -19,6 +19,7 @@
 #include "app/Ids.h"
 #include "app/Log.h"
 #include "app/Native.h"
+#include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/QListBox.h"
 #include "ui/Schema.h"
@@ -51,7 +52,7 @@ void Cartulo::FitRow(int row)
     label->SetMinSize(wxSize(std::min(width, widest), -1));
     label->SetToolTip(width > widest ? label->GetLabelText() : wxString());
     if (m_grid.rows[row].locked)
-        value->SetToolTip("This value is too long to be shown in full.");
+        value->SetToolTip(Text_TooLongTip);
     else
         value->SetToolTip(Fits(value) ? wxString() : BoundedText(value->GetValue()));
 }

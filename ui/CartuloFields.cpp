@@ -110,21 +110,6 @@ int Cartulo::RowForCommand(const char *logPrefix)
     return row;
 }
 
-// False when the row can't hold the text: it keeps what it has.
-bool Cartulo::TakeValue(int row, const wxString &text)
-{
-    wxTextCtrl *value = m_rows[row].value;
-    wxString old = value->GetValue();
-    if (text == old)
-        return true;
-    value->ChangeValue(text);
-    bool taken = value->GetValue() == text;
-    if (!taken)
-        value->ChangeValue(old);
-    value->SetInsertionPointEnd();
-    return taken;
-}
-
 void Cartulo::OnEditField(wxCommandEvent &)
 {
     int row = RowForCommand("INFO: Editing Field: ");
@@ -137,11 +122,11 @@ void Cartulo::OnEditField(wxCommandEvent &)
         if (dialog.ShowModal() != wxID_OK)
             break;
         text = dialog.Value();
-        taken = TakeValue(row, text);
+        taken = Text_Take(m_rows[row].value, text);
         if (!taken)
-            ShowWarning(dialog.GetTitle(), "The value is too long: a field can be edited up to "
-                                           "65,534 bytes.");
+            ShowWarning(dialog.GetTitle(), Text_TooLong);
     }
+    m_rows[row].value->SetInsertionPointEnd();
     FocusRow(row);
 }
 

@@ -1,5 +1,7 @@
 #include "ui/Dialogs.h"
 
+#include <algorithm>
+
 #include <wx/dialog.h>
 #include <wx/msgdlg.h>
 #include <wx/sizer.h>
@@ -9,6 +11,8 @@
 
 #include "store/BibStore.h"
 #include "ui/DisplayText.h"
+
+enum { LONG_WORD = 1000 }; // characters
 
 wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog)
 {
@@ -74,11 +78,41 @@ bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, lo
 }
 
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
-                       std::string key, wxTextEntry *entry)
+                       std::string key, wxWindow *field)
 {
-    if (!Box_WarnOrCancel(parent, caption, text))
+    bool accepted = Box_WarnOrCancel(parent, caption, text);
+    field->SetFocus();
+    if (!accepted)
         return;
+    wxTextEntry *entry = dynamic_cast<wxTextEntry *>(field);
     Bib_StripKeyChars(key.data());
     entry->ChangeValue(StoreText(key.c_str()));
-    entry->SetInsertionPointEnd();
+    entry->SetInsertionPointEnd(); // the focus has selected all
+}
+
+// --- Texts in controls ---
+
+const char Text_TooLong[] = "The value is too long: a field can be edited up to 65,534 bytes.";
+const char Text_TooLongTip[] = "This value is too long to be shown in full.";
+
+bool Text_Take(wxTextCtrl *control, const wxString &text)
+{
+    wxString old = control->GetValue();
+    if (text == old)
+        return true;
+    control->ChangeValue(text);
+    bool taken = control->GetValue() == text;
+    if (!taken)
+        control->ChangeValue(old);
+    return taken;
+}
+
+long Text_WrapStyle(const wxString &text)
+{
+    int length = 0, longest = 0;
+    for (wxUniChar c : text) {
+        length = c == ' ' || c == '\n' ? 0 : length + 1;
+        longest = std::max(longest, length);
+    }
+    return longest > LONG_WORD ? wxTE_CHARWRAP : wxTE_BESTWRAP;
 }

@@ -8,7 +8,7 @@
 class wxDialog;
 class wxFlexGridSizer;
 class wxSizer;
-class wxTextEntry;
+class wxTextCtrl;
 class wxWindow;
 
 // Device-independent pixels.
@@ -36,6 +36,18 @@ bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString 
 bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, long style = 0);
 
 // Offers to take the characters out of `key` (store text) that no key may hold; what is left goes
-// into `entry`, for the user to look at.
+// into `field`, which is a text entry and gets the focus.
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
-                       std::string key, wxTextEntry *entry);
+                       std::string key, wxWindow *field);
+
+// --- Texts in controls ---
+
+extern const char Text_TooLong[];    // for the user: of a value that no control for one line holds
+extern const char Text_TooLongTip[]; // for the tip of a control that can't show its value
+
+// False when the control can't hold the text: it keeps what it has.
+bool Text_Take(wxTextCtrl *control, const wxString &text);
+
+// How a control for several lines wraps this text: between words, unless one is so long that this
+// would take minutes.
+long Text_WrapStyle(const wxString &text);

@@ -1,16 +1,13 @@
 #include "ui/DisplayText.h"
 
-#include <algorithm>
-
 #include <wx/control.h>
 #include <wx/dcclient.h>
 #include <wx/strconv.h>
-#include <wx/textctrl.h>
 
 #include "encoding/Encoding.h"
 #include "store/BibStore.h"
 
-enum { LONGEST_TEXT = 1000, LONG_WORD = 1000 }; // characters
+enum { LONGEST_TEXT = 1000 }; // characters
 
 wxString StoreText(const char *text)
 {
@@ -49,14 +46,4 @@ wxString ShortText(wxWindow *control, const wxString &text, int width)
     dc.SetFont(control->GetFont());
     return wxControl::Ellipsize(text, dc, wxELLIPSIZE_MIDDLE, control->FromDIP(width),
                                 wxELLIPSIZE_FLAGS_NONE);
-}
-
-long WrapStyle(const wxString &text)
-{
-    int length = 0, longest = 0;
-    for (wxUniChar c : text) {
-        length = c == ' ' || c == '\n' ? 0 : length + 1;
-        longest = std::max(longest, length);
-    }
-    return longest > LONG_WORD ? wxTE_CHARWRAP : wxTE_BESTWRAP;
 }

@@ -18,12 +18,9 @@ wxString ShortText(wxWindow *control, const wxString &text, int width);
 
 wxString FileTip(const BibFile *file); // its path, and whether it is read-only
 
-// The beginning of a very long text, for windows that show one whole: tips, boxes, lists.
+// The first 1000 characters of a longer text, and an ellipsis; for what shows a text whole: tips,
+// boxes, lists.
 wxString BoundedText(const wxString &text);
-
-// How a control for several lines wraps this text: between words, unless one is so long that this
-// would take minutes.
-long WrapStyle(const wxString &text);
 
 // A file name as the system wants it.
 std::string PathBytes(const wxString &path);

@@ -2,7 +2,6 @@
 
 #include <wx/checkbox.h>
 #include <wx/choice.h>
-#include <wx/msgdlg.h>
 #include <wx/sizer.h>
 #include <wx/textctrl.h>
 
@@ -83,7 +82,6 @@ bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)
                           "The key includes invalid characters.\n"
                           "We will remove them from key and continue.",
                           key, m_key);
-        m_key->SetFocus();
         return false;
     case KEY_MISFIT:
         Refuse(StoreText(Key_MisfitText().c_str()));

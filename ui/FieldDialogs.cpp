@@ -29,7 +29,7 @@ Cartulo_EditField::Cartulo_EditField(wxWindow *parent, const wxString &key, cons
     keyText->SetLabelText(key);
     heading->Add(keyText);
     m_value = new wxTextCtrl(this, ID_FIELD_VALUE, "There is no editable field", wxDefaultPosition,
-                             wxDefaultSize, wxTE_MULTILINE | WrapStyle(value));
+                             wxDefaultSize, wxTE_MULTILINE | Text_WrapStyle(value));
     m_value->SetMinSize(FromDIP(wxSize(600, 200)));
 
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);

@@ -5,6 +5,7 @@
 #include <wx/textctrl.h>
 
 #include "app/Companion.h"
+#include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/MessagesText.h"
 #include "ui/Theme.h"
@@ -38,11 +39,12 @@ Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
 {
     SetFont(wxFontInfo(10));
     m_heading = new wxStaticText(this, wxID_ANY, "");
+    wxString text = TextOf(set);
     m_text = new wxTextCtrl(this, ID_MESSAGES_TEXT, "There is no messages ...", wxDefaultPosition,
-                            wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY | WrapStyle(TextOf(set)));
+                            wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY | Text_WrapStyle(text));
     m_text->SetFont(wxFontInfo(10).Family(wxFONTFAMILY_TELETYPE));
     m_text->SetMinSize(FromDIP(wxSize(600, 200)));
-    Fill(set);
+    ShowText(set, text);
 
     const int border = FromDIP(12);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
@@ -57,10 +59,15 @@ Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
 
 void Cartulo_Messages::Fill(const BibFileSet *set)
 {
+    ShowText(set, TextOf(set));
+}
+
+void Cartulo_Messages::ShowText(const BibFileSet *set, const wxString &text)
+{
     MessagesVerdict verdict = Messages_Verdict(set);
     m_heading->SetLabelText(Messages_Heading(verdict));
     Theme_SetTextColour(m_heading, HeadingColour(verdict));
-    m_text->ChangeValue(TextOf(set));
+    m_text->ChangeValue(text);
 }
 
 void Cartulo_Messages::OnOK(wxCommandEvent &event)

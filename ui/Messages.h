@@ -16,6 +16,7 @@ public:
     void Fill(const BibFileSet *set); // reads the set once, here
 
 private:
+    void ShowText(const BibFileSet *set, const wxString &text);
     void OnOK(wxCommandEvent &event);
 
     wxStaticText *m_heading; // child windows

@@ -39,9 +39,9 @@ Cartulo_Preamble::Cartulo_Preamble(Cartulo *panel)
 {
     SetFont(wxFontInfo(10));
     m_file = new wxChoice(this, ID_PREAMBLE_FILE);
-    m_text =
-        new wxTextCtrl(this, ID_PREAMBLE_TEXT, "There is no editable BIB-files", wxDefaultPosition,
-                       wxDefaultSize, wxTE_MULTILINE | WrapStyle(AllPreambles(panel->Files())));
+    m_text = new wxTextCtrl(this, ID_PREAMBLE_TEXT, "There is no editable BIB-files",
+                            wxDefaultPosition, wxDefaultSize,
+                            wxTE_MULTILINE | Text_WrapStyle(AllPreambles(panel->Files())));
     m_text->SetFont(wxFontInfo(10).Family(wxFONTFAMILY_TELETYPE));
     m_text->SetMinSize(FromDIP(wxSize(600, 200)));
     FillFiles();
@@ -64,8 +64,8 @@ void Cartulo_Preamble::FillFiles()
     }
     for (int i = 0; i < set->count; ++i)
         m_file->Append(ShortText(m_file, PathText(set->files[i]->baseName), DIALOG_ITEM));
-    PreambleFile = Preamble_FitFile(set, PreambleFile);
-    m_file->SetSelection(PreambleFile);
+    CurrentPreamble = Preamble_FitFile(set, CurrentPreamble);
+    m_file->SetSelection(CurrentPreamble);
     UpdatePreamble();
 }
 
@@ -73,11 +73,11 @@ void Cartulo_Preamble::FillFiles()
 void Cartulo_Preamble::UpdatePreamble()
 {
     const BibFileSet *set = m_panel->Files();
-    const char *name = set->files[PreambleFile]->baseName;
+    const char *name = set->files[CurrentPreamble]->baseName;
     TNSMessage("INFO: Cartulo_Preamble::UpdatePreamble ", PathText(name).utf8_str(), TNS_ACTION);
-    PreambleFile = Preamble_FindFile(set, name);
-    const BibFile *file = set->files[PreambleFile];
-    m_file->SetSelection(PreambleFile);
+    CurrentPreamble = Preamble_FindFile(set, name);
+    const BibFile *file = set->files[CurrentPreamble];
+    m_file->SetSelection(CurrentPreamble);
     m_file->SetToolTip(FileTip(file));
     m_text->ChangeValue(StoreText(file->preamble));
     m_text->SetInsertionPoint(0);
@@ -85,20 +85,23 @@ void Cartulo_Preamble::UpdatePreamble()
     m_filled = m_text->GetValue();
 }
 
-// The file that is shown, with what `text` becomes of its preamble; null when that can't be
-// changed, or is what it was.
-BibFile *Cartulo_Preamble::ChangedFile(std::string *text) const
+// The file that is shown; null when it can't be changed.
+BibFile *Cartulo_Preamble::WritableFile() const
 {
     const BibFileSet *set = m_panel->Files();
-    BibFile *file = set->count > 0 ? set->files[PreambleFile] : nullptr;
-    if (!file || file->readOnly || m_text->GetValue() == m_filled)
-        return nullptr;
-    *text = Preamble_Read(m_text->GetValue().ToStdWstring());
-    return *text == file->preamble ? nullptr : file;
+    BibFile *file = set->count > 0 ? set->files[CurrentPreamble] : nullptr;
+    return file && !file->readOnly ? file : nullptr;
+}
+
+// What becomes of the file's preamble.
+std::string Cartulo_Preamble::Typed(const BibFile *file) const
+{
+    bool isTouched = m_text->GetValue() != m_filled;
+    return isTouched ? Preamble_Read(m_text->GetValue().ToStdWstring()) : file->preamble;
 }
 
 // False when it is too long, or the user does not want to lose what can't be stored.
-bool Cartulo_Preamble::MayStore(BibFile *file, const std::string &text)
+bool Cartulo_Preamble::Store(BibFile *file, const std::string &text)
 {
     std::string reason = Preamble_CheckSize(text);
     if (!reason.empty()) {
@@ -107,48 +110,41 @@ bool Cartulo_Preamble::MayStore(BibFile *file, const std::string &text)
     }
     std::wstring losses = Value_Losses(L"PREAMBLE", m_text->GetValue().ToStdWstring(),
                                        Value_HoldsGuillemets(file->preamble));
-    return losses.empty() ||
-           Box_Ask(this, QuestionCaption, losses + Value_LossesQuestion, wxNO_DEFAULT);
-}
-
-void Cartulo_Preamble::Store(BibFile *file, const std::string &text)
-{
+    if (!losses.empty() &&
+        !Box_Ask(this, QuestionCaption, losses + Value_LossesQuestion, wxNO_DEFAULT))
+        return false;
     Preamble_Store(file, text);
-    m_panel->SetModified(PreambleFile);
+    m_panel->SetModified(CurrentPreamble);
+    return true;
 }
 
 // False when the user wants to stay, or has to.
 bool Cartulo_Preamble::LeaveFile()
 {
-    std::string text;
-    BibFile *file = ChangedFile(&text);
-    if (!file)
+    BibFile *file = WritableFile();
+    std::string text = file ? Typed(file) : "";
+    if (!file || text == file->preamble)
         return true;
     int answer = wxMessageBox("There are changes in current preamble text.\n\n Do you want to "
                               "accept they ?",
                               QuestionCaption, wxYES_NO | wxICON_QUESTION, this);
-    if (answer != wxYES)
-        return answer == wxNO;
-    if (!MayStore(file, text))
-        return false;
-    Store(file, text);
-    return true;
+    return answer == wxYES ? Store(file, text) : answer == wxNO;
 }
 
 void Cartulo_Preamble::OnFile(wxCommandEvent &)
 {
-    int chosen = m_file->GetSelection();
-    if (chosen == PreambleFile)
-        return;
-    if (!LeaveFile()) {
-        m_file->SetSelection(PreambleFile);
+    const BibFileSet *set = m_panel->Files();
+    int chosen = Preamble_FindFile(set, set->files[m_file->GetSelection()]->baseName);
+    if (chosen == CurrentPreamble || !LeaveFile()) {
+        m_file->SetSelection(CurrentPreamble);
         return;
     }
-    PreambleFile = chosen;
+    CurrentPreamble = chosen;
     UpdatePreamble();
 }
 
-// Its line ends are those of Enter: CR LF would end pieces within braces.
+// Its line ends are those of Enter: CR LF would end pieces within braces. More than a file holds
+// would only keep the control busy.
 void Cartulo_Preamble::OnPaste(wxClipboardTextEvent &event)
 {
     wxClipboardLocker lock;
@@ -157,7 +153,12 @@ void Cartulo_Preamble::OnPaste(wxClipboardTextEvent &event)
         event.Skip();
         return;
     }
-    m_text->WriteText(wxTextBuffer::Translate(data.GetText(), wxTextFileType_Unix));
+    wxString text = wxTextBuffer::Translate(data.GetText(), wxTextFileType_Unix);
+    std::string reason = Preamble_CheckSize(Preamble_Read(text.ToStdWstring()));
+    if (reason.empty())
+        m_text->WriteText(text);
+    else
+        Box_Warn(this, GetTitle(), StoreText(reason.c_str()));
 }
 
 static bool CopyText(const wxString &text)
@@ -167,38 +168,36 @@ static bool CopyText(const wxString &text)
     return !!lock && wxTheClipboard->SetData(new wxTextDataObject(unixText));
 }
 
-// Tells of the pieces that can't be written. True when there are some; what was typed is in the
-// clipboard then, as the window closes.
-bool Cartulo_Preamble::Refuse(const std::string &text)
+// True when the window may close: what was typed is in the clipboard then.
+bool Cartulo_Preamble::Refuse(const std::vector<PreambleFault> &faults)
 {
-    std::vector<PreambleFault> faults = Preamble_Check(text);
     for (const PreambleFault &fault : faults)
         Box_Warn(this, "Editing Preamble - Syntax Error",
                  BoundedText(StoreText(fault.piece.c_str())) + "\n:" + fault.reason +
                      "\n\nWrong preamble can;t be accepted.\nFix it and then try again.");
-    return !faults.empty();
+    if (!CopyText(m_text->GetValue())) {
+        Box_Warn(this, GetTitle(),
+                 "What you typed can't be copied to the clipboard, so it stays here.");
+        return false;
+    }
+    ShowStatus(m_panel, "The preamble is as it was; what you typed is in the clipboard.");
+    return true;
 }
 
 // False when the window has to stay open.
 bool Cartulo_Preamble::Accept()
 {
-    std::string text;
-    BibFile *file = ChangedFile(&text);
-    if (!file) {
+    BibFile *file = WritableFile();
+    if (!file)
+        return true;
+    std::string text = Typed(file);
+    if (text == file->preamble) {
         AppLog("Editing Preamble: ", "Preamble was not changed");
         return true;
     }
     AppLog("Editing Preamble: ", "Preamble was changed - save it.");
-    if (!Refuse(text)) {
-        bool stored = MayStore(file, text);
-        if (stored)
-            Store(file, text);
-        return stored;
-    }
-    if (!CopyText(m_text->GetValue()))
-        return false;
-    ShowStatus(m_panel, "The preamble is as it was; what you typed is in the clipboard.");
-    return true;
+    std::vector<PreambleFault> faults = Preamble_Check(text);
+    return faults.empty() ? Store(file, text) : Refuse(faults);
 }
 
 void Cartulo_Preamble::OnOK(wxCommandEvent &event)

@@ -4,6 +4,7 @@
 #include <wx/dialog.h>
 
 #include <string>
+#include <vector>
 
 #include "store/BibStore.h"
 
@@ -11,6 +12,7 @@ class Cartulo;
 class wxChoice;
 class wxClipboardTextEvent;
 class wxTextCtrl;
+struct PreambleFault;
 
 enum { ID_PREAMBLE_FILE = 6001, ID_PREAMBLE_TEXT };
 
@@ -22,11 +24,11 @@ public:
 private:
     void FillFiles();
     void UpdatePreamble();
-    BibFile *ChangedFile(std::string *text) const;
-    bool MayStore(BibFile *file, const std::string &text);
-    void Store(BibFile *file, const std::string &text);
+    BibFile *WritableFile() const;
+    std::string Typed(const BibFile *file) const;
+    bool Store(BibFile *file, const std::string &text);
     bool LeaveFile();
-    bool Refuse(const std::string &text);
+    bool Refuse(const std::vector<PreambleFault> &faults);
     bool Accept();
     void OnFile(wxCommandEvent &event);
     void OnPaste(wxClipboardTextEvent &event);

@@ -5,7 +5,7 @@
 
 #include "ui/Values.h"
 
-int PreambleFile = 0;
+int CurrentPreamble = 0;
 
 // --- Files ---
 

@@ -10,7 +10,7 @@
 
 #include "store/BibFileSet.h"
 
-extern int PreambleFile; // index of the file that the window showed last
+extern int CurrentPreamble; // index of the file that the window showed last
 
 // The index to begin with: the remembered one, or the last file's. -1 without files.
 int Preamble_FitFile(const BibFileSet *set, int index);

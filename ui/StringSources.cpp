@@ -10,7 +10,7 @@
 // Of buffers, in bytes with the end: what does not fit is not read.
 enum { NAMES_SIZE = 1024, SECTION_NAME_SIZE = 64, LIST_SIZE = 4096 };
 
-int StringSource = STRINGS_OF_ALL_FILES;
+int CurrentStringSource = STRINGS_OF_ALL_FILES;
 
 // --- Sources ---
 

@@ -14,9 +14,13 @@
 #include "ui/Keys.h"
 
 enum { STRINGS_OF_ALL_FILES = -1 };
-enum { ID_STRING_SOURCE = 6001, ID_STRING_ADD = 6003, ID_STRING_REMOVE, ID_STRING_EDIT };
 
-extern int StringSource; // what the window showed last; of all files at first
+// Identifiers in the window of the list, and in that of one abbreviation.
+enum { ID_STRING_SOURCE = 6001, ID_STRING_ADD = 6003, ID_STRING_REMOVE, ID_STRING_EDIT };
+enum { ID_STRING_KEY = 6001, ID_STRING_VALUE };
+static_assert(ID_STRING_REMOVE == 6004 && ID_STRING_EDIT == 6005 && ID_STRING_VALUE == 6002);
+
+extern int CurrentStringSource; // what the window showed last; of all files at first
 
 struct StringSources {
     const BibFileSet *set;          // outlives the record

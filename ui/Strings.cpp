@@ -4,9 +4,7 @@
 
 #include <wx/choice.h>
 #include <wx/listbox.h>
-#include <wx/msgdlg.h>
 #include <wx/sizer.h>
-#include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "app/Companion.h"
@@ -104,33 +102,34 @@ void Cartulo_Strings::FillSources()
     const BibFileSet *set = m_sources.set;
     wxArrayString items;
     for (const std::string &list : m_sources.lists)
-        items.Add(StoreText(list.c_str()));
+        items.Add(ShortText(m_source, StoreText(list.c_str()), DIALOG_ITEM));
     items.Add("*All Files*");
     for (int i = 0; i < set->count; ++i)
         items.Add(ShortText(m_source, PathText(set->files[i]->baseName), DIALOG_ITEM));
     m_source->Append(items);
-    StringSource = Strings_FitSource(&m_sources, StringSource);
-    m_source->SetSelection(StringSource + Strings_FirstFile(&m_sources));
+    CurrentStringSource = Strings_FitSource(&m_sources, CurrentStringSource);
+    m_source->SetSelection(CurrentStringSource + Strings_FirstFile(&m_sources));
 }
 
-BibFile *Cartulo_Strings::SourceFile() const
+BibFile *Cartulo_Strings::WritableFile() const
 {
-    return Strings_WritableFile(&m_sources, StringSource);
+    return Strings_WritableFile(&m_sources, CurrentStringSource);
 }
 
 void Cartulo_Strings::UpdateStrings()
 {
     TNSMessage("INFO: Cartulo_Strings::UpdateStrings ", "", TNS_ACTION);
     int row = std::max(m_list->GetSelection(), 0);
-    m_lines = Strings_Lines(&m_sources, StringSource);
+    m_lines = Strings_Lines(&m_sources, CurrentStringSource);
     wxArrayString items;
     for (const std::string &line : m_lines)
         items.Add(BoundedText(StoreText(line.c_str())));
     m_list->Set(items);
     Select(row);
-    m_source->SetToolTip(StringSource < 0 ? "" : FileTip(m_sources.set->files[StringSource]));
+    m_source->SetToolTip(
+        CurrentStringSource < 0 ? "" : FileTip(m_sources.set->files[CurrentStringSource]));
     for (int id : {ID_STRING_ADD, ID_STRING_REMOVE, ID_STRING_EDIT})
-        FindWindow(id)->Enable(SourceFile() != nullptr);
+        FindWindow(id)->Enable(WritableFile() != nullptr);
 }
 
 // That row, or the last one when there are not so many.
@@ -153,7 +152,7 @@ std::string Cartulo_Strings::SelectedKey() const // "" when no row is selected
 BibString *Cartulo_Strings::SelectedString() const
 {
     int row = m_list->GetSelection();
-    const BibFile *file = SourceFile();
+    const BibFile *file = WritableFile();
     if (!file || row == wxNOT_FOUND)
         return nullptr;
     std::string key = SelectedKey();
@@ -166,9 +165,9 @@ BibString *Cartulo_Strings::SelectedString() const
 void Cartulo_Strings::OnSource(wxCommandEvent &)
 {
     int source = m_source->GetSelection() - Strings_FirstFile(&m_sources);
-    if (source == StringSource)
+    if (source == CurrentStringSource)
         return;
-    StringSource = source;
+    CurrentStringSource = source;
     UpdateStrings();
 }
 
@@ -176,13 +175,13 @@ void Cartulo_Strings::OnSource(wxCommandEvent &)
 void Cartulo_Strings::OnAdd(wxCommandEvent &)
 {
     TNSMessage("INFO: ", "Cartulo_Strings::OnAdd", TNS_ACTION);
-    if (!SourceFile())
+    if (!WritableFile())
         return;
     Cartulo_Strings_Edit dialog(this, "Creating New String Entry", nullptr);
     if (dialog.ShowModal() != wxID_OK)
         return;
     UpdateStrings();
-    m_panel->SetModified(StringSource);
+    m_panel->SetModified(CurrentStringSource);
     Select(int(m_lines.size()) - 1);
 }
 
@@ -197,7 +196,7 @@ void Cartulo_Strings::OnEdit(wxCommandEvent &)
         return;
     UpdateStrings();
     if (dialog.IsChanged())
-        m_panel->SetModified(StringSource);
+        m_panel->SetModified(CurrentStringSource);
 }
 
 void Cartulo_Strings::OnRemove(wxCommandEvent &)
@@ -207,9 +206,9 @@ void Cartulo_Strings::OnRemove(wxCommandEvent &)
     if (!string)
         return;
     wxString line = m_list->GetStringSelection();
-    String_Remove(SourceFile(), string);
+    String_Remove(WritableFile(), string);
     UpdateStrings();
-    m_panel->SetModified(StringSource);
+    m_panel->SetModified(CurrentStringSource);
     ShowStatus(m_panel, "The string is deleted: " + line);
 }
 
@@ -224,14 +223,11 @@ void Cartulo_Strings::Insert(const wxString &text)
     AppLog("INFO:(1) ", text.utf8_str());
     long at = m_target->GetInsertionPoint();
     AppLog(wxString::Format("INFO: at %ld insert ", at).utf8_str(), text.utf8_str());
-    wxString before = m_target->GetValue();
-    m_target->Replace(at, at, text);
-    if (m_target->GetValue().length() == before.length() + text.length())
-        return;
-    m_target->ChangeValue(before);
-    m_target->SetInsertionPoint(at);
-    Box_Warn(this, Caption,
-             "The value would be too long: a field can be edited up to 65,534 bytes.");
+    wxString value = m_target->GetValue();
+    bool taken = Text_Take(m_target, value.insert(size_t(at), text));
+    m_target->SetInsertionPoint(taken ? at + long(text.length()) : at);
+    if (!taken)
+        Box_Warn(this, Caption, Text_TooLong);
 }
 
 void Cartulo_Strings::OnOK(wxCommandEvent &event)
@@ -257,7 +253,7 @@ void Cartulo_Strings::OnCharHook(wxKeyEvent &event)
         event.Skip();
         return;
     }
-    if (!SourceFile()) {
+    if (!WritableFile()) {
         wxBell();
         return;
     }
@@ -276,7 +272,7 @@ Cartulo_Strings_Edit::Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxStr
                                            BibString *string)
     : wxDialog(strings, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
-      m_file(strings->SourceFile()), m_string(string)
+      m_file(strings->WritableFile()), m_string(string)
 {
     SetFont(wxFontInfo(10));
     m_key = new wxTextCtrl(this, ID_STRING_KEY);
@@ -302,7 +298,7 @@ void Cartulo_Strings_Edit::Fill()
     if (m_filled == value)
         return;
     m_value->SetEditable(false);
-    m_value->SetToolTip("This value is too long to be shown in full.");
+    m_value->SetToolTip(Text_TooLongTip);
 }
 
 void Cartulo_Strings_Edit::Refuse(const wxString &text, wxTextCtrl *at)
@@ -328,7 +324,6 @@ bool Cartulo_Strings_Edit::AcceptKey(const std::string &key, NameVerdict verdict
                           "String  key includes invalid characters.\n"
                           "We will remove them and continue.",
                           key, m_key);
-        m_key->SetFocus();
         return false;
     case NAME_UNWRITABLE:
         Refuse("A string of this name can't be written to a BIB file.\nIt must not begin with a "
@@ -364,13 +359,10 @@ bool Cartulo_Strings_Edit::AcceptLosses()
     return false;
 }
 
-// `stored`: whether there was memory for it.
-bool Cartulo_Strings_Edit::Finish(int stored)
+bool Cartulo_Strings_Edit::RefuseForMemory() // false
 {
-    m_isChanged = stored;
-    if (!stored)
-        Refuse("There is not enough memory for the string.", m_value);
-    return stored;
+    Refuse("There is not enough memory for the string.", m_value);
+    return false;
 }
 
 bool Cartulo_Strings_Edit::Add()
@@ -379,7 +371,10 @@ bool Cartulo_Strings_Edit::Add()
     if (!AcceptKey(key.text, String_CheckNewKey(m_file, key)))
         return false;
     std::string value = Value_Read(m_value->GetValue().ToStdWstring());
-    return AcceptValue(value) && Finish(String_Add(m_file, key.text.c_str(), value.c_str()));
+    if (!AcceptValue(value))
+        return false;
+    m_isChanged = String_Add(m_file, key.text.c_str(), value.c_str()) != 0;
+    return m_isChanged || RefuseForMemory();
 }
 
 bool Cartulo_Strings_Edit::Edit()
@@ -387,7 +382,10 @@ bool Cartulo_Strings_Edit::Edit()
     std::string value = Value_Read(m_value->GetValue().ToStdWstring());
     if (m_value->GetValue() == m_filled || value == m_string->value)
         return true;
-    return AcceptValue(value) && Finish(String_SetValue(m_string, value.c_str()));
+    if (!AcceptValue(value))
+        return false;
+    m_isChanged = String_SetValue(m_string, value.c_str()) != 0;
+    return m_isChanged || RefuseForMemory();
 }
 
 void Cartulo_Strings_Edit::OnOK(wxCommandEvent &event)

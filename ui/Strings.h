@@ -20,7 +20,7 @@ public:
     // to insert into. Both outlive the dialog.
     Cartulo_Strings(Cartulo *panel, wxTextCtrl *target);
 
-    BibFile *SourceFile() const; // whose abbreviations can be changed now; null for none
+    BibFile *WritableFile() const; // of the list, where that can be changed; null for none
 
 private:
     wxSizer *CreateSourceRow();
@@ -50,12 +50,10 @@ private:
     wxDECLARE_EVENT_TABLE();
 };
 
-enum { ID_STRING_KEY = 6001, ID_STRING_VALUE };
-
 class Cartulo_Strings_Edit : public wxDialog
 {
 public:
-    // `string` is one of the file that `strings` shows; null: a new one for that.
+    // `string` is one of the writable file that `strings` shows now; null: a new one for that.
     Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxString &title, BibString *string);
 
     bool IsChanged() const { return m_isChanged; } // the file's abbreviations are others now
@@ -66,12 +64,12 @@ private:
     bool AcceptKey(const std::string &key, NameVerdict verdict);
     bool AcceptValue(const std::string &value);
     bool AcceptLosses();
-    bool Finish(int stored);
+    bool RefuseForMemory();
     bool Add();
     bool Edit();
     void OnOK(wxCommandEvent &event);
 
-    BibFile *m_file;     // both outlive the dialog
+    BibFile *m_file;     // outlives the dialog, as m_string does
     BibString *m_string; // null for a new one
     wxTextCtrl *m_key;   // child windows
     wxTextCtrl *m_value;

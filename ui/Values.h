@@ -1,4 +1,4 @@
-// ui/Values.h - what users type for the value of a field or an abbreviation.
+// ui/Values.h - what users type for a value: of a field, an abbreviation, a preamble, a search.
 #pragma once
 
 #include <string>

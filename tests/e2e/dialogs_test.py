@@ -96,21 +96,21 @@ class Dialogs(EditorTest):
         self.assertEqual(b"@STRING{a = {A}}\n@STRING{c = {Changed}}\n\n", self.read("a.bib"))
         self.assertEqual(0, editor.close())
 
-    def add_piece(self, editor):
+    def add_piece_and_save(self, editor):
         xdotool("key", "ctrl+End")
         xdotool("type", "\\def\\c{")
         xdotool("key", "Return")
         xdotool("type", "z}")
         editor.answer(PREAMBLE, "ctrl+Return")
-
-    def test_a_preamble_keeps_its_pieces(self):
-        editor = self.start_on(PREAMBLES)
-        self.open(editor, "alt+p", PREAMBLE)
-        self.add_piece(editor)
         editor.wait_until_active()
         editor.press("alt+b")
         self.assertEqual(NEW_PREAMBLES, self.read("a.bib"))
         self.assertEqual(0, editor.close())
+
+    def test_a_preamble_keeps_its_pieces(self):
+        editor = self.start_on(PREAMBLES)
+        self.open(editor, "alt+p", PREAMBLE)
+        self.add_piece_and_save(editor)
 
     def test_a_preamble_that_is_refused_can_be_pasted(self):
         editor = self.start_on(PREAMBLES)
@@ -124,11 +124,7 @@ class Dialogs(EditorTest):
         editor.wait_until_active()
         self.open(editor, "alt+p", PREAMBLE)
         xdotool("key", "ctrl+a", "ctrl+v", "ctrl+Home", *["Delete"] * len("oops}\n"))
-        self.add_piece(editor)
-        editor.wait_until_active()
-        editor.press("alt+b")
-        self.assertEqual(NEW_PREAMBLES, self.read("a.bib"))
-        self.assertEqual(0, editor.close())
+        self.add_piece_and_save(editor)
 
     def test_messages_of_a_broken_library_can_be_copied(self):
         self.write("a.bib", FAULTY)

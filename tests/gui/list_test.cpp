@@ -138,11 +138,11 @@ TEST_F(ListInWindow, KeepsTheEntryThatWasFoundWhenTheSearchIsCleared)
 
 TEST_F(ListInWindow, SearchesForTheSameLettersInAnotherCodePage)
 {
-    Open(folder.Write("a.bib", "@misc{one, note = {\xE9}}\n@misc{two, note = {\xFD}}\n"));
+    Open(folder.Write("a.bib", "@misc{one, note = {\xE9}}\n@misc{two, note = {\x82}}\n"));
     SearchFor(L"\u00E9");
     EXPECT_EQ((std::vector<wxString>{"one (a)"}), Rows());
     frame->TakeCommand((folder.Path("a.bib") + " -eCP852").c_str());
-    EXPECT_TRUE(Rows().empty());
+    EXPECT_EQ((std::vector<wxString>{"two (a)"}), Rows());
     frame->TakeCommand((folder.Path("a.bib") + " -eCP1252").c_str());
     EXPECT_EQ((std::vector<wxString>{"one (a)"}), Rows());
 }

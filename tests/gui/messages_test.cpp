@@ -2,6 +2,7 @@
 
 #include "tests/gui/DialogTest.h"
 
+#include <wx/clipbrd.h>
 #include <wx/settings.h>
 #include <wx/textctrl.h>
 
@@ -71,8 +72,12 @@ TEST_F(Messages, CanBeCopied)
     auto copy = [](Cartulo_Messages &dialog) {
         wxTextCtrl *text = Find<wxTextCtrl>(dialog, 6001);
         text->SelectAll();
-        EXPECT_TRUE(text->CanCopy());
-        EXPECT_EQ(text->GetValue(), text->GetStringSelection());
+        text->Copy();
+        wxClipboardLocker lock;
+        wxTextDataObject data;
+        EXPECT_TRUE(wxTheClipboard->GetData(data));
+        EXPECT_EQ(text->GetValue(), data.GetText());
+        EXPECT_TRUE(data.GetText().Contains("SYNTAX ERROR: line 1: "));
     };
     wxTEST_DIALOG(Run(ID_MESSAGES), UseDialog<Cartulo_Messages>(copy));
 }

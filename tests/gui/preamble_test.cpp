@@ -67,7 +67,7 @@ protected:
     void SetUp() override
     {
         Edit::SetUp();
-        PreambleFile = 0;
+        CurrentPreamble = 0;
     }
 
     void OpenTwo()
@@ -99,7 +99,7 @@ protected:
             TextOf(dialog)->ChangeValue(text);
             ChooseItem(dialog, ID_PREAMBLE_FILE, 1);
             EXPECT_EQ(file, FileOf(dialog)->GetSelection());
-            EXPECT_EQ(file, PreambleFile);
+            EXPECT_EQ(file, CurrentPreamble);
             EXPECT_EQ(shown, TextOf(dialog)->GetValue());
         };
     }
@@ -144,7 +144,7 @@ TEST_F(Preamble, IsThatOfTheFileShownLast)
         EXPECT_EQ("other\r\n", TextOf(dialog)->GetValue());
     };
     Use(look);
-    PreambleFile = 7;
+    CurrentPreamble = 7;
     Use(look);
 }
 
@@ -159,7 +159,11 @@ TEST_F(Preamble, NeedsAFile)
         EXPECT_TRUE(PressOK(dialog));
     };
     Use(look);
-    EXPECT_EQ((Lines{{"ERROR: There is no editable BIB files", TNS_ERROR}}), TakeLog("ERROR: "));
+    Lines log = TakeLog("");
+    EXPECT_EQ(1, std::count(log.begin(), log.end(),
+                            LogLine{"ERROR: There is no editable BIB files", TNS_ERROR}));
+    for (const LogLine &line : log)
+        EXPECT_FALSE(wxString(line.text).Contains("Editing Preamble: ")) << line.text;
 }
 
 TEST_F(Preamble, OfAReadOnlyFileIsOnlyShown)
@@ -182,8 +186,11 @@ TEST_F(Preamble, IsThatOfTheLastOfFilesWithOneName)
         EXPECT_EQ("other\r\n", TextOf(dialog)->GetValue());
         ChooseItem(dialog, ID_PREAMBLE_FILE, 0);
         EXPECT_EQ(1, FileOf(dialog)->GetSelection());
-        EXPECT_EQ(1, PreambleFile);
+        EXPECT_EQ(1, CurrentPreamble);
         TextOf(dialog)->ChangeValue("new");
+        ChooseItem(dialog, ID_PREAMBLE_FILE, 0); // shows the same file: no question
+        EXPECT_EQ(1, FileOf(dialog)->GetSelection());
+        EXPECT_EQ("new", TextOf(dialog)->GetValue());
         EXPECT_TRUE(PressOK(dialog));
     };
     Use(type);
@@ -231,8 +238,11 @@ TEST_F(Preamble, IsLeftAloneByCancel)
     OpenTwo();
     Use([](Cartulo_Preamble &dialog) {
         TextOf(dialog)->ChangeValue("new");
-        EXPECT_EQ(wxID_CANCEL, dialog.FindWindow(wxID_CANCEL)->GetId());
+        dialog.Show();
+        PressButton(dialog, wxID_CANCEL);
+        EXPECT_FALSE(dialog.IsShown());
     });
+    EXPECT_STREQ("\\def\\a{x}\r\n\\def\\b{y}\r\n", Stored());
     EXPECT_FALSE(SaveEnabled());
 }
 
@@ -291,6 +301,22 @@ TEST_F(Preamble, GetsPastedTextWithTheLineEndsOfEnter)
     };
     Use(paste);
     EXPECT_STREQ("\\def\\a{x}\r\n\\def\\b{y}\r\n{c\nd}\r\n", Stored());
+}
+
+TEST_F(Preamble, TakesNoPastedTextThatIsTooLong)
+{
+    OpenTwo();
+    auto paste = [](Cartulo_Preamble &dialog) {
+        {
+            wxClipboardLocker lock;
+            wxTheClipboard->SetData(new wxTextDataObject(Long(8200)));
+        }
+        wxString before = TextOf(dialog)->GetValue();
+        TextOf(dialog)->Paste();
+        HandleQueuedEvents();
+        EXPECT_EQ(before, TextOf(dialog)->GetValue());
+    };
+    Use(paste, ExpectBox("Editing Preamble", TooLong, wxID_OK, Refusal));
 }
 
 // --- Turning to another file ---

@@ -465,10 +465,9 @@ TEST_F(Window, SavesNothingWhenTheFocusComesBackAtOnce)
     Open(folder.Write("a.bib", OneEntry));
     Change(0, "Changed");
     frame->OnActivation(false);
+    EXPECT_TRUE(frame->IsLeaving());
     frame->OnActivation(true);
-    wxTimer later;
-    later.StartOnce(500);
-    EXPECT_TRUE(WaitFor([&] { return !later.IsRunning(); }));
+    EXPECT_FALSE(frame->IsLeaving());
     EXPECT_EQ(OneEntry, folder.Read("a.bib"));
 }
 
