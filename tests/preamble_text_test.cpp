@@ -8,54 +8,86 @@
 #include "tests/support/LoadText.h"
 #include "ui/PreambleText.h"
 
+static std::string Read(const std::wstring &typed)
+{
+    return Preamble_Read(typed, "").text;
+}
+
 static const char TwoPieces[] = "\\def\\a{x}\r\n\\def\\b{y}\r\n";
 
 TEST(PreambleRead, KeepsWhatWasNotTouched)
 {
-    EXPECT_EQ(TwoPieces, Preamble_Read(L"\\def\\a{x}\r\n\\def\\b{y}\r\n"));
-    EXPECT_EQ("{a\nb}\r\n", Preamble_Read(L"{a\nb}\r\n"));
-    EXPECT_EQ("", Preamble_Read(L""));
+    EXPECT_EQ(TwoPieces, Read(L"\\def\\a{x}\r\n\\def\\b{y}\r\n"));
+    EXPECT_EQ("{a\nb}\r\n", Read(L"{a\nb}\r\n"));
+    EXPECT_EQ("", Read(L""));
 }
 
 TEST(PreambleRead, EndsAPieceWithAnEnterOutsideBraces)
 {
-    EXPECT_EQ("a\r\nb{}\r\nc\r\n", Preamble_Read(L"a\nb{}\nc\r\n"));
-    EXPECT_EQ("a\r\n\r\nb\r\n", Preamble_Read(L"a\n\nb"));
+    EXPECT_EQ("a\r\nb{}\r\nc\r\n", Read(L"a\nb{}\nc\r\n"));
+    EXPECT_EQ("a\r\n\r\nb\r\n", Read(L"a\n\nb"));
 }
 
 TEST(PreambleRead, KeepsAnEnterInsideBracesInItsPiece)
 {
-    EXPECT_EQ("\\def\\a{x\n{y\n}\n}\r\nz\r\n", Preamble_Read(L"\\def\\a{x\n{y\n}\n}\nz\r\n"));
+    EXPECT_EQ("\\def\\a{x\n{y\n}\n}\r\nz\r\n", Read(L"\\def\\a{x\n{y\n}\n}\nz\r\n"));
 }
 
 TEST(PreambleRead, TakesAClosingBraceTooManyForNone)
 {
-    EXPECT_EQ("a}\r\nb\r\n", Preamble_Read(L"a}\nb\r\n"));
-    EXPECT_EQ("a}{\nb\r\n", Preamble_Read(L"a}{\nb\r\n"));
+    EXPECT_EQ("a}\r\nb\r\n", Read(L"a}\nb\r\n"));
+    EXPECT_EQ("a}{\nb\r\n", Read(L"a}{\nb\r\n"));
 }
 
 TEST(PreambleRead, EndsWhatStandsBehindTheLastPiece)
 {
-    EXPECT_EQ("a\r\nb\r\n", Preamble_Read(L"a\r\nb"));
-    EXPECT_EQ("a\r\n", Preamble_Read(L"a"));
-    EXPECT_EQ("a {\n\r\n", Preamble_Read(L"a {\n"));
+    EXPECT_EQ("a\r\nb\r\n", Read(L"a\r\nb"));
+    EXPECT_EQ("a\r\n", Read(L"a"));
+    EXPECT_EQ("a {\n\r\n", Read(L"a {\n"));
 }
 
 TEST(PreambleRead, MakesNothingOfLineEndsAlone)
 {
-    EXPECT_EQ("", Preamble_Read(L"\r\n\n\r\n"));
-    EXPECT_EQ(" \r\n", Preamble_Read(L" "));
+    EXPECT_EQ("", Read(L"\r\n\n\r\n"));
+    EXPECT_EQ(" \r\n", Read(L" "));
 }
 
 TEST(PreambleRead, KeepsTheEndsOfPiecesInsideBraces)
 {
-    EXPECT_EQ("a{\r\nb!\r\n", Preamble_Read(L"a{\r\nb!\r\n"));
-    EXPECT_EQ("a{\r\nb\r\n{\n}\r\n", Preamble_Read(L"a{\r\nb\n{\n}\r\n"));
+    EXPECT_EQ("a{\r\nb!\r\n", Read(L"a{\r\nb!\r\n"));
+    EXPECT_EQ("a{\r\nb\r\n{\n}\r\n", Read(L"a{\r\nb\n{\n}\r\n"));
 }
 
 TEST(PreambleRead, MakesMarksOfGuillemets)
 {
-    EXPECT_EQ("a \2jan\5\r\n", Preamble_Read(L"a \u00ABjan\u00BB\r\n"));
+    EXPECT_EQ("a \2jan\5\r\n", Read(L"a \u00ABjan\u00BB\r\n"));
+}
+
+TEST(PreambleRead, KeepsTheBytesOfPiecesThatWereNotTouched)
+{
+    const char stored[] = "Zo\303\253\r\nb\r\n\253c\273\r\n";
+    PreambleEdit edit = Preamble_Read(L"new\r\nZo\u00C3\u00AB\r\nb!\r\n\u00ABc\u00BB\r\n", stored);
+    EXPECT_EQ("new\r\nZo\303\253\r\nb!\r\n\253c\273\r\n", edit.text);
+    EXPECT_EQ(L"new\nb!\n", edit.touched);
+    EXPECT_EQ("b", edit.replaced);
+}
+
+TEST(PreambleRead, TakesEachOldPieceOnce)
+{
+    PreambleEdit edit = Preamble_Read(L"\u00AB\r\n\u00AB\r\n", "\253\r\n");
+    EXPECT_EQ("\253\r\n\2\r\n", edit.text);
+    EXPECT_EQ(L"\u00AB\n", edit.touched);
+}
+
+TEST(PreambleCheckMarks, RefusesWhatCouldNotBeReadAgain)
+{
+    EXPECT_EQ("", Preamble_CheckMarks("a}\r\n{\2jan\5\r\n\2x\5 \2y\5\r\n"));
+    for (const char *text :
+         {"a\r\n\2b\r\n", "b\5\r\n", "\2a\2b\5\5\r\n", "\2\5\r\n", "\2a{b\5\r\n"})
+        EXPECT_EQ("The marks of an abbreviation must be a pair around the name of one.\n"
+                  "Else the file could not be read any more.\n\nFix it to continue.",
+                  Preamble_CheckMarks(text))
+            << text;
 }
 
 TEST(PreambleCheckSize, AllowsWhatAFileHolds)

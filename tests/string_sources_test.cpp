@@ -131,6 +131,25 @@ TEST_F(StringsSources, CanBeChangedWhenTheyAreAWritableFile)
         EXPECT_EQ(nullptr, Strings_WritableFile(&sources, source)) << source;
 }
 
+static std::string Compare(const Lines &before, const Lines &after)
+{
+    LineChange change = Strings_Compare(before, after);
+    return std::to_string(change.first) + " -" + std::to_string(change.removed) + " +" +
+           std::to_string(change.added);
+}
+
+TEST(StringsCompare, FindsTheRowsThatChanged)
+{
+    EXPECT_EQ("0 -0 +0", Compare({}, {}));
+    EXPECT_EQ("0 -0 +2", Compare({}, {"a", "b"}));
+    EXPECT_EQ("2 -0 +1", Compare({"a", "b"}, {"a", "b", "c"}));
+    EXPECT_EQ("1 -1 +0", Compare({"a", "b", "c"}, {"a", "c"}));
+    EXPECT_EQ("1 -1 +1", Compare({"a", "b", "c"}, {"a", "B", "c"}));
+    EXPECT_EQ("2 -1 +0", Compare({"a", "a", "a"}, {"a", "a"}));
+    EXPECT_EQ("0 -2 +0", Compare({"a", "b"}, {}));
+    EXPECT_EQ("2 -0 +0", Compare({"a", "b"}, {"a", "b"}));
+}
+
 TEST(StringsKeyOf, EndsAtTheFirstBlank)
 {
     EXPECT_EQ("jan", Strings_KeyOf("jan = January"));

@@ -39,14 +39,32 @@ TEST(ValueHoldsGuillemets, TellsTextFromMarks)
 
 TEST(ValueLosses, NamesEachCharacterOnce)
 {
-    EXPECT_EQ(L"", Value_Losses(L"a", L"M\u00FCller \u00ABjan\u00BB", false));
+    EXPECT_EQ(L"", Value_Losses(L"a", L"M\u00FCller \u00ABjan\u00BB", "", false));
     EXPECT_EQ(L"`a': \u0142 \u0416 U+0085 can't be stored in CP1252 and would become \u00FF.\n",
-              Value_Losses(L"a", L"\u0142\u0416\u0142\u0085", false));
+              Value_Losses(L"a", L"\u0142\u0416\u0142\u0085", "", false));
 }
 
 TEST(ValueLosses, TellsOfGuillemetsWhereTextHadThem)
 {
     EXPECT_EQ(L"`a': \u00AB and \u00BB will mark an abbreviation, not stand as text.\n",
-              Value_Losses(L"a", L"\u00ABjan\u00BB", true));
-    EXPECT_EQ(L"", Value_Losses(L"a", L"jan", true));
+              Value_Losses(L"a", L"\u00ABjan\u00BB", "", true));
+    EXPECT_EQ(L"", Value_Losses(L"a", L"jan", "", true));
+}
+
+TEST(ValueLosses, TellsOfBytesThatTheCodePageShowsAsOthers)
+{
+    EXPECT_EQ(L"", Value_Losses(L"a", L"x", "\253M\374ller\273 \2jan\5", false));
+    Enc_Select("CP20127");
+    EXPECT_EQ(L"", Value_Losses(L"a", L"x", "plain", false));
+    for (const char *stored : {"M\303\274ller", "\200"})
+        EXPECT_EQ(L"`a': CP20127 shows bytes of the old value as other characters, and they would "
+                  L"become those.\n",
+                  Value_Losses(L"a", L"x", stored, false));
+}
+
+TEST(ValueShow, HasNoCharacterThatEndsATextInAControl)
+{
+    EXPECT_EQ(L"M\u00FCller", Value_Show("M\374ller"));
+    Enc_Select("CP20127");
+    EXPECT_EQ(L"a\uFFFDb", Value_Show("a\200b"));
 }

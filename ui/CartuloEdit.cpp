@@ -52,7 +52,7 @@ void Cartulo::FitRow(int row)
     label->SetMinSize(wxSize(std::min(width, widest), -1));
     label->SetToolTip(width > widest ? label->GetLabelText() : wxString());
     if (m_grid.rows[row].locked)
-        value->SetToolTip(Text_TooLongTip);
+        value->SetToolTip(Text_LockedTip);
     else
         value->SetToolTip(Fits(value) ? wxString() : BoundedText(value->GetValue()));
 }
@@ -321,13 +321,9 @@ void Cartulo::FocusForMode()
         m_list->SetFocus();
 }
 
-// The toolkit would select the whole value: the next letter would take its place.
 void Cartulo::FocusRow(int row)
 {
-    wxTextCtrl *value = m_rows[row].value;
-    long at = value->GetInsertionPoint();
-    value->SetFocus();
-    value->SetInsertionPoint(at);
+    Text_Focus(m_rows[row].value);
 }
 
 // The list is enabled before it gets the focus, and disabled after it lost it.

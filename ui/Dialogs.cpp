@@ -49,13 +49,17 @@ static void AcceptByEnter(wxDialog *dialog, wxKeyEvent &event)
     dialog->ProcessWindowEvent(press);
 }
 
+wxSizerFlags Dialog_ButtonPlace(const wxWindow *dialog)
+{
+    return wxSizerFlags().Expand().Border(wxLEFT | wxBOTTOM, dialog->FromDIP(DIALOG_BORDER));
+}
+
 void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus)
 {
     const int border = dialog->FromDIP(DIALOG_BORDER);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
     column->Add(content, wxSizerFlags(1).Expand().Border(wxALL, border));
-    column->Add(dialog->CreateStdDialogButtonSizer(wxOK | wxCANCEL),
-                wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
+    column->Add(dialog->CreateStdDialogButtonSizer(wxOK | wxCANCEL), Dialog_ButtonPlace(dialog));
     dialog->SetSizerAndFit(column);
     dialog->CentreOnParent();
     dialog->Bind(wxEVT_CHAR_HOOK, [dialog](wxKeyEvent &event) { AcceptByEnter(dialog, event); });
@@ -93,7 +97,15 @@ void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString
 // --- Texts in controls ---
 
 const char Text_TooLong[] = "The value is too long: a field can be edited up to 65,534 bytes.";
-const char Text_TooLongTip[] = "This value is too long to be shown in full.";
+const char Text_LockedTip[] = "This value can't be shown in full, so it stays as it is.";
+
+// The toolkit selects the whole text: the next letter would take its place.
+void Text_Focus(wxTextCtrl *control)
+{
+    long at = control->GetInsertionPoint();
+    control->SetFocus();
+    control->SetInsertionPoint(at);
+}
 
 bool Text_Take(wxTextCtrl *control, const wxString &text)
 {

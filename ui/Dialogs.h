@@ -3,11 +3,10 @@
 
 #include <string>
 
+#include <wx/sizer.h>
 #include <wx/string.h>
 
 class wxDialog;
-class wxFlexGridSizer;
-class wxSizer;
 class wxTextCtrl;
 class wxWindow;
 
@@ -22,6 +21,10 @@ enum {
 wxFlexGridSizer *Dialog_CreateRows(wxWindow *dialog);
 void Dialog_AddRow(wxFlexGridSizer *rows, wxWindow *dialog, const wxString &label,
                    wxWindow *control);
+
+// For the toolkit's row of buttons at the end of a dialog's column: it has a border of its own at
+// the right.
+wxSizerFlags Dialog_ButtonPlace(const wxWindow *dialog);
 
 // Puts OK and Cancel below the content, fits and centres the dialog. `focus` gets the focus. Enter
 // in a field of one line is OK at once, and Ctrl+Enter everywhere.
@@ -42,8 +45,10 @@ void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString
 
 // --- Texts in controls ---
 
-extern const char Text_TooLong[];    // for the user: of a value that no control for one line holds
-extern const char Text_TooLongTip[]; // for the tip of a control that can't show its value
+extern const char Text_TooLong[];   // for the user: of a value that no control for one line holds
+extern const char Text_LockedTip[]; // for the tip of a control that can't show its value
+
+void Text_Focus(wxTextCtrl *control); // the cursor stays where it is, and nothing gets selected
 
 // False when the control can't hold the text: it keeps what it has.
 bool Text_Take(wxTextCtrl *control, const wxString &text);

@@ -4,15 +4,14 @@
 #include <wx/dcclient.h>
 #include <wx/strconv.h>
 
-#include "encoding/Encoding.h"
 #include "store/BibStore.h"
+#include "ui/Values.h"
 
 enum { LONGEST_TEXT = 1000 }; // characters
 
 wxString StoreText(const char *text)
 {
-    std::wstring wide;
-    return wxString(Enc_ToUnicode(wide, text));
+    return wxString(Value_Show(text));
 }
 
 wxString PathText(const char *text)

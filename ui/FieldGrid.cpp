@@ -344,7 +344,7 @@ static std::wstring RowLosses(const GridRow *row, bool textGuillemets)
 {
     std::wstring key;
     Enc_ToUnicode(key, row->key.c_str());
-    return Value_Losses(key, row->text, textGuillemets);
+    return Value_Losses(key, row->text, row->stored, textGuillemets);
 }
 
 std::wstring Grid_Losses(const FieldGrid *grid)

@@ -46,11 +46,11 @@ Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
     m_text->SetMinSize(FromDIP(wxSize(600, 200)));
     ShowText(set, text);
 
-    const int border = FromDIP(12);
+    const int border = FromDIP(DIALOG_BORDER);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
     column->Add(m_heading, wxSizerFlags().Border(wxALL, border));
-    column->Add(m_text, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
-    column->Add(CreateStdDialogButtonSizer(wxOK), wxSizerFlags().Expand().Border(wxALL, border));
+    column->Add(m_text, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
+    column->Add(CreateStdDialogButtonSizer(wxOK), Dialog_ButtonPlace(this));
     SetSizerAndFit(column);
     // The window manager centres the dialog on its parent. It alone knows at the start where that
     // is.

@@ -1,6 +1,6 @@
 #include "ui/MessagesText.h"
 
-#include "encoding/Encoding.h"
+#include "ui/Values.h"
 
 static int HasLoadErrors(const BibFileSet *set)
 {
@@ -59,14 +59,14 @@ static std::wstring CountsText(const BibFile *file)
 
 std::wstring Messages_Text(const BibFileSet *set, std::wstring (*pathText)(const char *text))
 {
-    std::wstring text, messages;
+    std::wstring text;
     if (HasLoadErrors(set))
         text = pathText(set->loadErrors);
     for (int i = 0; i < set->count; ++i) {
         const BibFile *file = set->files[i];
         text += L"The file: '" + pathText(file->path) + L"'" + CountsText(file) + L":\n";
         if (file->messages)
-            text += Enc_ToUnicode(messages, file->messages);
+            text += Value_Show(file->messages);
         text += L"\n";
     }
     return text;

@@ -5,6 +5,8 @@
 
 #include "app/Ids.h"
 
+enum { DIMMEST = 50 }; // of a colour on a dark desktop, percent
+
 PanelPane Panel_Pane(int fileCount, int rowCount)
 {
     if (fileCount == 0)
@@ -72,6 +74,12 @@ static Colour MixWithWhite(Colour c, int percent)
     return {mix(c.red), mix(c.green), mix(c.blue)};
 }
 
+static Colour Dim(Colour c, int percent)
+{
+    auto dim = [percent](int channel) { return (unsigned char)(channel * percent / 100); };
+    return {dim(c.red), dim(c.green), dim(c.blue)};
+}
+
 Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme)
 {
     if (!darkTheme)
@@ -79,6 +87,9 @@ Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme)
     // What stands out by its darkness on a light background does so by its lightness here.
     double contrast = std::max({chosen.red, chosen.green, chosen.blue}) > 128 ? 4.5 : 7;
     Colour full = Saturate(chosen);
+    for (int percent = DIMMEST; percent < 100; percent += 5)
+        if (Colour dim = Dim(full, percent); Panel_Contrast(dim, background) >= contrast)
+            return dim;
     for (int percent = 0; percent < 100; percent += 5) {
         Colour lighter = MixWithWhite(full, percent);
         if (Panel_Contrast(lighter, background) >= contrast)

@@ -3,6 +3,7 @@
 #include <wx/choice.h>
 #include <wx/clipbrd.h>
 #include <wx/msgdlg.h>
+#include <wx/settings.h>
 #include <wx/sizer.h>
 #include <wx/textbuf.h>
 #include <wx/textctrl.h>
@@ -12,7 +13,6 @@
 #include "ui/Cartulo.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
-#include "ui/PreambleText.h"
 #include "ui/QListBox.h"
 #include "ui/Values.h"
 
@@ -24,14 +24,6 @@ wxBEGIN_EVENT_TABLE(Cartulo_Preamble, wxDialog)
     EVT_BUTTON(wxID_OK, Cartulo_Preamble::OnOK)
 wxEND_EVENT_TABLE()
 
-static wxString AllPreambles(const BibFileSet *set)
-{
-    wxString text;
-    for (int i = 0; i < set->count; ++i)
-        text += StoreText(set->files[i]->preamble) + "\n";
-    return text;
-}
-
 Cartulo_Preamble::Cartulo_Preamble(Cartulo *panel)
     : wxDialog(wxGetTopLevelParent(panel), wxID_ANY, "Editing Preamble", wxDefaultPosition,
                wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
@@ -40,8 +32,7 @@ Cartulo_Preamble::Cartulo_Preamble(Cartulo *panel)
     SetFont(wxFontInfo(10));
     m_file = new wxChoice(this, ID_PREAMBLE_FILE);
     m_text = new wxTextCtrl(this, ID_PREAMBLE_TEXT, "There is no editable BIB-files",
-                            wxDefaultPosition, wxDefaultSize,
-                            wxTE_MULTILINE | Text_WrapStyle(AllPreambles(panel->Files())));
+                            wxDefaultPosition, wxDefaultSize, wxTE_MULTILINE | wxTE_DONTWRAP);
     m_text->SetFont(wxFontInfo(10).Family(wxFONTFAMILY_TELETYPE));
     m_text->SetMinSize(FromDIP(wxSize(600, 200)));
     FillFiles();
@@ -59,7 +50,7 @@ void Cartulo_Preamble::FillFiles()
     const BibFileSet *set = m_panel->Files();
     if (set->count == 0) {
         TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR);
-        m_text->SetEditable(false);
+        ShowEditable(false);
         return;
     }
     for (int i = 0; i < set->count; ++i)
@@ -79,66 +70,92 @@ void Cartulo_Preamble::UpdatePreamble()
     const BibFile *file = set->files[CurrentPreamble];
     m_file->SetSelection(CurrentPreamble);
     m_file->SetToolTip(FileTip(file));
-    m_text->ChangeValue(StoreText(file->preamble));
+    m_filled = StoreText(file->preamble);
+    m_text->ChangeValue(m_filled);
     m_text->SetInsertionPoint(0);
-    m_text->SetEditable(!file->readOnly);
-    m_filled = m_text->GetValue();
+    bool isWhole = m_text->GetValue() == m_filled;
+    m_text->SetToolTip(isWhole ? "" : Text_LockedTip);
+    ShowEditable(!file->readOnly && isWhole);
 }
 
-// The file that is shown; null when it can't be changed.
+// What can't be edited looks like the window itself.
+void Cartulo_Preamble::ShowEditable(bool editable)
+{
+    m_text->SetEditable(editable);
+    m_text->SetBackgroundColour(
+        wxSystemSettings::GetColour(editable ? wxSYS_COLOUR_WINDOW : wxSYS_COLOUR_BTNFACE));
+}
+
+// The file that is shown; null when its preamble can't be changed.
 BibFile *Cartulo_Preamble::WritableFile() const
 {
     const BibFileSet *set = m_panel->Files();
-    BibFile *file = set->count > 0 ? set->files[CurrentPreamble] : nullptr;
-    return file && !file->readOnly ? file : nullptr;
+    return set->count > 0 && m_text->IsEditable() ? set->files[CurrentPreamble] : nullptr;
 }
 
-// What becomes of the file's preamble.
-std::string Cartulo_Preamble::Typed(const BibFile *file) const
+PreambleEdit Cartulo_Preamble::ReadEdit(const BibFile *file) const
 {
-    bool isTouched = m_text->GetValue() != m_filled;
-    return isTouched ? Preamble_Read(m_text->GetValue().ToStdWstring()) : file->preamble;
+    return Preamble_Read(m_text->GetValue().ToStdWstring(), file->preamble);
 }
 
-// False when it is too long, or the user does not want to lose what can't be stored.
-bool Cartulo_Preamble::Store(BibFile *file, const std::string &text)
+bool Cartulo_Preamble::IsChanged(const BibFile *file, const PreambleEdit &edit) const
 {
-    std::string reason = Preamble_CheckSize(text);
-    if (!reason.empty()) {
+    return m_text->GetValue() != m_filled && edit.text != file->preamble;
+}
+
+// False when the text is too long, or the user does not want to lose what can't be stored.
+bool Cartulo_Preamble::MayStore(const PreambleEdit &edit)
+{
+    if (!Allow(Preamble_CheckSize(edit.text)))
+        return false;
+    std::wstring losses = Value_Losses(L"PREAMBLE", edit.touched, edit.replaced,
+                                       Value_HoldsGuillemets(edit.replaced.c_str()));
+    return losses.empty() ||
+           Box_Ask(this, QuestionCaption, losses + Value_LossesQuestion, wxNO_DEFAULT);
+}
+
+// Shows a reason against the text, if there is one.
+bool Cartulo_Preamble::Allow(const std::string &reason)
+{
+    if (!reason.empty())
         Box_Warn(this, GetTitle(), StoreText(reason.c_str()));
-        return false;
-    }
-    std::wstring losses = Value_Losses(L"PREAMBLE", m_text->GetValue().ToStdWstring(),
-                                       Value_HoldsGuillemets(file->preamble));
-    if (!losses.empty() &&
-        !Box_Ask(this, QuestionCaption, losses + Value_LossesQuestion, wxNO_DEFAULT))
-        return false;
-    Preamble_Store(file, text);
+    return reason.empty();
+}
+
+void Cartulo_Preamble::Store(BibFile *file, const PreambleEdit &edit)
+{
+    Preamble_Store(file, edit.text);
     m_panel->SetModified(CurrentPreamble);
-    return true;
 }
 
 // False when the user wants to stay, or has to.
 bool Cartulo_Preamble::LeaveFile()
 {
     BibFile *file = WritableFile();
-    std::string text = file ? Typed(file) : "";
-    if (!file || text == file->preamble)
+    if (!file)
+        return true;
+    PreambleEdit edit = ReadEdit(file);
+    if (!IsChanged(file, edit))
         return true;
     int answer = wxMessageBox("There are changes in current preamble text.\n\n Do you want to "
                               "accept they ?",
                               QuestionCaption, wxYES_NO | wxICON_QUESTION, this);
-    return answer == wxYES ? Store(file, text) : answer == wxNO;
+    if (answer != wxYES)
+        return answer == wxNO;
+    bool stored = MayStore(edit) && Allow(Preamble_CheckMarks(edit.text));
+    if (stored)
+        Store(file, edit);
+    return stored;
 }
 
+// While it asks, the choice shows the file that it asks about.
 void Cartulo_Preamble::OnFile(wxCommandEvent &)
 {
     const BibFileSet *set = m_panel->Files();
     int chosen = Preamble_FindFile(set, set->files[m_file->GetSelection()]->baseName);
-    if (chosen == CurrentPreamble || !LeaveFile()) {
-        m_file->SetSelection(CurrentPreamble);
+    m_file->SetSelection(CurrentPreamble);
+    if (chosen == CurrentPreamble || !LeaveFile())
         return;
-    }
     CurrentPreamble = chosen;
     UpdatePreamble();
 }
@@ -154,11 +171,8 @@ void Cartulo_Preamble::OnPaste(wxClipboardTextEvent &event)
         return;
     }
     wxString text = wxTextBuffer::Translate(data.GetText(), wxTextFileType_Unix);
-    std::string reason = Preamble_CheckSize(Preamble_Read(text.ToStdWstring()));
-    if (reason.empty())
+    if (Allow(Preamble_CheckSize(Value_Read(text.ToStdWstring()))))
         m_text->WriteText(text);
-    else
-        Box_Warn(this, GetTitle(), StoreText(reason.c_str()));
 }
 
 static bool CopyText(const wxString &text)
@@ -190,14 +204,19 @@ bool Cartulo_Preamble::Accept()
     BibFile *file = WritableFile();
     if (!file)
         return true;
-    std::string text = Typed(file);
-    if (text == file->preamble) {
+    PreambleEdit edit = ReadEdit(file);
+    if (!IsChanged(file, edit)) {
         AppLog("Editing Preamble: ", "Preamble was not changed");
         return true;
     }
     AppLog("Editing Preamble: ", "Preamble was changed - save it.");
-    std::vector<PreambleFault> faults = Preamble_Check(text);
-    return faults.empty() ? Store(file, text) : Refuse(faults);
+    if (!MayStore(edit))
+        return false;
+    std::vector<PreambleFault> faults = Preamble_Check(edit.text);
+    if (!faults.empty())
+        return Refuse(faults);
+    Store(file, edit);
+    return true;
 }
 
 void Cartulo_Preamble::OnOK(wxCommandEvent &event)

@@ -6,13 +6,12 @@
 #include <string>
 #include <vector>
 
-#include "store/BibStore.h"
+#include "ui/PreambleText.h"
 
 class Cartulo;
 class wxChoice;
 class wxClipboardTextEvent;
 class wxTextCtrl;
-struct PreambleFault;
 
 enum { ID_PREAMBLE_FILE = 6001, ID_PREAMBLE_TEXT };
 
@@ -24,9 +23,13 @@ public:
 private:
     void FillFiles();
     void UpdatePreamble();
+    void ShowEditable(bool editable);
     BibFile *WritableFile() const;
-    std::string Typed(const BibFile *file) const;
-    bool Store(BibFile *file, const std::string &text);
+    PreambleEdit ReadEdit(const BibFile *file) const;
+    bool IsChanged(const BibFile *file, const PreambleEdit &edit) const;
+    bool Allow(const std::string &reason);
+    bool MayStore(const PreambleEdit &edit);
+    void Store(BibFile *file, const PreambleEdit &edit);
     bool LeaveFile();
     bool Refuse(const std::vector<PreambleFault> &faults);
     bool Accept();

@@ -38,38 +38,67 @@ static std::vector<std::string> SplitPieces(const std::string &text)
 
 // --- Reading ---
 
-static int Deepen(int depth, char c) // the depth of braces behind a character
+static int Deepen(int depth, wchar_t c) // the depth of braces behind a character
 {
-    if (c == '}')
+    if (c == L'}')
         return std::max(depth - 1, 0);
-    return depth + (c == '{');
+    return depth + (c == L'{');
 }
 
-static std::string EndLast(const std::string &text)
+// The pieces of what was typed, each without its end.
+static std::vector<std::wstring> TypedPieces(const std::wstring &typed)
 {
-    bool isEnded = text.size() >= 2 && text.compare(text.size() - 2, 2, "\r\n") == 0;
-    return isEnded ? text : text + "\r\n";
-}
-
-std::string Preamble_Read(const std::wstring &typed)
-{
-    std::string text = Value_Read(typed), read;
-    if (text.find_first_not_of("\r\n") == text.npos)
-        return "";
+    std::vector<std::wstring> pieces;
+    std::wstring piece;
     int depth = 0;
-    for (size_t at = 0; at < text.size(); ++at) {
-        bool isEnd = text.compare(at, 2, "\r\n") == 0;
+    for (size_t at = 0; at < typed.size(); ++at) {
+        bool isEnd = typed.compare(at, 2, L"\r\n") == 0;
         at += isEnd;
-        bool isEnter = text[at] == '\r' || text[at] == '\n';
+        bool isEnter = typed[at] == L'\r' || typed[at] == L'\n';
         if (!isEnter || (depth > 0 && !isEnd)) {
-            read += isEnter ? '\n' : text[at];
-            depth = Deepen(depth, text[at]);
+            piece += isEnter ? L'\n' : typed[at];
+            depth = Deepen(depth, typed[at]);
         } else {
-            read += "\r\n";
+            pieces.push_back(piece);
+            piece.clear();
             depth = 0;
         }
     }
-    return EndLast(read);
+    if (!piece.empty())
+        pieces.push_back(piece);
+    return pieces;
+}
+
+// Takes the first of the old pieces that is shown like this one. False for none.
+static bool TakeOld(std::vector<std::string> *old, const std::wstring &piece, std::string *bytes)
+{
+    auto isShownSo = [&](const std::string &stored) { return Value_Show(stored.c_str()) == piece; };
+    auto found = std::find_if(old->begin(), old->end(), isShownSo);
+    if (found == old->end())
+        return false;
+    *bytes = *found;
+    old->erase(found);
+    return true;
+}
+
+PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored)
+{
+    PreambleEdit edit;
+    std::vector<std::string> old = SplitPieces(stored);
+    std::vector<std::wstring> pieces;
+    if (typed.find_first_not_of(L"\r\n") != typed.npos)
+        pieces = TypedPieces(typed);
+    for (const std::wstring &piece : pieces) {
+        std::string bytes;
+        if (!TakeOld(&old, piece, &bytes)) {
+            bytes = Value_Read(piece);
+            edit.touched += piece + L'\n';
+        }
+        edit.text += bytes + "\r\n";
+    }
+    for (const std::string &piece : old)
+        edit.replaced += piece;
+    return edit;
 }
 
 // --- Checking and storing ---
@@ -92,6 +121,15 @@ std::vector<PreambleFault> Preamble_Check(const std::string &text)
         if (const char *reason = Value_Check(piece.c_str()))
             faults.push_back({piece, reason});
     return faults;
+}
+
+std::string Preamble_CheckMarks(const std::string &text)
+{
+    std::vector<std::string> pieces = SplitPieces(text);
+    if (std::none_of(pieces.begin(), pieces.end(), Value_HasBadMarks))
+        return "";
+    return "The marks of an abbreviation must be a pair around the name of one.\n"
+           "Else the file could not be read any more.\n\nFix it to continue.";
 }
 
 void Preamble_Store(BibFile *file, const std::string &text)

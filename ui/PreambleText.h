@@ -18,9 +18,21 @@ int Preamble_FitFile(const BibFileSet *set, int index);
 // The last one of the files of this name; -1 for none.
 int Preamble_FindFile(const BibFileSet *set, const char *baseName);
 
-// What the control holds, as the store keeps it. The ends of pieces stay; a line feed outside
-// braces ends a piece, one inside is part of it.
-std::string Preamble_Read(const std::wstring &typed);
+// What an edit makes of a preamble.
+struct PreambleEdit {
+    std::string text;     // as the store keeps it
+    std::wstring touched; // what was typed in pieces that are not what they were
+    std::string replaced; // the old pieces that are not there any more
+};
+
+// `typed` is what the control holds that was filled with `stored`. The ends of pieces stay; a line
+// feed outside braces ends a piece, one inside is part of it. Pieces that were not touched keep
+// their bytes.
+PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored);
+
+// Why the text would make the file one that can't be read any more, for the user; "" when it would
+// not.
+std::string Preamble_CheckMarks(const std::string &text);
 
 // Why the text can't be stored, for the user; "" when it is short enough.
 std::string Preamble_CheckSize(const std::string &text);

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
+#include <iterator>
 
 #include "store/Ascii.h"
 #include "store/Profile.h"
@@ -83,6 +84,17 @@ std::vector<std::string> Strings_Lines(const StringSources *sources, int source)
         if (source == i || source == STRINGS_OF_ALL_FILES)
             AppendLines(&lines, sources->set->files[i]);
     return lines;
+}
+
+LineChange Strings_Compare(const std::vector<std::string> &before,
+                           const std::vector<std::string> &after)
+{
+    auto start = std::mismatch(before.begin(), before.end(), after.begin(), after.end());
+    auto end = std::mismatch(before.rbegin(), std::make_reverse_iterator(start.first),
+                             after.rbegin(), std::make_reverse_iterator(start.second));
+    return {static_cast<size_t>(start.first - before.begin()),
+            static_cast<size_t>(end.first.base() - start.first),
+            static_cast<size_t>(end.second.base() - start.second)};
 }
 
 std::string Strings_KeyOf(const std::string &line)

@@ -38,6 +38,15 @@ int Strings_FitSource(const StringSources *sources, int source);
 
 // A line for each abbreviation, like "jan = January"; those of a file in the order of its list.
 std::vector<std::string> Strings_Lines(const StringSources *sources, int source);
+
+// How lines came to be others: from `first` on, `removed` of the old ones made way for `added` new
+// ones.
+struct LineChange {
+    size_t first, removed, added;
+};
+LineChange Strings_Compare(const std::vector<std::string> &before,
+                           const std::vector<std::string> &after);
+
 std::string Strings_KeyOf(const std::string &line); // its text up to the first blank
 
 // The file whose abbreviations may be changed now; null when the source is no file or read-only.

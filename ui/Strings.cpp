@@ -1,6 +1,7 @@
 #include "ui/Strings.h"
 
 #include <algorithm>
+#include <initializer_list>
 
 #include <wx/choice.h>
 #include <wx/listbox.h>
@@ -16,6 +17,8 @@
 #include "ui/DisplayText.h"
 #include "ui/QListBox.h"
 #include "ui/Values.h"
+
+enum { LONGEST_REPEAT = 1000 }; // milliseconds between two events of a key that is held down
 
 static const char Caption[] = "Editing Strings"; // also of the boxes
 
@@ -40,7 +43,7 @@ Cartulo_Strings::Cartulo_Strings(Cartulo *panel, wxTextCtrl *target)
     SetFont(wxFontInfo(10));
     wxSizer *sourceRow = CreateSourceRow();
     m_list = new wxListBox(this, wxID_ANY);
-    m_list->SetMinSize(FromDIP(wxSize(500, 300)));
+    m_list->SetMinSize(FromDIP(wxSize(240, 120)));
     wxBoxSizer *middle = new wxBoxSizer(wxHORIZONTAL);
     middle->Add(m_list, wxSizerFlags(1).Expand());
     middle->Add(CreateCommands(), wxSizerFlags().Border(wxLEFT, FromDIP(DIALOG_GAP)));
@@ -48,11 +51,14 @@ Cartulo_Strings::Cartulo_Strings(Cartulo *panel, wxTextCtrl *target)
     const int border = FromDIP(DIALOG_BORDER);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
     column->Add(sourceRow, wxSizerFlags().Expand().Border(wxALL, border));
-    column->Add(middle, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT, border));
-    column->Add(CreateClosers(), wxSizerFlags().Expand().Border(wxALL, border));
+    column->Add(middle, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, border));
+    column->Add(CreateClosers(), Dialog_ButtonPlace(this));
     FillSources();
     UpdateStrings();
+    for (wxWindow *window : std::initializer_list<wxWindow *>{m_list, m_source})
+        window->Bind(wxEVT_KEY_UP, &Cartulo_Strings::OnKeyUp, this);
     SetSizerAndFit(column);
+    SetSize(FromDIP(wxSize(620, 420)));
     CentreOnParent();
     m_list->SetFocus();
 }
@@ -120,16 +126,31 @@ void Cartulo_Strings::UpdateStrings()
 {
     TNSMessage("INFO: Cartulo_Strings::UpdateStrings ", "", TNS_ACTION);
     int row = std::max(m_list->GetSelection(), 0);
-    m_lines = Strings_Lines(&m_sources, CurrentStringSource);
-    wxArrayString items;
-    for (const std::string &line : m_lines)
-        items.Add(BoundedText(StoreText(line.c_str())));
-    m_list->Set(items);
+    ShowLines(Strings_Lines(&m_sources, CurrentStringSource));
     Select(row);
     m_source->SetToolTip(
         CurrentStringSource < 0 ? "" : FileTip(m_sources.set->files[CurrentStringSource]));
     for (int id : {ID_STRING_ADD, ID_STRING_REMOVE, ID_STRING_EDIT})
         FindWindow(id)->Enable(WritableFile() != nullptr);
+}
+
+// A list that is filled anew takes a second until it shows the right rows at the right place.
+void Cartulo_Strings::ShowLines(const std::vector<std::string> &lines)
+{
+    LineChange change = Strings_Compare(m_lines, lines);
+    wxArrayString items;
+    for (size_t i = 0; i < change.added; ++i)
+        items.Add(BoundedText(StoreText(lines[change.first + i].c_str())));
+    bool replacesAll = change.removed == m_lines.size();
+    m_lines = lines;
+    if (replacesAll) {
+        m_list->Set(items);
+        return;
+    }
+    for (size_t i = 0; i < change.removed; ++i)
+        m_list->Delete(unsigned(change.first));
+    if (!items.empty())
+        m_list->Insert(items, unsigned(change.first));
 }
 
 // That row, or the last one when there are not so many.
@@ -183,6 +204,7 @@ void Cartulo_Strings::OnAdd(wxCommandEvent &)
     UpdateStrings();
     m_panel->SetModified(CurrentStringSource);
     Select(int(m_lines.size()) - 1);
+    ShowStatus(m_panel, "");
 }
 
 void Cartulo_Strings::OnEdit(wxCommandEvent &)
@@ -195,8 +217,10 @@ void Cartulo_Strings::OnEdit(wxCommandEvent &)
     if (dialog.ShowModal() != wxID_OK)
         return;
     UpdateStrings();
-    if (dialog.IsChanged())
-        m_panel->SetModified(CurrentStringSource);
+    if (!dialog.IsChanged())
+        return;
+    m_panel->SetModified(CurrentStringSource);
+    ShowStatus(m_panel, "");
 }
 
 void Cartulo_Strings::OnRemove(wxCommandEvent &)
@@ -243,6 +267,22 @@ void Cartulo_Strings::OnOK(wxCommandEvent &event)
         Insert(L"\xAB" + StoreText(SelectedKey().c_str()) + L"\xBB");
 }
 
+// A key that is held down would delete one after the other. Its release may go to another window.
+bool Cartulo_Strings::IsHeld(const wxKeyEvent &event)
+{
+    const bool isHeld = event.GetKeyCode() == m_heldKey &&
+                        int32_t(event.GetTimestamp() - m_heldTime) < LONGEST_REPEAT;
+    m_heldKey = event.GetKeyCode();
+    m_heldTime = event.GetTimestamp();
+    return isHeld;
+}
+
+void Cartulo_Strings::OnKeyUp(wxKeyEvent &event)
+{
+    m_heldKey = WXK_NONE;
+    event.Skip();
+}
+
 // The letters do what they do with Alt, wherever the focus is: nothing is typed here.
 void Cartulo_Strings::OnCharHook(wxKeyEvent &event)
 {
@@ -253,8 +293,10 @@ void Cartulo_Strings::OnCharHook(wxKeyEvent &event)
         event.Skip();
         return;
     }
+    if (IsHeld(event))
+        return;
     if (!WritableFile()) {
-        wxBell();
+        ShowStatusError(m_panel, "Choose a file that can be written to change its strings.");
         return;
     }
     TNSMessage("INFO: Cartulo_Strings::OnCharHook ", command->label, TNS_LIFECYCLE);
@@ -283,6 +325,7 @@ Cartulo_Strings_Edit::Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxStr
     Dialog_AddRow(rows, this, "String Key:", m_key);
     Dialog_AddRow(rows, this, "String Value:", m_value);
     Dialog_Finish(this, rows, string ? m_value : m_key);
+    m_value->SetInsertionPointEnd(); // the focus has selected all
     SetSize(strings->GetSize().x, GetSize().y);
     CentreOnParent();
 }
@@ -298,13 +341,13 @@ void Cartulo_Strings_Edit::Fill()
     if (m_filled == value)
         return;
     m_value->SetEditable(false);
-    m_value->SetToolTip(Text_TooLongTip);
+    m_value->SetToolTip(Text_LockedTip);
 }
 
 void Cartulo_Strings_Edit::Refuse(const wxString &text, wxTextCtrl *at)
 {
     Box_Warn(this, Caption, text);
-    at->SetFocus();
+    Text_Focus(at);
 }
 
 // False when the user has to see to the key first.
@@ -340,22 +383,24 @@ bool Cartulo_Strings_Edit::AcceptKey(const std::string &key, NameVerdict verdict
 
 bool Cartulo_Strings_Edit::AcceptValue(const std::string &value)
 {
+    if (!AcceptLosses())
+        return false;
     const char *reason = Value_Check(value.c_str());
-    if (!reason)
-        return AcceptLosses();
-    Refuse(wxString("Wrong string syntax:\n\n") + reason + "\n\nFix the problem to continue.",
-           m_value);
-    return false;
+    if (reason)
+        Refuse(wxString("Wrong string syntax:\n\n") + reason + "\n\nFix the problem to continue.",
+               m_value);
+    return !reason;
 }
 
 bool Cartulo_Strings_Edit::AcceptLosses()
 {
-    bool textGuillemets = m_string && Value_HoldsGuillemets(m_string->value);
-    std::wstring losses = Value_Losses(m_key->GetValue().ToStdWstring(),
-                                       m_value->GetValue().ToStdWstring(), textGuillemets);
+    const char *stored = m_string ? m_string->value : "";
+    std::wstring losses =
+        Value_Losses(m_key->GetValue().ToStdWstring(), m_value->GetValue().ToStdWstring(), stored,
+                     Value_HoldsGuillemets(stored));
     if (losses.empty() || Box_Ask(this, Caption, losses + Value_LossesQuestion, wxNO_DEFAULT))
         return true;
-    m_value->SetFocus();
+    Text_Focus(m_value);
     return false;
 }
 

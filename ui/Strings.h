@@ -28,6 +28,7 @@ private:
     wxSizer *CreateClosers();
     void FillSources();
     void UpdateStrings();
+    void ShowLines(const std::vector<std::string> &lines);
     void Select(int row);
     std::string SelectedKey() const;
     BibString *SelectedString() const;
@@ -39,6 +40,8 @@ private:
     void OnActivate(wxCommandEvent &event);
     void OnOK(wxCommandEvent &event);
     void OnCharHook(wxKeyEvent &event);
+    bool IsHeld(const wxKeyEvent &event);
+    void OnKeyUp(wxKeyEvent &event);
 
     Cartulo *m_panel;
     wxTextCtrl *m_target;
@@ -46,6 +49,8 @@ private:
     std::vector<std::string> m_lines; // of the list, as the store has them
     wxChoice *m_source;               // child windows
     wxListBox *m_list;
+    int m_heldKey = 0; // the key of the last command, until it is released
+    long m_heldTime = 0;
 
     wxDECLARE_EVENT_TABLE();
 };

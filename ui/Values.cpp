@@ -16,23 +16,39 @@ std::string Value_Read(const std::wstring &typed)
     return value;
 }
 
+std::wstring Value_Show(const char *value)
+{
+    std::wstring shown;
+    Enc_ToUnicode(shown, value);
+    std::replace(shown.begin(), shown.end(), L'\0', L'\xFFFD');
+    return shown;
+}
+
 // --- Checking ---
 
-static bool HasReadableNames(const std::string &value)
+static size_t FindMark(const std::string &value, size_t at)
 {
-    for (size_t open = value.find(BIB_OPEN_ABBREVIATION); open != value.npos;
-         open = value.find(BIB_OPEN_ABBREVIATION, open + 1)) {
-        size_t close = value.find(BIB_CLOSE_ABBREVIATION, open);
-        if (!Bib_IsName(value.substr(open + 1, close - open - 1).c_str()))
-            return false;
+    static const char marks[] = {BIB_OPEN_ABBREVIATION, BIB_CLOSE_ABBREVIATION, 0};
+    return value.find_first_of(marks, at);
+}
+
+bool Value_HasBadMarks(const std::string &value)
+{
+    for (size_t open = FindMark(value, 0); open != value.npos;) {
+        size_t close = FindMark(value, open + 1);
+        bool isPair = close != value.npos && value[open] == BIB_OPEN_ABBREVIATION &&
+                      value[close] == BIB_CLOSE_ABBREVIATION;
+        if (!isPair || !Bib_IsName(value.substr(open + 1, close - open - 1).c_str()))
+            return true;
+        open = FindMark(value, close + 1);
     }
-    return true;
+    return false;
 }
 
 const char *Value_Check(const char *value)
 {
     const char *reason = Bib_CheckValue(value);
-    if (!reason && !HasReadableNames(value))
+    if (!reason && Value_HasBadMarks(value))
         reason = "The name of an abbreviation is missing, begins with a digit, or holds a "
                  "backslash or a control character";
     return reason;
@@ -98,7 +114,21 @@ static std::wstring Stored(wchar_t c)
     return Enc_ToUnicode(stored, Enc_FromUnicode(byte, character));
 }
 
-std::wstring Value_Losses(const std::wstring &name, const std::wstring &text, bool textGuillemets)
+// False when the code page shows a byte as it shows another one. Guillemets are a case of their
+// own.
+static bool ComesBack(const std::string &value)
+{
+    std::wstring shown;
+    std::string back = Value_Read(Enc_ToUnicode(shown, value.c_str()));
+    for (size_t i = 0; i < value.size(); ++i)
+        if (i >= back.size() ||
+            (back[i] != value[i] && !IsGuillemet(static_cast<uint32_t>(shown[i]))))
+            return false;
+    return true;
+}
+
+std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
+                          const std::string &stored, bool textGuillemets)
 {
     std::wstring page, losses;
     Enc_ToUnicode(page, Enc_Current()->name);
@@ -106,6 +136,10 @@ std::wstring Value_Losses(const std::wstring &name, const std::wstring &text, bo
     if (!lost.empty())
         losses += L"`" + name + L"': " + ListCharacters(lost) + L" can't be stored in " + page +
                   L" and would become " + Stored(lost[0]) + L".\n";
+    if (!ComesBack(stored))
+        losses += L"`" + name + L"': " + page +
+                  L" shows bytes of the old value as other characters, and they would become "
+                  L"those.\n";
     if (textGuillemets && HoldsGuillemets(text))
         losses += L"`" + name + L"': \xAB and \xBB will mark an abbreviation, not stand as text.\n";
     return losses;

@@ -5,16 +5,26 @@
 
 std::string Value_Read(const std::wstring &typed); // to store text
 
+// Store text for a control: Enc_ToUnicode, with U+FFFD for U+0000, behind which controls see
+// nothing.
+std::wstring Value_Show(const char *value);
+
 // Why the value (store text) cannot be written as BibTeX, or not be read back (static text); null
 // when all is well.
 const char *Value_Check(const char *value);
+
+// True when its marks of abbreviations would be written as what the parser does not read: a file
+// could not be opened for writing again. Wrong braces are mended when they are written.
+bool Value_HasBadMarks(const std::string &value);
 
 // True when a stored value has guillemets that are text, not marks of abbreviations. Those that a
 // user types are always such marks, so that the two can't be told apart in a control.
 bool Value_HoldsGuillemets(const char *value);
 
-// What would be lost of the text that was typed for `name`, a line for each kind: characters that
-// the code page would not bring back, and, with `textGuillemets`, guillemets. "" for nothing.
-std::wstring Value_Losses(const std::wstring &name, const std::wstring &text, bool textGuillemets);
+// What would be lost when the text that was typed for `name` takes the place of `stored`, a line
+// for each kind: characters that the code page would not bring back, bytes of `stored` that it
+// shows as other ones, and, with `textGuillemets`, guillemets. "" for nothing.
+std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
+                          const std::string &stored, bool textGuillemets);
 
 extern const wchar_t Value_LossesQuestion[]; // to put behind such lines

@@ -17,6 +17,7 @@
 #include "app/Companion.h"
 #include "app/Ids.h"
 #include "app/LogGui.h"
+#include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
 #include "ui/Messages.h"
 #include "ui/QListBox.h"
@@ -215,6 +216,7 @@ void CartuloWindow::Close()
 
 void CartuloWindow::TearDown()
 {
+    Enc_Select("CP1252");
     delete wxConfigBase::Set(nullptr);
     if (!frame)
         return;

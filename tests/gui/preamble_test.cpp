@@ -285,6 +285,24 @@ TEST_F(Preamble, AsksBeforeItLosesCharacters)
     EXPECT_STREQ("\377\r\n", Stored());
 }
 
+TEST_F(Preamble, KeepsGuillemetsOfPiecesThatAreNotTouched)
+{
+    OpenText("@preamble{{{Zo\303\253}} # {b}}\n"); // a letter of UTF-8 in another code page
+    Use(Type(L"{Zo\u00C3\u00AB}\r\nb!\r\n"));
+    EXPECT_STREQ("{Zo\303\253}\r\nb!\r\n", Stored());
+}
+
+TEST_F(Preamble, ShowsWhatTheCodePageTakesForTheEndOfAText)
+{
+    Open(folder.Write("a.bib", "@preamble{{a \200 b} # {c}}\n") + " -eCP20127");
+    Use([](Cartulo_Preamble &dialog) {
+        EXPECT_EQ(wxString(L"a \uFFFD b\r\nc\r\n"), TextOf(dialog)->GetValue());
+        TextOf(dialog)->ChangeValue(L"a \uFFFD b\r\nnew\r\n");
+        EXPECT_TRUE(PressOK(dialog));
+    });
+    EXPECT_STREQ("a \200 b\r\nnew\r\n", Stored());
+}
+
 TEST_F(Preamble, GetsPastedTextWithTheLineEndsOfEnter)
 {
     OpenTwo();
@@ -316,7 +334,10 @@ TEST_F(Preamble, TakesNoPastedTextThatIsTooLong)
         HandleQueuedEvents();
         EXPECT_EQ(before, TextOf(dialog)->GetValue());
     };
-    Use(paste, ExpectBox("Editing Preamble", TooLong, wxID_OK, Refusal));
+    Use(paste, ExpectBox("Editing Preamble",
+                         "The preamble of a file can have 8191 bytes, with two for the end of each "
+                         "piece.\nThis one has 8200, 9 too many.\n\nShorten it to continue.",
+                         wxID_OK, Refusal));
 }
 
 // --- Turning to another file ---
@@ -327,6 +348,31 @@ TEST_F(Preamble, IsStoredUncheckedOnYesWhenAnotherFileIsChosen)
     Use(Leave("bad}", 1, "other\r\n"), AcceptQuestion(wxID_YES));
     EXPECT_STREQ("bad}\r\n", Stored());
     EXPECT_EQ(1, Panel()->Files()->files[0]->modified);
+}
+
+TEST_F(Preamble, StaysWhenItWouldMakeTheFileUnreadable)
+{
+    OpenTwo();
+    wxString text = L"see \u00ABb c";
+    wxTEST_DIALOG(Send(ID_PREAMBLE), UsePreamble(Leave(text, 0, text)), AcceptQuestion(wxID_YES),
+                  ExpectBox("Editing Preamble",
+                            "The marks of an abbreviation must be a pair around the name of one.\n"
+                            "Else the file could not be read any more.\n\nFix it to continue.",
+                            wxID_OK, Refusal));
+    EXPECT_FALSE(SaveEnabled());
+}
+
+TEST_F(Preamble, ShowsTheFileThatTheQuestionIsAbout)
+{
+    OpenTwo();
+    auto leave = [this](Cartulo_Preamble &dialog) {
+        TextOf(dialog)->ChangeValue("new");
+        WhileBoxIsOpen look([&] { EXPECT_EQ(0, FileOf(dialog)->GetSelection()); }, wxID_NO);
+        ChooseItem(dialog, ID_PREAMBLE_FILE, 1);
+        EXPECT_EQ(1, look.boxes);
+        EXPECT_EQ(1, FileOf(dialog)->GetSelection());
+    };
+    Use(leave);
 }
 
 TEST_F(Preamble, IsDroppedOnNoWhenAnotherFileIsChosen)

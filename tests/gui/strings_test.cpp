@@ -58,6 +58,8 @@ static void PressKey(wxWindow *window, int key, int modifiers = 0)
     event.SetAltDown((modifiers & wxMOD_ALT) != 0);
     event.SetControlDown((modifiers & wxMOD_CONTROL) != 0);
     window->ProcessWindowEvent(event);
+    event.SetEventType(wxEVT_KEY_UP);
+    window->ProcessWindowEvent(event);
 }
 
 static void DoubleClick(Cartulo_Strings &dialog)
@@ -265,6 +267,24 @@ TEST_F(Strings, AreDeletedWithoutAQuestionEvenWhenTheyAreUsed)
     EXPECT_EQ("@STRING{acm = {A} # jgo}\n\n@article{one,\n\ttitle = {Old Maps},\n"
               "\tseries = jgo\n}\n",
               Saved());
+}
+
+TEST_F(Strings, AreDeletedOneByOneWhileTheKeyIsHeld)
+{
+    OpenText("@string{a = {1}}\n@string{b = {2}}\n@string{c = {3}}\n");
+    auto press = [](Cartulo_Strings &dialog) {
+        wxKeyEvent event(wxEVT_CHAR_HOOK);
+        event.m_keyCode = 'D';
+        for (long time : {1000, 1660, 1700, 1740}) {
+            event.SetTimestamp(time);
+            ListOf(dialog)->ProcessWindowEvent(event);
+        }
+        EXPECT_EQ(2u, ListOf(dialog)->GetCount());
+        event.SetTimestamp(2800); // it was released elsewhere
+        ListOf(dialog)->ProcessWindowEvent(event);
+        EXPECT_EQ(1u, ListOf(dialog)->GetCount());
+    };
+    wxTEST_DIALOG(Send(ID_STRINGS), UseStrings(press));
 }
 
 TEST_F(Strings, KeepTheirRowSelectedWhileTheyAreDeleted)
@@ -537,6 +557,29 @@ TEST_F(NewString, IsRefusedWhenItCouldNotBeReadBack)
     EXPECT_FALSE(SaveEnabled());
 }
 
+TEST_F(NewString, IsTypedOnBehindItsCleanedKey)
+{
+    OpenText(TwoStrings);
+    wxUIActionSimulator keys;
+    auto type = [&](Cartulo_Strings &strings) {
+        ShowDialog<Cartulo_Strings_Edit>(
+            [&] { PressKey(ListOf(strings), 'A'); },
+            [&](Cartulo_Strings_Edit &dialog) {
+                KeyOf(dialog)->SetValue("a{b}");
+                wxTEST_DIALOG(PressButton(dialog, wxID_OK),
+                              ExpectBox(Title,
+                                        "String  key includes invalid characters.\n"
+                                        "We will remove them and continue.",
+                                        wxID_OK, Offer));
+                keys.Char('X');
+                EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "abx"; }));
+                dialog.EndModal(wxID_CANCEL);
+            });
+        strings.EndModal(wxID_CANCEL);
+    };
+    ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, type);
+}
+
 TEST_F(NewString, TakesTheFocusAndTheKeys)
 {
     OpenText(TwoStrings);
@@ -665,13 +708,39 @@ TEST_F(ChangedString, AsksBeforeItLosesCharacters)
     EXPECT_STREQ("\2quoted\5\377", File()->strings->value);
 }
 
+TEST_F(ChangedString, IsTypedOnWhereTheCursorWas)
+{
+    OpenText(TwoStrings);
+    wxUIActionSimulator keys;
+    auto type = [&](Cartulo_Strings &strings) {
+        ShowDialog<Cartulo_Strings_Edit>(
+            [&] { PressKey(ListOf(strings), 'E'); },
+            [&](Cartulo_Strings_Edit &dialog) {
+                wxTextCtrl *value = ValueOf(dialog);
+                EXPECT_TRUE(WaitFor([&] { return value->HasFocus(); }));
+                keys.Char('X');
+                EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good Orderx"; }));
+                value->SetValue("Good}");
+                value->SetInsertionPoint(5);
+                wxTEST_DIALOG(PressButton(dialog, wxID_OK), Wrong("Unbalanced braces (extra `}')"));
+                keys.Char(WXK_BACK);
+                EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good"; }));
+                keys.Char(WXK_RETURN);
+            });
+        strings.EndModal(wxID_CANCEL);
+    };
+    ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, type);
+    EXPECT_STREQ("Good", File()->strings->value);
+}
+
 TEST_F(ChangedString, KeepsAValueThatNoFieldHolds)
 {
     std::string value(70000, 'x');
     OpenText("@string{a = {" + value + "}}\n");
     Change(0, [](Cartulo_Strings_Edit &dialog) {
         EXPECT_FALSE(ValueOf(dialog)->IsEditable());
-        EXPECT_EQ("This value is too long to be shown in full.", ValueOf(dialog)->GetToolTipText());
+        EXPECT_EQ("This value can't be shown in full, so it stays as it is.",
+                  ValueOf(dialog)->GetToolTipText());
         EXPECT_TRUE(PressOK(dialog));
     });
     EXPECT_EQ(value, File()->strings->value);
