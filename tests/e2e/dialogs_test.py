@@ -121,7 +121,7 @@ class Dialogs(EditorTest):
         editor.begin("ctrl+Return")
         editor.answer(SYNTAX_ERROR)
         editor.wait(lambda: not editor.windows(PREAMBLE), "the window closes")
-        editor.wait_until_active()
+        editor.activate(editor.frame)  # box and window close at once, which confuses openbox
         self.open(editor, "alt+p", PREAMBLE)
         xdotool("key", "ctrl+a", "ctrl+v", "ctrl+Home", *["Delete"] * len("oops}\n"))
         self.add_piece_and_save(editor)
