@@ -18,7 +18,7 @@
 #include "ui/QListBox.h"
 #include "ui/Values.h"
 
-enum { LONGEST_REPEAT = 1000 }; // milliseconds between two events of a key that is held down
+enum { LONGEST_REPEAT = 1000 }; // milliseconds between two presses by a key that is held down
 
 static const char Caption[] = "Editing Strings"; // also of the boxes
 
@@ -238,6 +238,8 @@ void Cartulo_Strings::OnRemove(wxCommandEvent &)
 
 void Cartulo_Strings::OnActivate(wxCommandEvent &)
 {
+    if (!m_target && !MayChange())
+        return;
     wxCommandEvent press(wxEVT_BUTTON, m_target ? int(wxID_OK) : int(ID_STRING_EDIT));
     ProcessWindowEvent(press);
 }
@@ -261,26 +263,34 @@ void Cartulo_Strings::OnOK(wxCommandEvent &event)
     if (!m_target)
         return;
     AppLog("Cartulo_Strings::OnOK, Insert ");
-    if (m_list->GetSelection() == wxNOT_FOUND)
-        TNSMessage("WARNING: ", "Cartulo_Strings::OnOK has no selection.", TNS_WARNING);
-    else
+    if (m_list->GetSelection() != wxNOT_FOUND) {
         Insert(L"\xAB" + StoreText(SelectedKey().c_str()) + L"\xBB");
+        return;
+    }
+    TNSMessage("WARNING: ", "Cartulo_Strings::OnOK has no selection.", TNS_WARNING);
+    ShowStatus(m_panel, "Nothing was inserted, as no string was selected.");
 }
 
-// A key that is held down would delete one after the other. Its release may go to another window.
-bool Cartulo_Strings::IsHeld(const wxKeyEvent &event)
+// Held down, the key would delete one after the other. Its release may go to another window.
+bool Cartulo_Strings::IsHeld(const wxKeyEvent &remove)
 {
-    const bool isHeld = event.GetKeyCode() == m_heldKey &&
-                        int32_t(event.GetTimestamp() - m_heldTime) < LONGEST_REPEAT;
-    m_heldKey = event.GetKeyCode();
-    m_heldTime = event.GetTimestamp();
-    return isHeld;
+    const long before = m_removeTime;
+    m_removeTime = remove.GetTimestamp();
+    return before != 0 && int32_t(m_removeTime - before) < LONGEST_REPEAT;
 }
 
 void Cartulo_Strings::OnKeyUp(wxKeyEvent &event)
 {
-    m_heldKey = WXK_NONE;
+    m_removeTime = 0;
     event.Skip();
+}
+
+// Says so when not.
+bool Cartulo_Strings::MayChange()
+{
+    if (!WritableFile())
+        ShowStatusError(m_panel, "Choose a file that can be written to change its strings.");
+    return WritableFile() != nullptr;
 }
 
 // The letters do what they do with Alt, wherever the focus is: nothing is typed here.
@@ -293,12 +303,10 @@ void Cartulo_Strings::OnCharHook(wxKeyEvent &event)
         event.Skip();
         return;
     }
-    if (IsHeld(event))
+    if (command->id == ID_STRING_REMOVE && IsHeld(event))
         return;
-    if (!WritableFile()) {
-        ShowStatusError(m_panel, "Choose a file that can be written to change its strings.");
+    if (!MayChange())
         return;
-    }
     TNSMessage("INFO: Cartulo_Strings::OnCharHook ", command->label, TNS_LIFECYCLE);
     wxCommandEvent press(wxEVT_BUTTON, command->id);
     ProcessWindowEvent(press);

@@ -40,7 +40,8 @@ private:
     void OnActivate(wxCommandEvent &event);
     void OnOK(wxCommandEvent &event);
     void OnCharHook(wxKeyEvent &event);
-    bool IsHeld(const wxKeyEvent &event);
+    bool IsHeld(const wxKeyEvent &remove);
+    bool MayChange();
     void OnKeyUp(wxKeyEvent &event);
 
     Cartulo *m_panel;
@@ -49,8 +50,7 @@ private:
     std::vector<std::string> m_lines; // of the list, as the store has them
     wxChoice *m_source;               // child windows
     wxListBox *m_list;
-    int m_heldKey = 0; // the key of the last command, until it is released
-    long m_heldTime = 0;
+    long m_removeTime = 0; // of the last press of the key that deletes, until it is released
 
     wxDECLARE_EVENT_TABLE();
 };

@@ -58,6 +58,7 @@ class HandOver(InstanceTest):
         for option in ("-D", "-d"):
             second = self.hand_over("refs", option=option + self.folder + "/")
             self.assertIn(f"SendCommand {option}{self.folder}/ refs", second.log())
+            self.assertEqual(2, second.log().count("INFO: Command_Line - "))
             first.wait_for_log(f"Command: {option}{self.folder}/ refs")
         first.settle()
 

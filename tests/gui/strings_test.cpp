@@ -92,7 +92,19 @@ protected:
              folder.Write("b.bib", "@string{pub = {Press}}\n@misc{two, note = {N}}\n"));
     }
 
+    // Opens the window for one abbreviation with a key, as the user does.
+    void ShowString(int key, const std::function<void(Cartulo_Strings_Edit &)> &steps)
+    {
+        auto press = [&](Cartulo_Strings &strings) {
+            ShowDialog<Cartulo_Strings_Edit>([&] { PressKey(ListOf(strings), key); }, steps);
+            strings.EndModal(wxID_CANCEL);
+        };
+        ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, press);
+    }
+
     BibFile *File(int i = 0) const { return Panel()->Files()->files[i]; }
+
+    wxUIActionSimulator keys;
 };
 
 // --- The list ---
@@ -206,14 +218,16 @@ TEST_F(Strings, OfAReadOnlyFileCantBeChanged)
 {
     OpenText(TwoStrings);
     File()->readOnly = 1;
-    auto press = [](Cartulo_Strings &dialog) {
+    auto press = [this](Cartulo_Strings &dialog) {
         EXPECT_FALSE(CanChange(dialog));
         for (int key : {int('A'), int('D'), int('E')})
             PressKey(ListOf(dialog), key);
-        DoubleClick(dialog);
         EXPECT_EQ(2u, ListOf(dialog)->GetCount());
+        frame->SetStatusText("");
+        DoubleClick(dialog);
     };
     wxTEST_DIALOG(Send(ID_STRINGS), UseStrings(press));
+    EXPECT_EQ("Choose a file that can be written to change its strings.", Status());
     EXPECT_FALSE(SaveEnabled());
 }
 
@@ -404,6 +418,7 @@ TEST_F(Strings, AreNotInsertedWhereNoneIsSelected)
     EXPECT_EQ((Lines{{"WARNING: Cartulo_Strings::OnOK has no selection.", TNS_WARNING}}),
               TakeLog("WARNING"));
     EXPECT_EQ("Old Maps", Value("title")->GetValue());
+    EXPECT_EQ("Nothing was inserted, as no string was selected.", Status());
 }
 
 TEST_F(Strings, AreNotInsertedIntoAFullField)
@@ -560,46 +575,32 @@ TEST_F(NewString, IsRefusedWhenItCouldNotBeReadBack)
 TEST_F(NewString, IsTypedOnBehindItsCleanedKey)
 {
     OpenText(TwoStrings);
-    wxUIActionSimulator keys;
-    auto type = [&](Cartulo_Strings &strings) {
-        ShowDialog<Cartulo_Strings_Edit>(
-            [&] { PressKey(ListOf(strings), 'A'); },
-            [&](Cartulo_Strings_Edit &dialog) {
-                KeyOf(dialog)->SetValue("a{b}");
-                wxTEST_DIALOG(PressButton(dialog, wxID_OK),
-                              ExpectBox(Title,
-                                        "String  key includes invalid characters.\n"
-                                        "We will remove them and continue.",
-                                        wxID_OK, Offer));
-                keys.Char('X');
-                EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "abx"; }));
-                dialog.EndModal(wxID_CANCEL);
-            });
-        strings.EndModal(wxID_CANCEL);
-    };
-    ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, type);
+    ShowString('A', [this](Cartulo_Strings_Edit &dialog) {
+        KeyOf(dialog)->SetValue("a{b}");
+        wxTEST_DIALOG(PressButton(dialog, wxID_OK),
+                      ExpectBox(Title,
+                                "String  key includes invalid characters.\n"
+                                "We will remove them and continue.",
+                                wxID_OK, Offer));
+        keys.Char('X');
+        EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "abx"; }));
+        dialog.EndModal(wxID_CANCEL);
+    });
 }
 
 TEST_F(NewString, TakesTheFocusAndTheKeys)
 {
     OpenText(TwoStrings);
-    wxUIActionSimulator keys;
-    auto type = [&](Cartulo_Strings &strings) {
-        ShowDialog<Cartulo_Strings_Edit>(
-            [&] { PressKey(ListOf(strings), 'A'); },
-            [&](Cartulo_Strings_Edit &dialog) {
-                EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->HasFocus(); }));
-                keys.Text("ade"); // letters that are commands in the list
-                EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "ade"; }));
-                keys.Char(WXK_TAB);
-                EXPECT_TRUE(WaitFor([&] { return ValueOf(dialog)->HasFocus(); }));
-                keys.Text("v");
-                EXPECT_TRUE(WaitFor([&] { return ValueOf(dialog)->GetValue() == "v"; }));
-                keys.Char(WXK_RETURN);
-            });
-        strings.EndModal(wxID_CANCEL);
-    };
-    ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, type);
+    ShowString('A', [this](Cartulo_Strings_Edit &dialog) {
+        EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->HasFocus(); }));
+        keys.Text("ade"); // letters that are commands in the list
+        EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "ade"; }));
+        keys.Char(WXK_TAB);
+        EXPECT_TRUE(WaitFor([&] { return ValueOf(dialog)->HasFocus(); }));
+        keys.Text("v");
+        EXPECT_TRUE(WaitFor([&] { return ValueOf(dialog)->GetValue() == "v"; }));
+        keys.Char(WXK_RETURN);
+    });
     EXPECT_STREQ("ade", File()->strings->next->next->name);
 }
 
@@ -711,25 +712,18 @@ TEST_F(ChangedString, AsksBeforeItLosesCharacters)
 TEST_F(ChangedString, IsTypedOnWhereTheCursorWas)
 {
     OpenText(TwoStrings);
-    wxUIActionSimulator keys;
-    auto type = [&](Cartulo_Strings &strings) {
-        ShowDialog<Cartulo_Strings_Edit>(
-            [&] { PressKey(ListOf(strings), 'E'); },
-            [&](Cartulo_Strings_Edit &dialog) {
-                wxTextCtrl *value = ValueOf(dialog);
-                EXPECT_TRUE(WaitFor([&] { return value->HasFocus(); }));
-                keys.Char('X');
-                EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good Orderx"; }));
-                value->SetValue("Good}");
-                value->SetInsertionPoint(5);
-                wxTEST_DIALOG(PressButton(dialog, wxID_OK), Wrong("Unbalanced braces (extra `}')"));
-                keys.Char(WXK_BACK);
-                EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good"; }));
-                keys.Char(WXK_RETURN);
-            });
-        strings.EndModal(wxID_CANCEL);
-    };
-    ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, type);
+    ShowString('E', [this](Cartulo_Strings_Edit &dialog) {
+        wxTextCtrl *value = ValueOf(dialog);
+        EXPECT_TRUE(WaitFor([&] { return value->HasFocus(); }));
+        keys.Char('X');
+        EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good Orderx"; }));
+        value->SetValue("Good}");
+        value->SetInsertionPoint(5);
+        wxTEST_DIALOG(PressButton(dialog, wxID_OK), Wrong("Unbalanced braces (extra `}')"));
+        keys.Char(WXK_BACK);
+        EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good"; }));
+        keys.Char(WXK_RETURN);
+    });
     EXPECT_STREQ("Good", File()->strings->value);
 }
 
