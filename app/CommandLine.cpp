@@ -347,23 +347,22 @@ static void CloseUnused(Command *command, const char *path)
     }
 }
 
-static BibFile *FindIn(BibFile **files, int count, const char *path)
+// Under any of its names; null for none.
+static BibFile *FindAside(const BibFileSet *set, const char *path)
 {
-    BibFileSet set = {};
-    set.files = files;
-    set.count = count;
-    int found = FileSet_Find(&set, path);
-    return found < 0 ? nullptr : files[found];
+    for (int i = 0; i < set->asideCount; ++i)
+        if (Sys_SameFile(set->aside[i]->path, path))
+            return set->aside[i];
+    return nullptr;
 }
 
 // Only what was open before this command line counts, and what it has put aside: a new file that it
 // names twice is loaded twice.
 static bool Reuse(Command *command, const char *path)
 {
-    const BibFileSet *set = command->set;
-    BibFile *file = FindIn(command->previous.files, command->previous.count, path);
-    if (!file)
-        file = FindIn(set->aside, set->asideCount, path);
+    const BibFileSet *previous = &command->previous;
+    int found = FileSet_Find(previous, path);
+    BibFile *file = found >= 0 ? previous->files[found] : FindAside(command->set, path);
     if (!file)
         return false;
     file->inUse = 1;

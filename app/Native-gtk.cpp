@@ -71,6 +71,14 @@ void Native_KeepScrollBars(wxWindow *scrolled)
     gtk_scrolled_window_set_overlay_scrolling(GTK_SCROLLED_WINDOW(scrolled->GetHandle()), FALSE);
 }
 
+void Native_MoveToRow(wxListBox *list, int row)
+{
+    GtkWidget *rows = gtk_bin_get_child(GTK_BIN(list->GetHandle()));
+    GtkTreePath *path = gtk_tree_path_new_from_indices(row, -1);
+    gtk_tree_view_set_cursor(GTK_TREE_VIEW(rows), path, nullptr, FALSE);
+    gtk_tree_path_free(path);
+}
+
 int Native_HeightForWidth(const wxWindow *window, int width)
 {
     int natural = 0;

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <wx/event.h>
+#include <wx/listbox.h>
 #include <wx/toplevel.h>
 
 // The handle by which other programs know the window; 0 when the window system has none.
@@ -20,6 +21,9 @@ int Native_LatinLetter(const wxKeyEvent &event);
 
 // Scroll bars that stay in sight where there is something to scroll.
 void Native_KeepScrollBars(wxWindow *scrolled);
+
+// Selects a row of the list and puts the cursor there, too: the arrow keys go on from it.
+void Native_MoveToRow(wxListBox *list, int row);
 
 // The height that a control with wrapping text needs at this width; both in pixels.
 int Native_HeightForWidth(const wxWindow *window, int width);

@@ -883,6 +883,15 @@ TEST_F(CommandProcess, ListsANewFileAgainThatOptionITookOff)
     EXPECT_EQ(1, Logged("Cartulo: Loading: " + path));
 }
 
+TEST_F(CommandProcess, KnowsAFileThatOptionITookOffByItsOtherNames)
+{
+    fs::create_hard_link(WriteBib("a.bib"), folder + "h.bib");
+    Run("a");
+    EXPECT_EQ(0, Run("a -i h").errors);
+    EXPECT_EQ((Tokens{"a.bib"}), Names());
+    EXPECT_EQ(0, set.files[0]->readOnly);
+}
+
 TEST_F(CommandProcess, ClosesFilesThatAnEarlierOptionITookOff)
 {
     std::string path = WriteBib("a.bib");

@@ -72,11 +72,29 @@ TEST(PreambleRead, KeepsTheBytesOfPiecesThatWereNotTouched)
     EXPECT_EQ("b", edit.replaced);
 }
 
-TEST(PreambleRead, TakesEachOldPieceOnce)
+TEST(PreambleRead, KeepsTheBytesOfCopies)
 {
-    PreambleEdit edit = Preamble_Read(L"\u00AB\r\n\u00AB\r\n", "\253\r\n");
-    EXPECT_EQ("\253\r\n\2\r\n", edit.text);
-    EXPECT_EQ(L"\u00AB\n", edit.touched);
+    PreambleEdit edit = Preamble_Read(L"a\r\n\u00AB\r\n\u00AB\n\u00AB!\r\n", "\253\r\n");
+    EXPECT_EQ("a\r\n\253\r\n\253\r\n\2!\r\n", edit.text);
+    EXPECT_EQ(L"a\n\u00AB!\n", edit.touched);
+    EXPECT_EQ("", edit.replaced);
+}
+
+// A mark and a guillemet that is text look alike.
+TEST(PreambleRead, TellsPiecesThatLookAlikeByTheirPlace)
+{
+    const char stored[] = "\253\r\nx\r\n\2\r\ny\r\n";
+    EXPECT_EQ("x\r\n\2\r\ny\r\n", Preamble_Read(L"x\r\n\u00AB\r\ny\r\n", stored).text);
+    EXPECT_EQ("\253\r\nx\r\ny\r\n", Preamble_Read(L"\u00AB\r\nx\r\ny\r\n", stored).text);
+    EXPECT_EQ("new\r\nx\r\n\2\r\ny\r\n",
+              Preamble_Read(L"new\r\nx\r\n\u00AB\r\ny\r\n", stored).text);
+}
+
+TEST(PreambleRead, KeepsTheBytesOfMovedPieces)
+{
+    PreambleEdit edit = Preamble_Read(L"b\r\n\u00AB\r\n", "\253\r\nb\r\n");
+    EXPECT_EQ("b\r\n\253\r\n", edit.text);
+    EXPECT_EQ(L"", edit.touched);
 }
 
 TEST(PreambleCheckMarks, RefusesWhatCouldNotBeReadAgain)

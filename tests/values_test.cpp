@@ -51,15 +51,15 @@ TEST(ValueLosses, TellsOfGuillemetsWhereTextHadThem)
     EXPECT_EQ(L"", Value_Losses(L"a", L"jan", "", true));
 }
 
-TEST(ValueLosses, TellsOfBytesThatTheCodePageShowsAsOthers)
+TEST(ValueLosses, TellsOfCharactersThatStandForOtherBytes)
 {
-    EXPECT_EQ(L"", Value_Losses(L"a", L"x", "\253M\374ller\273 \2jan\5", false));
+    EXPECT_EQ(L"", Value_Losses(L"a", L"M\u00FCller", "\253M\374ller\273 \2jan\5", false));
     Enc_Select("CP20127");
-    EXPECT_EQ(L"", Value_Losses(L"a", L"x", "plain", false));
-    for (const char *stored : {"M\303\274ller", "\200"})
-        EXPECT_EQ(L"`a': CP20127 shows bytes of the old value as other characters, and they would "
-                  L"become those.\n",
-                  Value_Losses(L"a", L"x", stored, false));
+    EXPECT_EQ(L"`a': CP20127 shows bytes of the old value as C <, and they would become just "
+              L"that.\n",
+              Value_Losses(L"a", L"MC<llerQ", "M\303\274ller", false));
+    EXPECT_EQ(L"", Value_Losses(L"a", L"clean", "M\303\274ller", false));
+    EXPECT_EQ(L"", Value_Losses(L"a", L"MC<ller", "plain", false));
 }
 
 TEST(ValueShow, HasNoCharacterThatEndsATextInAControl)

@@ -84,14 +84,16 @@ bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, lo
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
                        std::string key, wxWindow *field)
 {
-    bool accepted = Box_WarnOrCancel(parent, caption, text);
+    wxTextEntry *entry = dynamic_cast<wxTextEntry *>(field);
+    const bool accepted = Box_WarnOrCancel(parent, caption, text);
+    const long at = entry->GetInsertionPoint();
     field->SetFocus();
+    entry->SetInsertionPoint(at); // the focus has selected all
     if (!accepted)
         return;
-    wxTextEntry *entry = dynamic_cast<wxTextEntry *>(field);
     Bib_StripKeyChars(key.data());
     entry->ChangeValue(StoreText(key.c_str()));
-    entry->SetInsertionPointEnd(); // the focus has selected all
+    entry->SetInsertionPointEnd();
 }
 
 // --- Texts in controls ---

@@ -52,7 +52,7 @@ static void FillRow(GridRow *row, const char *key, const char *value)
     *row = {};
     row->key = key;
     row->stored = value;
-    row->text = Enc_ToUnicode(row->filled, value);
+    row->filled = row->text = Value_Show(value);
     row->field = GRID_NO_FIELD;
 }
 

@@ -14,6 +14,7 @@
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/QListBox.h"
+#include "ui/Theme.h"
 #include "ui/Values.h"
 
 static const char QuestionCaption[] = "Editing Preamble Question";
@@ -78,12 +79,11 @@ void Cartulo_Preamble::UpdatePreamble()
     ShowEditable(!file->readOnly && isWhole);
 }
 
-// What can't be edited looks like the window itself.
 void Cartulo_Preamble::ShowEditable(bool editable)
 {
     m_text->SetEditable(editable);
-    m_text->SetBackgroundColour(
-        wxSystemSettings::GetColour(editable ? wxSYS_COLOUR_WINDOW : wxSYS_COLOUR_BTNFACE));
+    m_text->SetBackgroundColour(editable ? wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOW)
+                                         : Theme_LockedColour());
 }
 
 // The file that is shown; null when its preamble can't be changed.
@@ -160,18 +160,24 @@ void Cartulo_Preamble::OnFile(wxCommandEvent &)
     UpdatePreamble();
 }
 
+static bool ReadClipboard(wxString *text)
+{
+    wxClipboardLocker lock;
+    wxTextDataObject data;
+    if (!lock || !wxTheClipboard->GetData(data))
+        return false;
+    *text = wxTextBuffer::Translate(data.GetText(), wxTextFileType_Unix);
+    return true;
+}
+
 // Its line ends are those of Enter: CR LF would end pieces within braces. More than a file holds
 // would only keep the control busy.
 void Cartulo_Preamble::OnPaste(wxClipboardTextEvent &event)
 {
-    wxClipboardLocker lock;
-    wxTextDataObject data;
-    if (!lock || !m_text->IsEditable() || !wxTheClipboard->GetData(data)) {
+    wxString text;
+    if (!m_text->IsEditable() || !ReadClipboard(&text))
         event.Skip();
-        return;
-    }
-    wxString text = wxTextBuffer::Translate(data.GetText(), wxTextFileType_Unix);
-    if (Allow(Preamble_CheckSize(Value_Read(text.ToStdWstring()))))
+    else if (Allow(Preamble_CheckSize(Value_Read(text.ToStdWstring()))))
         m_text->WriteText(text);
 }
 

@@ -69,35 +69,62 @@ static std::vector<std::wstring> TypedPieces(const std::wstring &typed)
     return pieces;
 }
 
-// Takes the first of the old pieces that is shown like this one. False for none.
-static bool TakeOld(std::vector<std::string> *old, const std::wstring &piece, std::string *bytes)
+// A piece of the stored preamble.
+struct OldPiece {
+    std::string bytes;
+    std::wstring shown;
+    bool isKept;
+};
+
+static std::vector<OldPiece> OldPieces(const char *stored)
 {
-    auto isShownSo = [&](const std::string &stored) { return Value_Show(stored.c_str()) == piece; };
-    auto found = std::find_if(old->begin(), old->end(), isShownSo);
-    if (found == old->end())
-        return false;
-    *bytes = *found;
-    old->erase(found);
-    return true;
+    std::vector<OldPiece> pieces;
+    for (const std::string &bytes : SplitPieces(stored))
+        pieces.push_back({bytes, Value_Show(bytes.c_str()), false});
+    return pieces;
+}
+
+// The old piece for each typed one that is shown like it; null for none. What stands before and
+// behind all changes comes first; in between, an old one serves again only when no other is left.
+static std::vector<OldPiece *> MatchPieces(const std::vector<std::wstring> &typed,
+                                           std::vector<OldPiece> *old)
+{
+    std::vector<OldPiece *> matches(typed.size());
+    auto take = [&](size_t i, OldPiece *piece) {
+        piece->isKept = true;
+        matches[i] = piece;
+    };
+    size_t first = 0, same = 0, most = std::min(typed.size(), old->size());
+    for (; first < most && typed[first] == (*old)[first].shown; ++first)
+        take(first, &(*old)[first]);
+    for (; same < most - first &&
+           typed[typed.size() - same - 1] == (*old)[old->size() - same - 1].shown;
+         ++same)
+        take(typed.size() - same - 1, &(*old)[old->size() - same - 1]);
+    for (bool mayServeAgain : {false, true})
+        for (size_t i = first; i < typed.size() - same; ++i)
+            for (OldPiece &piece : *old)
+                if (!matches[i] && piece.shown == typed[i] && (mayServeAgain || !piece.isKept))
+                    take(i, &piece);
+    return matches;
 }
 
 PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored)
 {
     PreambleEdit edit;
-    std::vector<std::string> old = SplitPieces(stored);
+    std::vector<OldPiece> old = OldPieces(stored);
     std::vector<std::wstring> pieces;
     if (typed.find_first_not_of(L"\r\n") != typed.npos)
         pieces = TypedPieces(typed);
-    for (const std::wstring &piece : pieces) {
-        std::string bytes;
-        if (!TakeOld(&old, piece, &bytes)) {
-            bytes = Value_Read(piece);
-            edit.touched += piece + L'\n';
-        }
-        edit.text += bytes + "\r\n";
+    std::vector<OldPiece *> matches = MatchPieces(pieces, &old);
+    for (size_t i = 0; i < pieces.size(); ++i) {
+        if (!matches[i])
+            edit.touched += pieces[i] + L'\n';
+        edit.text += (matches[i] ? matches[i]->bytes : Value_Read(pieces[i])) + "\r\n";
     }
-    for (const std::string &piece : old)
-        edit.replaced += piece;
+    for (const OldPiece &piece : old)
+        if (!piece.isKept)
+            edit.replaced += piece.bytes;
     return edit;
 }
 

@@ -26,8 +26,8 @@ struct PreambleEdit {
 };
 
 // `typed` is what the control holds that was filled with `stored`. The ends of pieces stay; a line
-// feed outside braces ends a piece, one inside is part of it. Pieces that were not touched keep
-// their bytes.
+// feed outside braces ends a piece, one inside is part of it. Pieces that were not touched, and
+// copies of them, keep their bytes.
 PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored);
 
 // Why the text would make the file one that can't be read any more, for the user; "" when it would

@@ -1,7 +1,6 @@
 #include "ui/Strings.h"
 
 #include <algorithm>
-#include <initializer_list>
 
 #include <wx/choice.h>
 #include <wx/listbox.h>
@@ -55,8 +54,8 @@ Cartulo_Strings::Cartulo_Strings(Cartulo *panel, wxTextCtrl *target)
     column->Add(CreateClosers(), Dialog_ButtonPlace(this));
     FillSources();
     UpdateStrings();
-    for (wxWindow *window : std::initializer_list<wxWindow *>{m_list, m_source})
-        window->Bind(wxEVT_KEY_UP, &Cartulo_Strings::OnKeyUp, this);
+    for (wxWindow *child : GetChildren())
+        child->Bind(wxEVT_KEY_UP, &Cartulo_Strings::OnKeyUp, this);
     SetSizerAndFit(column);
     SetSize(FromDIP(wxSize(620, 420)));
     CentreOnParent();
@@ -159,7 +158,7 @@ void Cartulo_Strings::Select(int row)
     row = std::min(row, int(m_lines.size()) - 1);
     if (row < 0)
         return;
-    m_list->SetSelection(row);
+    Native_MoveToRow(m_list, row);
     m_list->EnsureVisible(row);
 }
 
@@ -271,6 +270,13 @@ void Cartulo_Strings::OnOK(wxCommandEvent &event)
     ShowStatus(m_panel, "Nothing was inserted, as no string was selected.");
 }
 
+// On keyboards with other letters, the Latin one of the key.
+static int KeyOf(const wxKeyEvent &event)
+{
+    int key = event.GetKeyCode();
+    return key ? key : Native_LatinLetter(event);
+}
+
 // Held down, the key would delete one after the other. Its release may go to another window.
 bool Cartulo_Strings::IsHeld(const wxKeyEvent &remove)
 {
@@ -281,8 +287,10 @@ bool Cartulo_Strings::IsHeld(const wxKeyEvent &remove)
 
 void Cartulo_Strings::OnKeyUp(wxKeyEvent &event)
 {
-    m_removeTime = 0;
     event.Skip();
+    const StringCommand *command = Strings_FindCommand(KeyOf(event));
+    if (command && command->id == ID_STRING_REMOVE)
+        m_removeTime = 0;
 }
 
 // Says so when not.
@@ -297,15 +305,12 @@ bool Cartulo_Strings::MayChange()
 void Cartulo_Strings::OnCharHook(wxKeyEvent &event)
 {
     TNSMessage("INFO: Cartulo_Strings::OnCharHook ", "", TNS_LIFECYCLE);
-    int key = event.GetKeyCode();
-    const StringCommand *command = Strings_FindCommand(key ? key : Native_LatinLetter(event));
+    const StringCommand *command = Strings_FindCommand(KeyOf(event));
     if (!command) {
         event.Skip();
         return;
     }
-    if (command->id == ID_STRING_REMOVE && IsHeld(event))
-        return;
-    if (!MayChange())
+    if (!MayChange() || (command->id == ID_STRING_REMOVE && IsHeld(event)))
         return;
     TNSMessage("INFO: Cartulo_Strings::OnCharHook ", command->label, TNS_LIFECYCLE);
     wxCommandEvent press(wxEVT_BUTTON, command->id);

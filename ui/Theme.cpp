@@ -10,11 +10,24 @@ void Theme_SetTextColour(wxWindow *window, Colour colour)
     window->SetForegroundColour(wxColour(shown.red, shown.green, shown.blue));
 }
 
-wxColour Theme_PaleTextColour()
+// Between the colour of a window's text and that of its background.
+static wxColour Mix(double textShare)
 {
     wxColour text = wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT);
     wxColour back = wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOW);
-    auto mix = [](unsigned char a, unsigned char b) { return wxColour::AlphaBlend(a, b, 0.6); };
+    auto mix = [textShare](unsigned char a, unsigned char b) {
+        return wxColour::AlphaBlend(a, b, textShare);
+    };
     return wxColour(mix(text.Red(), back.Red()), mix(text.Green(), back.Green()),
                     mix(text.Blue(), back.Blue()));
+}
+
+wxColour Theme_PaleTextColour()
+{
+    return Mix(0.6);
+}
+
+wxColour Theme_LockedColour()
+{
+    return Mix(0.12);
 }

@@ -10,3 +10,5 @@ void Theme_SetTextColour(wxWindow *window, Colour colour);
 
 // For what can be read but not edited now: paler than other text, dark enough to read.
 wxColour Theme_PaleTextColour();
+
+wxColour Theme_LockedColour(); // background of a text for several lines that can't be edited now

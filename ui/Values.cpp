@@ -114,17 +114,19 @@ static std::wstring Stored(wchar_t c)
     return Enc_ToUnicode(stored, Enc_FromUnicode(byte, character));
 }
 
-// False when the code page shows a byte as it shows another one. Guillemets are a case of their
-// own.
-static bool ComesBack(const std::string &value)
+// The characters of the text that stand for other bytes of the stored value than they will become.
+// Guillemets are a case of their own.
+static std::wstring ReplacedCharacters(const std::wstring &text, const std::string &stored)
 {
-    std::wstring shown;
-    std::string back = Value_Read(Enc_ToUnicode(shown, value.c_str()));
-    for (size_t i = 0; i < value.size(); ++i)
-        if (i >= back.size() ||
-            (back[i] != value[i] && !IsGuillemet(static_cast<uint32_t>(shown[i]))))
-            return false;
-    return true;
+    std::wstring shown, replaced;
+    std::string back = Value_Read(Enc_ToUnicode(shown, stored.c_str()));
+    for (size_t i = 0; i < stored.size() && i < back.size(); ++i) {
+        wchar_t c = shown[i];
+        if (back[i] != stored[i] && !IsGuillemet(static_cast<uint32_t>(c)) &&
+            text.find(c) != text.npos && replaced.find(c) == replaced.npos)
+            replaced += c;
+    }
+    return replaced;
 }
 
 std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
@@ -136,10 +138,10 @@ std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
     if (!lost.empty())
         losses += L"`" + name + L"': " + ListCharacters(lost) + L" can't be stored in " + page +
                   L" and would become " + Stored(lost[0]) + L".\n";
-    if (!ComesBack(stored))
-        losses += L"`" + name + L"': " + page +
-                  L" shows bytes of the old value as other characters, and they would become "
-                  L"those.\n";
+    std::wstring replaced = ReplacedCharacters(text, stored);
+    if (!replaced.empty())
+        losses += L"`" + name + L"': " + page + L" shows bytes of the old value as " +
+                  ListCharacters(replaced) + L", and they would become just that.\n";
     if (textGuillemets && HoldsGuillemets(text))
         losses += L"`" + name + L"': \xAB and \xBB will mark an abbreviation, not stand as text.\n";
     return losses;

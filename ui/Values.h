@@ -22,8 +22,8 @@ bool Value_HasBadMarks(const std::string &value);
 bool Value_HoldsGuillemets(const char *value);
 
 // What would be lost when the text that was typed for `name` takes the place of `stored`, a line
-// for each kind: characters that the code page would not bring back, bytes of `stored` that it
-// shows as other ones, and, with `textGuillemets`, guillemets. "" for nothing.
+// for each kind, with the characters: those that the code page would not bring back, those that it
+// shows for other bytes of `stored`, and, with `textGuillemets`, guillemets. "" for nothing.
 std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
                           const std::string &stored, bool textGuillemets);
 

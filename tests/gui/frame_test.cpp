@@ -7,6 +7,7 @@
 
 #include <sys/stat.h>
 
+#include <wx/settings.h>
 #include <wx/srchctrl.h>
 #include <wx/app.h>
 #include <wx/textctrl.h>
@@ -242,6 +243,10 @@ TEST_F(Frame, HasAFontOfTenPoints)
 {
     Open("");
     EXPECT_EQ(10, frame->GetFont().GetPointSize());
+    if (const char *size = getenv("CARTULO_TEST_FONT")) {
+        wxFont desktop = wxSystemSettings::GetFont(wxSYS_DEFAULT_GUI_FONT);
+        EXPECT_EQ(atoi(size), desktop.GetPointSize()) << "not the desktop that this run needs";
+    }
 }
 
 // --- Place and size ---

@@ -294,6 +294,12 @@ TEST_F(Strings, AreDeletedOneByOneWhileTheKeyIsHeld)
             ListOf(dialog)->ProcessWindowEvent(event);
         }
         EXPECT_EQ(2u, ListOf(dialog)->GetCount());
+        wxKeyEvent release(wxEVT_KEY_UP);
+        release.m_keyCode = WXK_ALT;
+        ListOf(dialog)->ProcessWindowEvent(release);
+        event.SetTimestamp(1780);
+        ListOf(dialog)->ProcessWindowEvent(event);
+        EXPECT_EQ(2u, ListOf(dialog)->GetCount());
         event.SetTimestamp(2800); // it was released elsewhere
         ListOf(dialog)->ProcessWindowEvent(event);
         EXPECT_EQ(1u, ListOf(dialog)->GetCount());
@@ -359,6 +365,39 @@ TEST_F(Strings, StayInSightAmongTenThousand)
         dialog.EndModal(wxID_CANCEL);
     };
     ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, look);
+}
+
+TEST_F(Strings, AreLeftByTheArrowsFromTheSelectedRow)
+{
+    OpenText("@string{a = {1}}\n@string{b = {2}}\n@string{c = {3}}\n@string{d = {4}}\n");
+    auto press = [this](Cartulo_Strings &dialog) {
+        wxListBox *list = ListOf(dialog);
+        auto expectRow = [&](int key, int row) {
+            ASSERT_TRUE(WaitFor([&] { return dialog.IsActive() && list->HasFocus(); }));
+            keys.Char(key);
+            EXPECT_TRUE(WaitFor([&] { return list->GetSelection() == row; }))
+                << list->GetSelection() << " instead of " << row;
+        };
+        expectRow(WXK_DOWN, 1);
+        ShowDialog<Cartulo_Strings_Edit>([&] { PressKey(list, 'E'); },
+                                         [this](Cartulo_Strings_Edit &edit) {
+                                             ValueOf(edit)->SetValue("changed");
+                                             keys.Char(WXK_RETURN);
+                                         });
+        expectRow(WXK_DOWN, 2);
+        ShowDialog<Cartulo_Strings_Edit>([&] { PressKey(list, 'A'); },
+                                         [this](Cartulo_Strings_Edit &edit) {
+                                             KeyOf(edit)->SetValue("new");
+                                             keys.Char(WXK_RETURN);
+                                         });
+        EXPECT_EQ(4, list->GetSelection());
+        expectRow(WXK_UP, 3);
+        PressKey(list, 'D');
+        EXPECT_EQ("new = ", list->GetStringSelection());
+        expectRow(WXK_UP, 2);
+        dialog.EndModal(wxID_CANCEL);
+    };
+    ShowDialog<Cartulo_Strings>([this] { Run(ID_STRINGS); }, press);
 }
 
 // --- Inserting ---
