@@ -59,7 +59,8 @@ fail() {
 
 take_turn || fail "another screen takes too long to start"
 mkfifo "$work/number"
-Xvfb -displayfd 3 -screen 0 1280x1024x24 -nolisten tcp 3>"$work/number" \
+# It does not start afresh when a client leaves it alone: another one may be about to connect.
+Xvfb -displayfd 3 -screen 0 1280x1024x24 -nolisten tcp -noreset 3>"$work/number" \
     >"$work/screen.log" 2>&1 9>&- &
 screen=$!
 exec 4<>"$work/number"
