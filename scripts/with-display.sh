@@ -23,27 +23,13 @@ seconds=30 # how long the screen and the window manager may take to come up
 work=$(mktemp -d) || exit 125
 screen= bus= manager= command=
 
-# A server that starts picks a free display and writes its number once it listens; one that ends
-# removes the socket of its number. So one does either after the other.
-take_turn() {
-    exec 9>"${TMPDIR:-/tmp}/with-display-$(id -u).lock"
-    flock -w "$seconds" 9
-}
-
-end_process() {
-    kill "$1" 2>/dev/null
-    wait "$1" 2>/dev/null
-}
-
 # Ends what was started here, and nothing else. The command has a process group of its own.
 clean_up() {
     [ -z "$command" ] || kill -- "-$command" 2>/dev/null
-    for process in $command $manager $bus; do
-        end_process "$process"
+    for process in $command $manager $bus $screen; do
+        kill "$process" 2>/dev/null
+        wait "$process" 2>/dev/null
     done
-    take_turn
-    [ -z "$screen" ] || end_process "$screen"
-    exec 9>&-
     rm -rf "$work"
 }
 trap clean_up EXIT
@@ -57,7 +43,10 @@ fail() {
     exit 125
 }
 
-take_turn || fail "another screen takes too long to start"
+# The server picks a free display and writes its number once it listens. Two that start at the same
+# moment may pick the same one, so one starts after the other.
+exec 9>"${TMPDIR:-/tmp}/with-display-$(id -u).lock"
+flock -w "$seconds" 9 || fail "another screen takes too long to start"
 mkfifo "$work/number"
 # It does not start afresh when a client leaves it alone: another one may be about to connect.
 Xvfb -displayfd 3 -screen 0 1280x1024x24 -nolisten tcp -noreset 3>"$work/number" \
