@@ -126,7 +126,6 @@ void Cartulo::OnEditField(wxCommandEvent &)
         if (!taken)
             ShowWarning(dialog.GetTitle(), Text_TooLong);
     }
-    m_rows[row].value->SetInsertionPointEnd();
     FocusRow(row);
 }
 

@@ -118,6 +118,7 @@ bool Text_Take(wxTextCtrl *control, const wxString &text)
     bool taken = control->GetValue() == text;
     if (!taken)
         control->ChangeValue(old);
+    control->SetInsertionPointEnd();
     return taken;
 }
 

@@ -50,7 +50,8 @@ extern const char Text_LockedTip[]; // for the tip of a control that can't show 
 
 void Text_Focus(wxTextCtrl *control); // the cursor stays where it is, and nothing gets selected
 
-// False when the control can't hold the text: it keeps what it has.
+// False when the control can't hold the text: it keeps what it has. Unless that is the same, the
+// cursor goes to its end.
 bool Text_Take(wxTextCtrl *control, const wxString &text);
 
 // How a control for several lines wraps this text: between words, unless one is so long that this

@@ -270,6 +270,20 @@ TEST_F(EditField, ShowsItsValueInALargeWindow)
     EXPECT_EQ(5, Value("title")->GetInsertionPoint());
 }
 
+TEST_F(EditField, LeavesTheCursorWhereItWasOnCancel)
+{
+    OpenText(Article);
+    StartEditing();
+    SetValue("title", "Old Maps");
+    Focus(Value("title"));
+    Value("title")->SetInsertionPoint(3);
+    auto change = [](Cartulo_EditField &dialog) {
+        dynamic_cast<wxTextCtrl *>(dialog.FindWindow(ID_FIELD_VALUE))->SetValue("New");
+    };
+    wxTEST_DIALOG(Send(ID_EDIT_FIELD), UseDialog<Cartulo_EditField>(change, wxID_CANCEL));
+    EXPECT_EQ(3, Value("title")->GetInsertionPoint());
+}
+
 TEST_F(EditField, TakesAValueOfManyLines)
 {
     OpenText(Article);
