@@ -175,6 +175,17 @@ TEST(StringsFindCommand, KnowsThreeLetters)
         EXPECT_EQ(nullptr, Strings_FindCommand(key)) << key;
 }
 
+TEST(StringsIsHeld, TellsRepeatsFromPresses)
+{
+    int32_t last = 0;
+    EXPECT_FALSE(Strings_IsHeld(&last, 1000));
+    for (int32_t repeat : {1660, 1700, 1740})
+        EXPECT_TRUE(Strings_IsHeld(&last, repeat)) << repeat;
+    EXPECT_FALSE(Strings_IsHeld(&last, 2740)); // the release went elsewhere
+    last = 0;                                  // released
+    EXPECT_FALSE(Strings_IsHeld(&last, 2800));
+}
+
 // --- One file's abbreviations ---
 
 using StringKeys = StringSourcesTest;

@@ -11,6 +11,8 @@
 // Of buffers, in bytes with the end: what does not fit is not read.
 enum { NAMES_SIZE = 1024, SECTION_NAME_SIZE = 64, LIST_SIZE = 4096 };
 
+enum { LONGEST_REPEAT = 1000 }; // milliseconds between two presses by a key that is held down
+
 int CurrentStringSource = STRINGS_OF_ALL_FILES;
 
 // --- Sources ---
@@ -124,6 +126,14 @@ const StringCommand *Strings_FindCommand(int key)
         if (command.key == key)
             return &command;
     return nullptr;
+}
+
+// The release may go to another window, so a press counts again after a while.
+bool Strings_IsHeld(int32_t *last, int32_t now)
+{
+    const int32_t before = *last;
+    *last = now;
+    return before != 0 && now - before < LONGEST_REPEAT;
 }
 
 // --- One file's abbreviations ---

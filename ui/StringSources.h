@@ -7,6 +7,7 @@
 // Names and values are store text.
 #pragma once
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -59,6 +60,11 @@ struct StringCommand {
     const char *label; // for the log
 };
 const StringCommand *Strings_FindCommand(int key);
+
+// True when a press of the key that deletes comes from holding it down: it would delete one after
+// the other. `last` is the time of the press before, 0 when the key was released since; it becomes
+// `now` (both in milliseconds).
+bool Strings_IsHeld(int32_t *last, int32_t now);
 
 // --- One file's abbreviations ---
 

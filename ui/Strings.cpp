@@ -17,8 +17,6 @@
 #include "ui/QListBox.h"
 #include "ui/Values.h"
 
-enum { LONGEST_REPEAT = 1000 }; // milliseconds between two presses by a key that is held down
-
 static const char Caption[] = "Editing Strings"; // also of the boxes
 
 // --- The list ---
@@ -277,14 +275,6 @@ static int KeyOf(const wxKeyEvent &event)
     return key ? key : Native_LatinLetter(event);
 }
 
-// Held down, the key would delete one after the other. Its release may go to another window.
-bool Cartulo_Strings::IsHeld(const wxKeyEvent &remove)
-{
-    const long before = m_removeTime;
-    m_removeTime = remove.GetTimestamp();
-    return before != 0 && int32_t(m_removeTime - before) < LONGEST_REPEAT;
-}
-
 void Cartulo_Strings::OnKeyUp(wxKeyEvent &event)
 {
     event.Skip();
@@ -310,7 +300,10 @@ void Cartulo_Strings::OnCharHook(wxKeyEvent &event)
         event.Skip();
         return;
     }
-    if (!MayChange() || (command->id == ID_STRING_REMOVE && IsHeld(event)))
+    if (!MayChange())
+        return;
+    if (command->id == ID_STRING_REMOVE &&
+        Strings_IsHeld(&m_removeTime, int32_t(event.GetTimestamp())))
         return;
     TNSMessage("INFO: Cartulo_Strings::OnCharHook ", command->label, TNS_LIFECYCLE);
     wxCommandEvent press(wxEVT_BUTTON, command->id);

@@ -40,7 +40,6 @@ private:
     void OnActivate(wxCommandEvent &event);
     void OnOK(wxCommandEvent &event);
     void OnCharHook(wxKeyEvent &event);
-    bool IsHeld(const wxKeyEvent &remove);
     bool MayChange();
     void OnKeyUp(wxKeyEvent &event);
 
@@ -50,7 +49,7 @@ private:
     std::vector<std::string> m_lines; // of the list, as the store has them
     wxChoice *m_source;               // child windows
     wxListBox *m_list;
-    long m_removeTime = 0; // of the last press of the key that deletes, until it is released
+    int32_t m_removeTime = 0; // of the last press of the key that deletes, until it is released
 
     wxDECLARE_EVENT_TABLE();
 };
