@@ -111,6 +111,7 @@ TEST(PanelTextColour, KeepsTheHueOnDarkThemes)
     Colour green = Panel_TextColour({0, 128, 0}, {45, 45, 45}, true);
     EXPECT_EQ(green.red, green.blue);
     EXPECT_LT(green.red, green.green);
+    EXPECT_GT(green.green, 128); // lighter than on light themes
     EXPECT_LT(green.green, 220); // full green would glare
 }
 

@@ -88,15 +88,6 @@ ExpectMessages::ExpectMessages(const wxString &heading, wxString *text)
 {
 }
 
-template <class Control> static Control *FirstChild(wxWindow *window)
-{
-    for (wxWindow *child : window->GetChildren()) {
-        if (Control *control = dynamic_cast<Control *>(child))
-            return control;
-    }
-    return nullptr;
-}
-
 int ExpectMessages::OnInvoked(Cartulo_Messages *dialog) const
 {
     EXPECT_EQ("Bibliography File Loading Error Messages", dialog->GetTitle());

@@ -144,6 +144,15 @@ void ForgetLog();
 void HandleQueuedEvents();
 void DeleteClosedWindows(); // as the event loop does when it is idle
 
+// The first child of this kind; null for none.
+template <class Control> Control *FirstChild(const wxWindow *window)
+{
+    for (wxWindow *child : window->GetChildren())
+        if (Control *control = dynamic_cast<Control *>(child))
+            return control;
+    return nullptr;
+}
+
 // A window on files of a temporary folder.
 class CartuloWindow : public testing::Test
 {

@@ -15,15 +15,6 @@ using Lines = std::vector<LogLine>;
 
 static const char Broken[] = "@book{one, title = {First} year = 3}\n";
 
-static wxStaticText *HeadingOf(wxDialog &dialog)
-{
-    for (wxWindow *child : dialog.GetChildren())
-        if (wxStaticText *text = dynamic_cast<wxStaticText *>(child))
-            return text;
-    ADD_FAILURE() << "no heading";
-    return nullptr;
-}
-
 class Messages : public CartuloWindow
 {
 protected:
@@ -36,7 +27,7 @@ protected:
         file->errorCount = errors;
         file->warningCount = warnings;
         Cartulo_Messages dialog(frame, Panel()->Files());
-        wxStaticText *heading = HeadingOf(dialog);
+        wxStaticText *heading = FirstChild<wxStaticText>(&dialog);
         EXPECT_EQ(text, heading->GetLabelText());
         wxColour back = wxSystemSettings::GetColour(wxSYS_COLOUR_BTNFACE);
         Colour shown = Panel_TextColour(colour, {back.Red(), back.Green(), back.Blue()},

@@ -22,13 +22,9 @@ static const char TwoStrings[] = "@string{jgo = {Good Order}}\n@string{acm = {A}
 static const char Lists[] = "[String]\nMonths=*Months\n[*Months]\njan=January\nfeb=February\n"
                             "[article]\ntitle=*\n";
 
-static wxListBox *ListOf(wxDialog &dialog)
+static wxListBox *ListOf(const wxDialog &dialog)
 {
-    for (wxWindow *child : dialog.GetChildren())
-        if (wxListBox *list = dynamic_cast<wxListBox *>(child))
-            return list;
-    ADD_FAILURE() << "no list";
-    return nullptr;
+    return FirstChild<wxListBox>(&dialog);
 }
 
 static wxTextCtrl *KeyOf(wxDialog &dialog)

@@ -468,6 +468,7 @@ TEST_F(Window, SavesNothingWhenTheFocusComesBackAtOnce)
     EXPECT_TRUE(frame->IsLeaving());
     frame->OnActivation(true);
     EXPECT_FALSE(frame->IsLeaving());
+    EXPECT_FALSE(WaitFor([this] { return !SaveEnabled(); }, 500));
     EXPECT_EQ(OneEntry, folder.Read("a.bib"));
 }
 
