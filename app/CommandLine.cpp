@@ -285,13 +285,26 @@ static void SetCompanion(CommandState *state, const char *rest)
                 strlen(slash + 1));
 }
 
+static void UpdateForms(BibFile *const *files, int count)
+{
+    for (int i = 0; i < count; ++i)
+        Bib_UpdateForm(files[i]);
+}
+
 // Option e. A name that is not known leaves the code page as it is, and letters may look wrong.
 static void SelectEncoding(Command *command, const char *name)
 {
+    const EncodingRecord *before = Enc_Current();
     Enc_Select(name);
+    if (Enc_Current() != before) {
+        UpdateForms(command->previous.files, command->previous.count);
+        UpdateForms(command->set->files, command->set->count);
+        UpdateForms(command->set->aside, command->set->asideCount);
+    }
     if (Ascii_Compare(Enc_Current()->name, name) == 0)
         return;
-    FileSet_AppendError(command->set, "ERROR: There is no code page '%s', %s stays selected\n",
+    FileSet_AppendError(command->set,
+                        "ERROR: There is no code page '%s', %s stays selected (CP65001 is UTF-8)\n",
                         name, Enc_Current()->name);
     ++command->result.errors;
 }

@@ -25,7 +25,7 @@
 #include "ui/QListBox.h"
 
 enum { SMALLEST_WINDOW = 512, DEFAULT_PLACE = 50, TOOL_MARGIN = 4, SEARCH_WIDTH = 160 };
-enum { SMALLEST_SEARCH = 80 };
+enum { SMALLEST_SEARCH = 80, ENCODING_MARGIN = 32 };
 enum { LEAVING_TIMER = 1 };
 enum { PLACING_TIME = 500, LEAVING_TIME = 250 }; // milliseconds that a window manager may take
 
@@ -89,9 +89,18 @@ MyFrame::MyFrame(const wxString &title, const char *commandLine, CommandState *s
     m_panel = new Cartulo(this, commandLine, state);
     CreateTools();
     AppLog("Cartulo::Frame --- ", "Status Bar.");
-    CreateStatusBar();
-    SetStatusText(m_panel->CountText());
+    CreateStatusFields();
     AppLog("Cartulo::Frame --- ", "End.");
+}
+
+// What happens, and the encoding of the selected entry's file.
+void MyFrame::CreateStatusFields()
+{
+    wxStatusBar *bar = CreateStatusBar(2);
+    const int widths[] = {-1, bar->GetTextExtent("CP65001").x + FromDIP(ENCODING_MARGIN)};
+    bar->SetStatusWidths(2, widths);
+    bar->SetStatusText(m_panel->CountText(), 0);
+    bar->SetStatusText(m_panel->EncodingText(), 1);
 }
 
 MyFrame::~MyFrame()

@@ -50,6 +50,7 @@ private:
     void Place();
     void SaveGeometry();
     void CreateTools();
+    void CreateStatusFields();
     void AddTool(int id, const char *label, const char *icon, const char *tip);
     void UpdateCiteTool();
     void FitSearch();

@@ -1,7 +1,12 @@
-// encoding/Encoding.cpp - selecting a code page and converting with it.
+// encoding/Encoding.cpp - selecting an encoding and converting with it.
 #include "encoding/Encoding.h"
 
+#include <algorithm>
 #include <cstring>
+#include <cwchar>
+
+#include <unicode/uchar.h>
+#include <unicode/utf8.h>
 
 #include "app/Log.h"
 #include "store/Ascii.h"
@@ -12,17 +17,24 @@ static const wchar_t SHOWN_CLOSE = 0xBB; // of BIB_CLOSE_ABBREVIATION
 
 static const uint32_t CODE_POINTS = 0x10000; // no code page reaches beyond
 static const unsigned char NO_BYTE = 255;
+static const uint32_t REPLACEMENT = 0xFFFD;
+static const char DefaultPage[] = "CP1252"; // also of what is no UTF-8
 
-static const EncodingRecord *current; // null until the first use
-static unsigned char currentBytes[CODE_POINTS];
+const EncodingRecord EncodingUtf8 = {"CP65001", "UTF-8", nullptr};
 
-// Makes the row current. Where two bytes have one meaning, the smaller one is written back.
-static void Use(const EncodingRecord *row)
+static const EncodingRecord *selected; // null until the first use
+static const EncodingRecord *page;     // the code page in use
+static unsigned char pageBytes[CODE_POINTS];
+
+// --- Selecting ---
+
+// Makes the row the page in use. Where two bytes have one meaning, the smaller one is written back.
+static void UsePage(const EncodingRecord *row)
 {
-    memset(currentBytes, NO_BYTE, sizeof currentBytes);
+    memset(pageBytes, NO_BYTE, sizeof pageBytes);
     for (int byte = 254; byte >= 0; --byte)
-        currentBytes[row->map[byte]] = static_cast<unsigned char>(byte);
-    current = row;
+        pageBytes[row->map[byte]] = static_cast<unsigned char>(byte);
+    page = row;
 }
 
 static const EncodingRecord *FindRow(const char *name)
@@ -34,23 +46,61 @@ static const EncodingRecord *FindRow(const char *name)
     return nullptr;
 }
 
+static const EncodingRecord *Find(const char *name)
+{
+    return Ascii_Compare(EncodingUtf8.name, name) == 0 ? &EncodingUtf8 : FindRow(name);
+}
+
+static void Use(const EncodingRecord *encoding)
+{
+    selected = encoding;
+    UsePage(encoding->map ? encoding : FindRow(DefaultPage));
+}
+
 void Enc_Select(const char *name)
 {
-    const EncodingRecord *row = FindRow(name);
-    if (!row) {
+    const EncodingRecord *encoding = Find(name);
+    if (!encoding) {
         AppLog("ERROR: Can't select unknown encoding: ", name);
         return;
     }
-    Use(row);
+    Use(encoding);
     AppLog("INFO: Selecting Encoding: ", name);
 }
 
 const EncodingRecord *Enc_Current()
 {
-    if (!current)
-        Use(FindRow("CP1252"));
-    return current;
+    if (!selected)
+        Use(FindRow(DefaultPage));
+    return selected;
 }
+
+static const EncodingRecord *CurrentPage()
+{
+    Enc_Current();
+    return page;
+}
+
+const char *Enc_Label(const EncodingRecord *encoding)
+{
+    return encoding == &EncodingUtf8 ? encoding->displayName : encoding->name;
+}
+
+const EncodingRecord *Enc_OfFile(const BibFile *file)
+{
+    if (Enc_Current() != &EncodingUtf8)
+        return selected;
+    return file->form & BIB_FORM_CODE_PAGE ? page : &EncodingUtf8;
+}
+
+const EncodingRecord *Enc_OfText(const char *text)
+{
+    if (Enc_Current() != &EncodingUtf8)
+        return selected;
+    return Enc_IsUtf8(text, strlen(text)) ? &EncodingUtf8 : page;
+}
+
+// --- To Unicode ---
 
 static wchar_t ToCharacter(const uint32_t *map, unsigned char byte)
 {
@@ -64,15 +114,52 @@ static wchar_t ToCharacter(const uint32_t *map, unsigned char byte)
     }
 }
 
+static void DecodePage(std::wstring *out, const char *text, const uint32_t *map)
+{
+    out->reserve(strlen(text));
+    for (; *text; ++text)
+        *out += ToCharacter(map, static_cast<unsigned char>(*text));
+}
+
+// The next character of UTF-8 text that ends with a NUL; U+FFFD for bytes that are none.
+static uint32_t NextCharacter(const char **at)
+{
+    int32_t i = 0;
+    UChar32 c;
+    U8_NEXT(*at, i, -1, c);
+    *at += i;
+    return c < 0 ? REPLACEMENT : static_cast<uint32_t>(c);
+}
+
+static void DecodeUtf8(std::wstring *out, const char *text)
+{
+    out->reserve(strlen(text));
+    while (*text) {
+        uint32_t c = NextCharacter(&text);
+        *out += c == BIB_OPEN_ABBREVIATION    ? SHOWN_OPEN
+                : c == BIB_CLOSE_ABBREVIATION ? SHOWN_CLOSE
+                                              : static_cast<wchar_t>(c);
+    }
+}
+
 std::wstring &Enc_ToUnicode(std::wstring &out, const char *text)
 {
-    const uint32_t *map = Enc_Current()->map;
     out.clear();
-    out.reserve(strlen(text));
-    for (; *text; ++text)
-        out += ToCharacter(map, static_cast<unsigned char>(*text));
+    DecodePage(&out, text, CurrentPage()->map);
     return out;
 }
+
+std::wstring Enc_Decode(const char *text, const EncodingRecord *encoding)
+{
+    std::wstring out;
+    if (encoding->map)
+        DecodePage(&out, text, encoding->map);
+    else
+        DecodeUtf8(&out, text);
+    return out;
+}
+
+// --- From Unicode ---
 
 static unsigned char ToByte(wchar_t character)
 {
@@ -83,22 +170,15 @@ static unsigned char ToByte(wchar_t character)
         return BIB_CLOSE_ABBREVIATION;
     }
     uint32_t c = static_cast<uint32_t>(character);
-    return c < CODE_POINTS ? currentBytes[c] : NO_BYTE;
+    return c < CODE_POINTS ? pageBytes[c] : NO_BYTE;
 }
 
-// One character as UTF-8; what is none becomes U+FFFD. Returns the count of bytes, at most 4.
-static size_t PutUtf8(char *out, uint32_t c)
+size_t Enc_PutUtf8(char *out, uint32_t character)
 {
-    if (c < 0x80) {
-        *out = static_cast<char>(c);
-        return 1;
-    }
-    if (c > 0x10FFFF || (c >= 0xD800 && c <= 0xDFFF))
-        c = 0xFFFD;
-    size_t length = c < 0x800 ? 2 : c < 0x10000 ? 3 : 4;
-    for (size_t i = length - 1; i > 0; --i, c >>= 6)
-        out[i] = static_cast<char>(0x80 | (c & 0x3F));
-    out[0] = static_cast<char>((0xF00 >> length & 0xFF) | c);
+    if (character > 0x10FFFF || U_IS_SURROGATE(character))
+        character = REPLACEMENT;
+    size_t length = 0;
+    U8_APPEND_UNSAFE(out, length, character);
     return length;
 }
 
@@ -108,25 +188,134 @@ static void LogInput(const wchar_t *text)
     char line[512];
     size_t length = 0;
     for (; *text && length + 4 < sizeof line; ++text)
-        length += PutUtf8(line + length, static_cast<uint32_t>(*text));
+        length += Enc_PutUtf8(line + length, static_cast<uint32_t>(*text));
     line[length] = 0;
     AppLog("strconv in: ", line);
 }
 
+void Enc_LogConversion(const wchar_t *in, const char *out)
+{
+    LogInput(in);
+    AppLog("strconv out: ", out);
+}
+
 char *Enc_FromUnicode(char *buffer, const wchar_t *text)
 {
-    LogInput(text);
-    Enc_Current();
+    CurrentPage();
     char *out = buffer;
-    for (; *text; ++text)
-        *out++ = static_cast<char>(ToByte(*text));
+    for (const wchar_t *at = text; *at; ++at)
+        *out++ = static_cast<char>(ToByte(*at));
     *out = 0;
-    AppLog("strconv out: ", buffer);
+    Enc_LogConversion(text, buffer);
     return buffer;
 }
 
-int Enc_Holds(wchar_t character)
+static size_t PutCharacter(char *out, wchar_t c, const EncodingRecord *encoding)
 {
-    const uint32_t *map = Enc_Current()->map;
-    return ToCharacter(map, ToByte(character)) == character;
+    if (!encoding->map && c != SHOWN_OPEN && c != SHOWN_CLOSE)
+        return Enc_PutUtf8(out, static_cast<uint32_t>(c));
+    *out = static_cast<char>(ToByte(c));
+    return 1;
+}
+
+char *Enc_EncodeTo(char *buffer, const wchar_t *text, const EncodingRecord *encoding)
+{
+    char *out = buffer;
+    for (; *text; ++text)
+        out += PutCharacter(out, *text, encoding);
+    *out = 0;
+    return buffer;
+}
+
+std::string Enc_Encode(const wchar_t *text, const EncodingRecord *encoding)
+{
+    std::string bytes(wcslen(text) * ENC_LONGEST + 1, 0);
+    bytes.resize(strlen(Enc_EncodeTo(bytes.data(), text, encoding)));
+    return bytes;
+}
+
+int Enc_Holds(wchar_t character, const EncodingRecord *encoding)
+{
+    if (encoding->map)
+        return ToCharacter(encoding->map, ToByte(character)) == character;
+    uint32_t c = static_cast<uint32_t>(character);
+    bool isMark = c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION;
+    return c <= 0x10FFFF && !U_IS_SURROGATE(c) && !isMark;
+}
+
+std::string Enc_Recode(const char *text, const EncodingRecord *from, const EncodingRecord *to)
+{
+    return from == to ? text : Enc_Encode(Enc_Decode(text, from).c_str(), to);
+}
+
+// --- UTF-8 ---
+
+// How many ASCII characters the text begins with.
+static size_t AsciiLength(const char *text, size_t length)
+{
+    const uint64_t highBits = 0x8080808080808080;
+    size_t i = 0;
+    for (uint64_t word; i + sizeof word <= length; i += sizeof word) {
+        memcpy(&word, text + i, sizeof word);
+        if (word & highBits)
+            break;
+    }
+    while (i < length && U8_IS_SINGLE(text[i]))
+        ++i;
+    return i;
+}
+
+int Enc_IsUtf8(const char *text, size_t length)
+{
+    size_t i = AsciiLength(text, length);
+    while (i < length) {
+        UChar32 c;
+        U8_NEXT(text, i, length, c);
+        if (c < 0)
+            return 0;
+        i += AsciiLength(text + i, length - i);
+    }
+    return 1;
+}
+
+static char32_t FoldCase(uint32_t c)
+{
+    if (c < 0x80)
+        return Ascii_Lower(static_cast<unsigned char>(c));
+    return static_cast<char32_t>(u_foldCase(static_cast<UChar32>(c), U_FOLD_CASE_DEFAULT));
+}
+
+std::u32string Enc_FoldUtf8(const char *text)
+{
+    std::u32string folded;
+    while (*text)
+        folded += FoldCase(NextCharacter(&text));
+    return folded;
+}
+
+// Whether the text goes on with the characters.
+static bool GoesOn(const char *text, const std::u32string &folded)
+{
+    for (char32_t c : folded)
+        if (!*text || FoldCase(NextCharacter(&text)) != c)
+            return false;
+    return true;
+}
+
+// ASCII text holds nothing but ASCII, whatever the case.
+static bool MayContain(const char *text, const std::u32string &folded)
+{
+    size_t length = strlen(text);
+    bool isAscii = std::all_of(folded.begin(), folded.end(), [](char32_t c) { return c < 0x80; });
+    return isAscii || AsciiLength(text, length) < length;
+}
+
+int Enc_Utf8Contains(const char *text, const std::u32string &folded)
+{
+    if (!MayContain(text, folded))
+        return 0;
+    for (; *text; NextCharacter(&text))
+        if (GoesOn(text, folded))
+            return 1;
+    return folded.empty();
 }

@@ -1,26 +1,44 @@
-// encoding/Encoding.h - store text (8-bit, in one code page) to and from Unicode.
+// encoding/Encoding.h - store text (8-bit) to and from Unicode.
 //
-// One code page is selected for the whole process. The abbreviation marks of the store, bytes 0x02
-// and 0x05, are shown as U+00AB and U+00BB, whatever the code page.
+// One encoding is selected for the whole process: a code page, in which every text is then, or
+// UTF-8. While UTF-8 is selected, each file is in UTF-8 or in CP1252, as it was found when it was
+// loaded, and texts of a file are converted with Enc_OfFile.
+//
+// The abbreviation marks of the store, bytes 0x02 and 0x05, are shown as U+00AB and U+00BB,
+// whatever the encoding.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <string>
+
+struct BibFile;
+
+enum { ENC_LONGEST = 4 }; // bytes of a character in any encoding
 
 struct EncodingRecord {
     const char *name;        // "CP1252": what Enc_Select matches
     const char *displayName; // "ANSI - Latin I"
-    const uint32_t *map;     // 256 code points by byte; an undefined byte stands for itself
+    const uint32_t *map; // 256 code points by byte; an undefined byte stands for itself. Null for
+                         // UTF-8
 };
 
-// 51 rows and a last one whose name is null.
+// 51 code pages and a last row whose name is null.
 extern const EncodingRecord EncodingTable[];
 
-// Selects the row with this name, ignoring case. An unknown name is logged and changes nothing.
+extern const EncodingRecord EncodingUtf8; // "CP65001"; no row of the table
+
+// Selects the code page with this name, or UTF-8, ignoring case. An unknown name is logged and
+// changes nothing.
 void Enc_Select(const char *name);
 
-// The selected row; CP1252 until the first Enc_Select.
+// What is selected; CP1252 until the first Enc_Select.
 const EncodingRecord *Enc_Current();
+
+// For people: "CP1252", "UTF-8".
+const char *Enc_Label(const EncodingRecord *encoding);
+
+// --- In the selected code page; in CP1252 while UTF-8 is selected ---
 
 // Store text to display text. Returns `out`.
 std::wstring &Enc_ToUnicode(std::wstring &out, const char *text);
@@ -29,5 +47,43 @@ std::wstring &Enc_ToUnicode(std::wstring &out, const char *text);
 // character outside the code page becomes byte 0xFF. Returns `buffer`.
 char *Enc_FromUnicode(char *buffer, const wchar_t *text);
 
+// What Enc_FromUnicode logs; the conversions below log nothing.
+void Enc_LogConversion(const wchar_t *in, const char *out);
+
+// --- In UTF-8 or in that code page ---
+
+// The encoding of a file's texts.
+const EncodingRecord *Enc_OfFile(const BibFile *file);
+
+// That of a text which belongs to no file, or to several: names of types, the INI file. It is
+// looked at while UTF-8 is selected.
+const EncodingRecord *Enc_OfText(const char *text);
+
+// Store text to display text. Bytes that are no UTF-8 become U+FFFD there.
+std::wstring Enc_Decode(const char *text, const EncodingRecord *encoding);
+
+// Display text to store text. A character that the encoding lacks becomes byte 0xFF in a code page,
+// and U+FFFD in UTF-8.
+std::string Enc_Encode(const wchar_t *text, const EncodingRecord *encoding);
+
+// The same, into a buffer of ENC_LONGEST bytes per character and a NUL. Returns `buffer`.
+char *Enc_EncodeTo(char *buffer, const wchar_t *text, const EncodingRecord *encoding);
+
 // 1 when the store gives a character back as it was put there.
-int Enc_Holds(wchar_t character);
+int Enc_Holds(wchar_t character, const EncodingRecord *encoding);
+
+// Store text in another encoding; see Enc_Encode for what that lacks.
+std::string Enc_Recode(const char *text, const EncodingRecord *from, const EncodingRecord *to);
+
+// --- UTF-8 ---
+
+int Enc_IsUtf8(const char *text, size_t length); // valid, without surrogates; ASCII is
+
+// One character as UTF-8; what is none becomes U+FFFD. Returns the count of bytes.
+size_t Enc_PutUtf8(char *out, uint32_t character);
+
+// A text for Enc_Utf8Contains: its characters, without the differences of case.
+std::u32string Enc_FoldUtf8(const char *text);
+
+// 1 when the UTF-8 text contains the characters, ignoring the case of all letters.
+int Enc_Utf8Contains(const char *text, const std::u32string &folded);

@@ -2,8 +2,8 @@
 # Installs the Debian packages that are missing: install.sh build [screen] [test]
 set -eu
 
-build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libx11-dev libbtparse-dev
-       libgtest-dev libgmock-dev libbenchmark-dev cmark"
+build="g++ cmake ninja-build ccache pkg-config libwxgtk3.2-dev libgtk-3-dev libx11-dev
+       libbtparse-dev libicu-dev libgtest-dev libgmock-dev libbenchmark-dev cmark"
 # A private screen with a window manager, and pictures of it.
 screen="xvfb openbox xfwm4 x11-utils dbus-daemon xdotool wmctrl imagemagick fonts-dejavu-core
         adwaita-icon-theme"

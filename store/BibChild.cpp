@@ -11,6 +11,7 @@
 
 #include <btparse.h>
 
+#include "encoding/Encoding.h"
 #include "store/BibItem.h"
 #include "store/BibStore.h"
 #include "store/Sys.h"
@@ -337,6 +338,8 @@ void BibChild_Parse(void *argument)
                            : Sys_ReadAll(job->stream, &length);
     if (!text)
         Leave(BIB_END_UNREADABLE);
+    BeginItem(Sending, BIB_ITEM_FORM, 0, Enc_IsUtf8(text, length) ? 0 : BIB_FORM_CODE_PAGE);
+    EndItem(Sending);
     length = Normalise(text, length);
     if (IsBlank(text, length))
         Leave(BIB_END_OF_FILE);

@@ -67,6 +67,7 @@ static int64_t TextCount(const BibItemHeader *header)
         return number < 0 ? -1 : 1 + number;
     case BIB_ITEM_COMMENT:
         return number < 0 ? -1 : number;
+    case BIB_ITEM_FORM:
     case BIB_ITEM_STRANGE:
     case BIB_ITEM_END:
         return 0;
@@ -268,6 +269,9 @@ BibStored BibItem_Store(BibFile *file, const char *item)
         break;
     case BIB_ITEM_COMMENT:
         return StoreComments(file, reader);
+    case BIB_ITEM_FORM:
+        file->form = reader.header.number & BIB_FORM_ALL;
+        break;
     case BIB_ITEM_STRANGE:
         AppLog("ERROR: ", reader.header.number == BTE_UNKNOWN
                               ? "There is unknown entry in BIB-file"
@@ -567,8 +571,9 @@ int Bib_SelfTest()
     SysChild child;
     if (!Sys_StartChild(&child, BibChild_Parse, &job, BibLoadSeconds))
         return 0;
-    BibItemHeader first = {};
-    int found = Sys_ReadChild(&child, &first, sizeof first, BibLoadSeconds) == sizeof first &&
+    BibItemHeader form = {}, first = {};
+    int found = Sys_ReadChild(&child, &form, sizeof form, BibLoadSeconds) == sizeof form &&
+                Sys_ReadChild(&child, &first, sizeof first, BibLoadSeconds) == sizeof first &&
                 first.kind == BIB_ITEM_MESSAGE;
     Sys_EndChild(&child);
     return found;

@@ -9,6 +9,7 @@
 #include <btparse.h>
 
 #include "app/Log.h"
+#include "encoding/Encoding.h"
 #include "store/Ascii.h"
 
 char *BibTypeTable[BIB_TYPE_LIMIT];
@@ -170,6 +171,31 @@ BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName, con
     entry->next = file->entries;
     file->entries = entry;
     return entry;
+}
+
+static int IsUtf8(const char *text)
+{
+    return Enc_IsUtf8(text, strlen(text));
+}
+
+static int IsEntryUtf8(const BibEntry *entry)
+{
+    int isUtf8 = IsUtf8(entry->key) && IsUtf8(BibTypeTable[entry->type]);
+    for (int i = 0; isUtf8 && i < entry->fieldCount; ++i)
+        isUtf8 = IsUtf8(BibFieldTable[entry->fields[i].name]) && IsUtf8(entry->fields[i].value);
+    return isUtf8;
+}
+
+// The rest of a file can't be edited.
+void Bib_UpdateForm(BibFile *file)
+{
+    int isUtf8 = IsUtf8(file->preamble);
+    for (const BibString *string = file->strings; isUtf8 && string; string = string->next)
+        isUtf8 = IsUtf8(string->name) && IsUtf8(string->value);
+    for (const BibEntry *entry = file->entries; isUtf8 && entry; entry = entry->next)
+        isUtf8 = IsEntryUtf8(entry);
+    if (!isUtf8)
+        file->form |= BIB_FORM_CODE_PAGE;
 }
 
 void Bib_FreeEntry(BibEntry *entry)

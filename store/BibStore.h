@@ -2,7 +2,7 @@
 //
 // A BibFile owns its lists, every record in them and every string they point to;
 // records are malloc'd and freed one by one. All text is 8-bit, NUL-terminated, in
-// the selected code page (encoding/Encoding.h).
+// the encoding of its file (Enc_OfFile in encoding/Encoding.h).
 //
 // A value is the concatenation of the pieces of a BibTeX value: a quoted or braced
 // string stands as its inner text, a number as its digits, and an abbreviation as
@@ -56,12 +56,18 @@ struct BibComment { // one @COMMENT
     char *text; // heap, without its delimiters
 };
 
+// How a file was written. A new one has none of these.
+enum {
+    BIB_FORM_CODE_PAGE = 1, // it is no valid UTF-8
+    BIB_FORM_ALL = 1
+};
+
 struct BibFile {
-    FILE *stream;       // null: no stream is kept open
-    int32_t lockHandle; // Sys_LockFile's handle, 0 when the file is not locked
-    int32_t inUse;      // the current command line names the file
-    char *path;         // heap, as passed to Bib_LoadFile
-    int32_t reserved;
+    FILE *stream;             // null: no stream is kept open
+    int32_t lockHandle;       // Sys_LockFile's handle, 0 when the file is not locked
+    int32_t inUse;            // the current command line names the file
+    char *path;               // heap, as passed to Bib_LoadFile
+    int32_t form;             // BIB_FORM_ bits
     int32_t readOnly;         // 0 when the file may be written
     int32_t readOnlyByErrors; // 1 when it is read-only because it loaded with errors
     int32_t modified;         // changes since the last save
@@ -137,6 +143,9 @@ char *Bib_CopyText(const char *text, size_t length); // adds the NUL
 // the path cannot be opened or is no regular file. Takes no lock.
 BibFile *Bib_LoadFile(const char *path);
 
+// Looks at the texts of a file once more: edited in a code page, they may be no UTF-8 any more.
+void Bib_UpdateForm(BibFile *file);
+
 // Frees the record with all it owns. Close `stream` and release `lockHandle` first.
 void Bib_FreeFile(BibFile *file);
 
@@ -210,7 +219,7 @@ static_assert(offsetof(BibString, next) < offsetof(BibString, name) &&
 static_assert(offsetof(BibComment, next) < offsetof(BibComment, text));
 static_assert(offsetof(BibFile, stream) == 0 && offsetof(BibFile, lockHandle) == 8 &&
               offsetof(BibFile, inUse) == 12 && offsetof(BibFile, path) == 16 &&
-              offsetof(BibFile, reserved) == 24 && offsetof(BibFile, readOnly) == 28 &&
+              offsetof(BibFile, form) == 24 && offsetof(BibFile, readOnly) == 28 &&
               offsetof(BibFile, readOnlyByErrors) == 32 && offsetof(BibFile, modified) == 36 &&
               offsetof(BibFile, backupDone) == 40 && offsetof(BibFile, baseName) == 48 &&
               offsetof(BibFile, strings) == 56 && offsetof(BibFile, entries) == 64 &&

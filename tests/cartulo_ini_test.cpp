@@ -12,7 +12,9 @@
 #include <string>
 #include <vector>
 
+#include "encoding/Encoding.h"
 #include "store/Ascii.h"
+#include "store/BibFileSet.h"
 #include "store/BibStore.h"
 #include "store/Profile.h"
 #include "tests/support/LoadText.h"
@@ -219,6 +221,13 @@ void CheckType(const TypeRule &rule)
 TEST(DefaultIni, NamesTheApplication)
 {
     EXPECT_EQ("Cartulo", ValueOf(Section("Preamble").at(0)));
+}
+
+TEST(DefaultIni, SelectsUtf8)
+{
+    BibFileSet set = {};
+    EXPECT_EQ(1, Schema_SelectEncoding(Ini, &set));
+    EXPECT_EQ(&EncodingUtf8, Enc_Current());
 }
 
 // A second section of a name, and what stands before the first, would never be read.

@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "encoding/Encoding.h"
+#include "store/BibStore.h"
 
 namespace
 {
@@ -383,12 +384,12 @@ TEST(EncFromUnicode, GivesBackEveryByteThatIsAloneWithItsMeaning)
 TEST(EncHolds, WhatComesBackAsItWas)
 {
     for (wchar_t c : {L'a', L'\u00E4', L'\u20AC', L'\u00FF', L'\u00AB', L'\u00BB', L'\t'})
-        EXPECT_TRUE(Enc_Holds(c)) << int(c);
+        EXPECT_TRUE(Enc_Holds(c, Enc_Current())) << int(c);
     for (wchar_t c : {L'\u0436', L'\U0001F600', L'\x02', L'\x05'}) // the last two are marks there
-        EXPECT_FALSE(Enc_Holds(c)) << int(c);
+        EXPECT_FALSE(Enc_Holds(c, Enc_Current())) << int(c);
     Enc_Select("CP1251");
-    EXPECT_TRUE(Enc_Holds(L'\u0436'));
-    EXPECT_FALSE(Enc_Holds(L'\u00FF'));
+    EXPECT_TRUE(Enc_Holds(L'\u0436', Enc_Current()));
+    EXPECT_FALSE(Enc_Holds(L'\u00FF', Enc_Current()));
 }
 
 TEST(EncFromUnicode, LogsTheTextAndTheResult)
@@ -418,4 +419,154 @@ TEST(EncFromUnicode, LogsTheStartOfALongText)
 TEST(EncToUnicode, LogsNothing)
 {
     EXPECT_EQ("", LogOf("1", [] { ToUnicode("a\x81\xFF"); }));
+}
+
+// --- UTF-8 ---
+
+namespace
+{
+
+class EncUtf8 : public testing::Test
+{
+protected:
+    EncUtf8() { Enc_Select("CP65001"); }
+
+    static std::string Encode(const std::wstring &text)
+    {
+        return Enc_Encode(text.c_str(), &EncodingUtf8);
+    }
+};
+
+// Of 1, 2, 3 and 4 bytes, right-to-left, combining, private, and no characters at all by now.
+const std::pair<const char *, std::wstring> Utf8Texts[] = {
+    {"", L""},
+    {"plain", L"plain"},
+    {"M\xC3\xBCller", L"M\u00FCller"},
+    {"\xD0\x96\xE2\x82\xAC", L"\u0416\u20AC"},
+    {"\xF0\x9F\x98\x80", L"\U0001F600"},
+    {"\xD7\xA9\xD7\x9C\xE2\x80\x8F", L"\u05E9\u05DC\u200F"},
+    {"e\xCC\x81", L"e\u0301"},
+    {"\xEE\x80\x80\xF4\x8F\xBF\xBF", L"\uE000\U0010FFFF"},
+    {"\xEF\xBF\xBE\xEF\xB7\x90", std::wstring(1, 0xFFFE) + wchar_t(0xFDD0)},
+    {"\x02jan\x05\x01\x7F", L"\u00ABjan\u00BB\x01\x7F"},
+};
+
+} // namespace
+
+TEST(EncSelect, KnowsUtf8ByItsCodePage)
+{
+    Enc_Select("cp65001");
+    EXPECT_EQ(&EncodingUtf8, Enc_Current());
+    EXPECT_STREQ("CP65001", Enc_Current()->name);
+    EXPECT_STREQ("UTF-8", Enc_Label(Enc_Current()));
+    Enc_Select("UTF-8");
+    EXPECT_EQ(&EncodingUtf8, Enc_Current());
+    Enc_Select("CP1251");
+    EXPECT_STREQ("CP1251", Enc_Label(Enc_Current()));
+    EXPECT_EQ(Row("CP65001")->name, nullptr) << "it is a row of the table";
+}
+
+TEST_F(EncUtf8, LeavesThePlainConversionsInTheDefaultPage)
+{
+    Enc_Select("CP1251");
+    Enc_Select("CP65001");
+    EXPECT_EQ(L"\u00FC\u20AC\u00AB", ToUnicode("\xFC\x80\x02"));
+    EXPECT_EQ("\xFC\x80\x02\xFF", FromUnicode(L"\u00FC\u20AC\u00AB\u0416"));
+}
+
+TEST_F(EncUtf8, ConvertsThereAndBack)
+{
+    for (const auto &[bytes, text] : Utf8Texts) {
+        EXPECT_EQ(text, Enc_Decode(bytes, &EncodingUtf8)) << bytes;
+        EXPECT_EQ(bytes, Encode(text));
+    }
+}
+
+TEST_F(EncUtf8, ShowsLiteralGuillemetsLikeMarks)
+{
+    EXPECT_EQ(L"\u00ABa\u00BB", Enc_Decode("\xC2\xAB"
+                                           "a\xC2\xBB",
+                                           &EncodingUtf8));
+    EXPECT_EQ("\x02"
+              "a\x05",
+              Encode(L"\u00ABa\u00BB"));
+}
+
+TEST_F(EncUtf8, ReplacesWhatIsNoCharacter)
+{
+    EXPECT_EQ(L"a\uFFFDb", Enc_Decode("a\xFF"
+                                      "b",
+                                      &EncodingUtf8));
+    EXPECT_EQ(L"a\uFFFD", Enc_Decode("a\xE2\x82", &EncodingUtf8)); // cut off
+    EXPECT_EQ("a\xEF\xBF\xBD", Encode(std::wstring(L"a") + wchar_t(0xD800)));
+    EXPECT_EQ("\xEF\xBF\xBD", Encode(std::wstring(1, 0x110000)));
+}
+
+TEST_F(EncUtf8, HoldsAllCharactersButMarks)
+{
+    for (wchar_t c : {L'a', L'\u0436', L'\U0001F600', L'\uE000', L'\u00AB', L'\t'})
+        EXPECT_TRUE(Enc_Holds(c, &EncodingUtf8)) << int(c);
+    for (int c : {0x02, 0x05, 0xD800, 0xDFFF, 0x110000})
+        EXPECT_FALSE(Enc_Holds(wchar_t(c), &EncodingUtf8)) << c;
+}
+
+TEST_F(EncUtf8, IsFoundInValidTextOnly)
+{
+    for (const auto &[bytes, text] : Utf8Texts)
+        EXPECT_TRUE(Enc_IsUtf8(bytes, strlen(bytes))) << bytes;
+    for (std::string text : {"\xFC", "\x80", "\xC3", "\xC0\x80", "\xE0\x80\x80", "\xED\xA0\x80",
+                             "\xF4\x90\x80\x80", "\xF8\x88\x80\x80\x80", "\xE2\x82"})
+        for (std::string before : {"", "a", "abcdefg", "abcdefgh", "abcdefghi\xC3\xBC"})
+            for (std::string after : {"", "z", "abcdefghijklmnop"}) {
+                std::string whole = before + text + after;
+                EXPECT_FALSE(Enc_IsUtf8(whole.data(), whole.size())) << whole;
+            }
+    EXPECT_TRUE(Enc_IsUtf8("\xC3\xBC\xFF", 2)); // up to the length
+}
+
+TEST_F(EncUtf8, IsTheEncodingOfEachFileThatWasFoundSo)
+{
+    BibFile utf8 = {}, other = {};
+    other.form = BIB_FORM_CODE_PAGE;
+    EXPECT_EQ(&EncodingUtf8, Enc_OfFile(&utf8));
+    EXPECT_EQ(Row("CP1252"), Enc_OfFile(&other));
+    Enc_Select("CP1251");
+    EXPECT_EQ(Row("CP1251"), Enc_OfFile(&utf8));
+    EXPECT_EQ(Row("CP1251"), Enc_OfFile(&other));
+}
+
+TEST_F(EncUtf8, IsTheEncodingOfATextThatIsValid)
+{
+    EXPECT_EQ(&EncodingUtf8, Enc_OfText("M\xC3\xBCller"));
+    EXPECT_EQ(&EncodingUtf8, Enc_OfText(""));
+    EXPECT_EQ(Row("CP1252"), Enc_OfText("M\xFCller"));
+    Enc_Select("CP1251");
+    EXPECT_EQ(Row("CP1251"), Enc_OfText("M\xC3\xBCller"));
+}
+
+TEST_F(EncUtf8, IsRecodedToAndFromTheDefaultPage)
+{
+    const EncodingRecord *page = Row("CP1252");
+    EXPECT_EQ("M\xFCller \x02", Enc_Recode("M\xC3\xBCller \x02", &EncodingUtf8, page));
+    EXPECT_EQ("M\xC3\xBCller \x02", Enc_Recode("M\xFCller \x02", page, &EncodingUtf8));
+    EXPECT_EQ("\xFF", Enc_Recode("\xD0\x96", &EncodingUtf8, page));
+    EXPECT_EQ("\xC2\xAB", Enc_Recode("\xC2\xAB", &EncodingUtf8, &EncodingUtf8)); // untouched
+}
+
+TEST_F(EncUtf8, IsSearchedWithoutTheCaseOfAnyLetter)
+{
+    auto contains = [](const char *text, const char *search) {
+        return Enc_Utf8Contains(text, Enc_FoldUtf8(search)) != 0;
+    };
+    EXPECT_TRUE(contains("M\xC3\xBCLLER", "m\xC3\x9Cller"));
+    EXPECT_TRUE(
+        contains("\xD0\x9F\xD1\x80\xD0\xB8\xD0\xB2\xD0\xB5\xD1\x82", "\xD0\xBF\xD0\xA0\xD0\x98"));
+    EXPECT_TRUE(contains("\xCE\xA3 \xCF\x82", "\xCF\x83 \xCF\x83")); // sigma, also at the end
+    EXPECT_TRUE(contains("aab\xC3\xBC", "AB\xC3\x9C"));
+    EXPECT_TRUE(contains("\xF0\x90\x90\x80", "\xF0\x90\x90\xA8")); // Deseret
+    EXPECT_FALSE(contains("Muller", "m\xC3\xBCller"));
+    EXPECT_FALSE(contains("M\xC3\xBC", "m\xC3\xBCller"));
+    EXPECT_FALSE(contains("", "\xC3\xBC"));
+    EXPECT_TRUE(contains("", ""));
+    EXPECT_TRUE(contains("\xE2\x84\xAA", "k")); // the sign for kelvin
 }

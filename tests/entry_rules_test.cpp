@@ -396,3 +396,38 @@ TEST_F(RemovedEntry, IsNotSelectedAgainByItsOtherRow)
     EXPECT_EQ(&a, Entry_NextInList(index, 4, 2));
     EXPECT_EQ(nullptr, Entry_NextInList(index, 2, 0));
 }
+
+// --- Files in several encodings ---
+
+TEST_F(EntryKeys, AreComparedAcrossEncodings)
+{
+    Enc_Select("CP65001");
+    BibFile *utf8 = Open("a.bib", "@misc{M\xC3\xBCller,}\n");
+    BibFile *other = Open("b.bib", "@misc{\xD6sterreich,}\n");
+    auto check = [this](const wchar_t *key, const BibFile *target) {
+        return Entry_CheckNewKey(&set, target, Key_Read(key, Enc_OfFile(target)));
+    };
+    EXPECT_EQ(KEY_TAKEN_ELSEWHERE, check(L"m\u00FCller", other));
+    EXPECT_EQ(KEY_TAKEN, check(L"m\u00FCller", utf8));
+    EXPECT_EQ(KEY_TAKEN_ELSEWHERE, check(L"\u00D6sterreich", utf8));
+    EXPECT_EQ(KEY_OK, check(L"\u0416", utf8));
+    EXPECT_EQ(KEY_MISFIT, check(L"\u0416", other));
+    EXPECT_EQ(KEY_OK, check(L"Muller", other));
+}
+
+TEST_F(NewEntry, HasNamesInTheEncodingOfItsFile)
+{
+    Enc_Select("CP65001");
+    BibFile *utf8 = Open("a.bib", "@misc{a,}\n");
+    BibFile *other = Open("b.bib", "@misc{b, x = {\xFC}}\n");
+    int type = Bib_TypeIndex("B\xC3\xBC"
+                             "cher");
+    EXPECT_EQ(type, Entry_TypeFor(utf8, type));
+    EXPECT_STREQ("B\xFC"
+                 "cher",
+                 BibTypeTable[Entry_TypeFor(other, type)]);
+    EXPECT_EQ(type, Entry_TypeFor(utf8, Entry_TypeFor(other, type)));
+    const char specs[] = "t\xC3\xADtulo=*\0year=*\0";
+    EXPECT_EQ(std::string(specs, sizeof specs), Entry_SpecsFor(utf8, specs));
+    EXPECT_EQ(std::string("t\xEDtulo=*\0year=*\0\0", 17), Entry_SpecsFor(other, specs));
+}

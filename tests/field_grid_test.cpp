@@ -101,7 +101,7 @@ protected:
             Bib_FreeFile(file);
         file = LoadText(text);
         EXPECT_EQ(0, file->errorCount) << Messages(file);
-        Grid_Fill(&grid, FindEntry(file, key));
+        Grid_Fill(&grid, FindEntry(file, key), Enc_Current());
     }
 
     void Type(int row, const std::string &text) { grid.rows[row].text = Wide(text); }
@@ -443,9 +443,9 @@ TEST_F(Grid, ChecksNoInheritedRow)
 {
     Show("@inbook{k, crossref = {p}}\n@book{p, note = {a}}\n", "k");
     grid.rows[1].stored = "}";
-    EXPECT_EQ(nullptr, Grid_CheckRow(&grid.rows[1]));
+    EXPECT_EQ(nullptr, Grid_CheckRow(&grid, 1));
     grid.rows[1].inherited = false;
-    EXPECT_STREQ("Unbalanced braces (extra `}')", Grid_CheckRow(&grid.rows[1]));
+    EXPECT_STREQ("Unbalanced braces (extra `}')", Grid_CheckRow(&grid, 1));
 }
 
 TEST_F(Grid, HasRoomForAsManyNamesAsTheTable)
@@ -476,7 +476,7 @@ TEST_F(Grid, CopiesTheWordsThatTravelWithFields)
     old->reserved = 77;
     for (int i = 0; i < old->fieldCount; ++i)
         old->fields[i].companion = 100 + i;
-    Grid_Fill(&grid, old);
+    Grid_Fill(&grid, old, Enc_Current());
     Grid_Remove(&grid, 0);
     int row;
     Grid_Add(&grid, "new", &row);
@@ -597,7 +597,7 @@ protected:
     void Fill(BibEntry *entry)
     {
         ASSERT_NE(nullptr, entry);
-        Grid_Fill(&grid, entry);
+        Grid_Fill(&grid, entry, Enc_Current());
         type = entry->type;
     }
 
@@ -702,7 +702,7 @@ protected:
     {
         bool good = true;
         for (int i = 0; i < grid.count; ++i)
-            if (const char *reason = Grid_CheckRow(&grid.rows[i])) {
+            if (const char *reason = Grid_CheckRow(&grid, i)) {
                 said.push_back("refuses " + grid.rows[i].key + ": " + reason);
                 good = false;
             }

@@ -1,11 +1,13 @@
 #include <gtest/gtest.h>
 
+#include "encoding/Encoding.h"
 #include "ui/FieldKeys.h"
 
 TEST(FieldKeyCheckNewName, LooksAtTheValuesThatAreShown)
 {
     FieldGrid grid = {};
     grid.count = 2;
+    grid.encoding = Enc_Current();
     grid.rows[0].key = "note";
     grid.rows[0].text = L"Title";
     grid.rows[1].key = "year";

@@ -3,43 +3,60 @@
 #include "encoding/Encoding.h"
 #include "ui/Keys.h"
 
+static TypedKey Read(const wchar_t *typed)
+{
+    return Key_Read(typed, Enc_Current());
+}
+
 TEST(KeyRead, LosesBlanksAndControlCharacters)
 {
-    EXPECT_EQ("mykey", Key_Read(L" my key\t\n\x01").text);
-    EXPECT_EQ("", Key_Read(L" \t ").text);
-    EXPECT_EQ("", Key_Read(L"").text);
-    EXPECT_EQ("a{b}", Key_Read(L"a{b}").text);
-    EXPECT_EQ("mark", Key_Read(L"\u00ABmark\u00BB").text); // marks of abbreviations
+    EXPECT_EQ("mykey", Read(L" my key\t\n\x01").text);
+    EXPECT_EQ("", Read(L" \t ").text);
+    EXPECT_EQ("", Read(L"").text);
+    EXPECT_EQ("a{b}", Read(L"a{b}").text);
+    EXPECT_EQ("mark", Read(L"\u00ABmark\u00BB").text); // marks of abbreviations
 }
 
 TEST(KeyRead, IsTextOfTheCodePage)
 {
-    EXPECT_EQ("M\xFCller", Key_Read(L"M\u00FCller").text);
+    EXPECT_EQ("M\xFCller", Read(L"M\u00FCller").text);
     Enc_Select("CP1251");
-    EXPECT_EQ("\xE4", Key_Read(L"\u0434").text);
+    EXPECT_EQ("\xE4", Read(L"\u0434").text);
 }
 
 TEST(KeyRead, TellsWhatTheCodePageLacks)
 {
-    EXPECT_TRUE(Key_Read(L"M\u00FCller \u00FF").fits);
-    EXPECT_FALSE(Key_Read(L"\u0141ukasz").fits);
-    EXPECT_FALSE(Key_Read(L"a\U0001F600").fits);
-    EXPECT_EQ("The key includes characters that can't be stored in CP1252.", Key_MisfitText());
+    EXPECT_TRUE(Read(L"M\u00FCller \u00FF").fits);
+    EXPECT_FALSE(Read(L"\u0141ukasz").fits);
+    EXPECT_FALSE(Read(L"a\U0001F600").fits);
+    EXPECT_EQ("The key includes characters that can't be stored in CP1252.",
+              Key_MisfitText(Read(L"")));
     Enc_Select("CP1250");
-    EXPECT_TRUE(Key_Read(L"\u0141ukasz").fits);
-    EXPECT_FALSE(Key_Read(L"\u00FF").fits);
-    EXPECT_EQ("The key includes characters that can't be stored in CP1250.", Key_MisfitText());
+    EXPECT_TRUE(Read(L"\u0141ukasz").fits);
+    EXPECT_FALSE(Read(L"\u00FF").fits);
+    EXPECT_EQ("The key includes characters that can't be stored in CP1250.",
+              Key_MisfitText(Read(L"")));
+}
+
+TEST(KeyRead, FitsInUtf8WhateverItIs)
+{
+    TypedKey key = Key_Read(L"\u0141ukasz \U0001F600", &EncodingUtf8);
+    EXPECT_EQ("\xC5\x81ukasz\xF0\x9F\x98\x80", key.text);
+    EXPECT_TRUE(key.fits);
+    EXPECT_EQ(&EncodingUtf8, key.encoding);
+    EXPECT_FALSE(Key_Read(L"a\u00AB", &EncodingUtf8).fits);
+    EXPECT_EQ("The key includes characters that can't be stored in UTF-8.", Key_MisfitText(key));
 }
 
 TEST(KeyRead, TellsOfGuillemets)
 {
-    EXPECT_FALSE(Key_Read(L"my\u00AB1").fits);
-    EXPECT_FALSE(Key_Read(L"\u00BB").fits);
+    EXPECT_FALSE(Read(L"my\u00AB1").fits);
+    EXPECT_FALSE(Read(L"\u00BB").fits);
 }
 
 TEST(KeyRead, PassesOverWhatIsDroppedAnyway)
 {
-    EXPECT_TRUE(Key_Read(L"a\t\x02 b").fits);
+    EXPECT_TRUE(Read(L"a\t\x02 b").fits);
 }
 
 TEST(NameCheck, TellsWhatIsWrong)

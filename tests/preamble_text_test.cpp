@@ -8,9 +8,14 @@
 #include "tests/support/LoadText.h"
 #include "ui/PreambleText.h"
 
+static PreambleEdit ReadEdit(const std::wstring &typed, const char *stored)
+{
+    return Preamble_Read(typed, stored, Enc_Current());
+}
+
 static std::string Read(const std::wstring &typed)
 {
-    return Preamble_Read(typed, "").text;
+    return ReadEdit(typed, "").text;
 }
 
 static const char TwoPieces[] = "\\def\\a{x}\r\n\\def\\b{y}\r\n";
@@ -66,7 +71,7 @@ TEST(PreambleRead, MakesMarksOfGuillemets)
 TEST(PreambleRead, KeepsTheBytesOfPiecesThatWereNotTouched)
 {
     const char stored[] = "Zo\303\253\r\nb\r\n\253c\273\r\n";
-    PreambleEdit edit = Preamble_Read(L"new\r\nZo\u00C3\u00AB\r\nb!\r\n\u00ABc\u00BB\r\n", stored);
+    PreambleEdit edit = ReadEdit(L"new\r\nZo\u00C3\u00AB\r\nb!\r\n\u00ABc\u00BB\r\n", stored);
     EXPECT_EQ("new\r\nZo\303\253\r\nb!\r\n\253c\273\r\n", edit.text);
     EXPECT_EQ(L"new\nb!\n", edit.touched);
     EXPECT_EQ("b", edit.replaced);
@@ -74,7 +79,7 @@ TEST(PreambleRead, KeepsTheBytesOfPiecesThatWereNotTouched)
 
 TEST(PreambleRead, KeepsTheBytesOfCopies)
 {
-    PreambleEdit edit = Preamble_Read(L"a\r\n\u00AB\r\n\u00AB\n\u00AB!\r\n", "\253\r\n");
+    PreambleEdit edit = ReadEdit(L"a\r\n\u00AB\r\n\u00AB\n\u00AB!\r\n", "\253\r\n");
     EXPECT_EQ("a\r\n\253\r\n\253\r\n\2!\r\n", edit.text);
     EXPECT_EQ(L"a\n\u00AB!\n", edit.touched);
     EXPECT_EQ("", edit.replaced);
@@ -84,15 +89,14 @@ TEST(PreambleRead, KeepsTheBytesOfCopies)
 TEST(PreambleRead, TellsPiecesThatLookAlikeByTheirPlace)
 {
     const char stored[] = "\253\r\nx\r\n\2\r\ny\r\n";
-    EXPECT_EQ("x\r\n\2\r\ny\r\n", Preamble_Read(L"x\r\n\u00AB\r\ny\r\n", stored).text);
-    EXPECT_EQ("\253\r\nx\r\ny\r\n", Preamble_Read(L"\u00AB\r\nx\r\ny\r\n", stored).text);
-    EXPECT_EQ("new\r\nx\r\n\2\r\ny\r\n",
-              Preamble_Read(L"new\r\nx\r\n\u00AB\r\ny\r\n", stored).text);
+    EXPECT_EQ("x\r\n\2\r\ny\r\n", ReadEdit(L"x\r\n\u00AB\r\ny\r\n", stored).text);
+    EXPECT_EQ("\253\r\nx\r\ny\r\n", ReadEdit(L"\u00AB\r\nx\r\ny\r\n", stored).text);
+    EXPECT_EQ("new\r\nx\r\n\2\r\ny\r\n", ReadEdit(L"new\r\nx\r\n\u00AB\r\ny\r\n", stored).text);
 }
 
 TEST(PreambleRead, KeepsTheBytesOfMovedPieces)
 {
-    PreambleEdit edit = Preamble_Read(L"b\r\n\u00AB\r\n", "\253\r\nb\r\n");
+    PreambleEdit edit = ReadEdit(L"b\r\n\u00AB\r\n", "\253\r\nb\r\n");
     EXPECT_EQ("b\r\n\253\r\n", edit.text);
     EXPECT_EQ(L"", edit.touched);
 }
@@ -134,11 +138,43 @@ TEST(PreambleCheck, NamesEachWrongPiece)
 TEST(PreambleStore, FillsTheBuffer)
 {
     BibFile *file = LoadText("@preamble{{a}}\n");
-    Preamble_Store(file, std::string(8191, 'x'));
+    Preamble_Store(file, {std::string(8191, 'x'), {}, L"", ""});
     EXPECT_EQ(8191u, strlen(file->preamble));
-    Preamble_Store(file, "b\r\n");
+    Preamble_Store(file, {"b\r\n", {}, L"", ""});
     EXPECT_STREQ("b\r\n", file->preamble);
     Bib_FreeFile(file);
+}
+
+TEST(PreambleRead, KeepsTheBytesOfUntouchedPiecesInUtf8)
+{
+    PreambleEdit edit = Preamble_Read(L"\u00ABa\u00BB\r\n\u0416\r\n",
+                                      "\xC2\xAB"
+                                      "a\xC2\xBB\r\nb\r\n",
+                                      &EncodingUtf8);
+    EXPECT_EQ("\xC2\xAB"
+              "a\xC2\xBB\r\n\xD0\x96\r\n",
+              edit.text);
+}
+
+TEST(PreambleRead, TellsWhereOldPiecesAreNow)
+{
+    const struct {
+        const wchar_t *typed;
+        std::vector<int> places; // of a, b, c
+    } rows[] = {
+        {L"a\r\nb\r\nc\r\n", {0, 1, 2}},
+        {L"a\r\nc\r\n", {0, -1, 1}},
+        {L"A\r\nB\r\nC\r\n", {0, 1, 2}},
+        {L"a\r\nx\r\nc\r\n", {0, 1, 2}},
+        {L"a\r\nx\r\nb\r\nc\r\n", {0, 2, 3}},
+        {L"c\r\nb\r\na\r\n", {2, 1, 0}},
+        {L"b\r\nb\r\n", {-1, 0, -1}},
+        {L"c\r\n", {-1, -1, 0}},
+        {L"", {-1, -1, -1}},
+        {L"x\r\n", {0, -1, -1}},
+    };
+    for (const auto &row : rows)
+        EXPECT_EQ(row.places, ReadEdit(row.typed, "a\r\nb\r\nc\r\n").places) << row.typed;
 }
 
 class PreambleFiles : public testing::Test

@@ -5,7 +5,8 @@
 #include <string>
 #include <vector>
 
-#include "store/BibStore.h"
+#include "encoding/Encoding.h"
+#include "store/BibFileSet.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TempFolder.h"
 #include "ui/Schema.h"
@@ -49,6 +50,34 @@ TEST_F(SchemaFile, NamesTheApplication)
     std::string other = folder.Write("b.ini", "[Other]\nAppName = My Cards\n");
     EXPECT_EQ("Cartulo", Schema_ApplicationName(other.c_str()));
     EXPECT_EQ("Cartulo", Schema_ApplicationName("/no/such/file"));
+}
+
+TEST_F(SchemaFile, SelectsItsEncoding)
+{
+    BibFileSet set = {};
+    Enc_Select("CP1251");
+    std::string without = folder.Write("a.ini", "[Preamble]\nAppName = x\nEncoding =\n");
+    EXPECT_EQ(1, Schema_SelectEncoding(without.c_str(), &set));
+    EXPECT_EQ(1, Schema_SelectEncoding("/no/such/file", &set));
+    EXPECT_STREQ("CP1251", Enc_Current()->name);
+    std::string ini = folder.Write("b.ini", "[preamble]\nencoding = cp65001\n");
+    EXPECT_EQ(1, Schema_SelectEncoding(ini.c_str(), &set));
+    EXPECT_EQ(&EncodingUtf8, Enc_Current());
+    EXPECT_EQ(nullptr, set.loadErrors);
+    FileSet_Free(&set);
+}
+
+TEST_F(SchemaFile, TellsOfAnEncodingThatIsNotKnown)
+{
+    BibFileSet set = {};
+    std::string ini = folder.Write("a.ini", "[Preamble]\nEncoding=UTF-8\n");
+    EXPECT_EQ(0, Schema_SelectEncoding(ini.c_str(), &set));
+    EXPECT_STREQ("CP1252", Enc_Current()->name);
+    EXPECT_EQ("ERROR: The file '" + ini +
+                  "' names the encoding 'UTF-8', which is not known; CP1252 stays selected "
+                  "(CP65001 is UTF-8)\n",
+              std::string(set.loadErrors));
+    FileSet_Free(&set);
 }
 
 TEST_F(SchemaFile, RegistersItsEntryTypes)

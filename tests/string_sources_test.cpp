@@ -38,7 +38,10 @@ protected:
 
     Lines LinesAt(const StringSources &sources, int position)
     {
-        return Strings_Lines(&sources, At(sources, position));
+        Lines texts;
+        for (const StringLine &line : Strings_Lines(&sources, At(sources, position)))
+            texts.push_back(line.text);
+        return texts;
     }
 
     Lines NamesIn(const BibFile *file)
@@ -73,6 +76,24 @@ TEST_F(StringsSources, AreTheListsOfTheIniFileThenAllFilesThenEachFile)
     EXPECT_THAT(LinesAt(sources, 2), ElementsAre("a = A", "b = B\2a\5", "c = 12"));
     EXPECT_THAT(LinesAt(sources, 3), ElementsAre("a = A"));
     EXPECT_THAT(LinesAt(sources, 4), ElementsAre("b = B\2a\5", "c = 12"));
+}
+
+TEST_F(StringsSources, HaveTheEncodingOfTheirFile)
+{
+    Enc_Select("CP65001");
+    Load("@string{a = {\xC3\xBC}}\n");
+    Load("@string{b = {\xFC}}\n@string{c = {C}}\n");
+    StringSources sources = Read("[String]\nMonths = *Months\n[*Months]\nmar = M\xC3\xA4rz\n"
+                                 "old = \xE4\n");
+    auto encodings = [&](int position) {
+        std::string list;
+        for (const StringLine &line : Strings_Lines(&sources, At(sources, position)))
+            list += std::string(Enc_Label(line.encoding)) + " ";
+        return list;
+    };
+    EXPECT_EQ("UTF-8 CP1252 ", encodings(0));
+    EXPECT_EQ("UTF-8 CP1252 CP1252 ", encodings(1));
+    EXPECT_EQ("CP1252 CP1252 ", encodings(3));
 }
 
 TEST_F(StringsSources, NeedNoIniFile)
@@ -131,9 +152,17 @@ TEST_F(StringsSources, CanBeChangedWhenTheyAreAWritableFile)
         EXPECT_EQ(nullptr, Strings_WritableFile(&sources, source)) << source;
 }
 
+static std::vector<StringLine> WithEncoding(const Lines &texts)
+{
+    std::vector<StringLine> lines;
+    for (const std::string &text : texts)
+        lines.push_back({text, Enc_Current()});
+    return lines;
+}
+
 static std::string Compare(const Lines &before, const Lines &after)
 {
-    LineChange change = Strings_Compare(before, after);
+    LineChange change = Strings_Compare(WithEncoding(before), WithEncoding(after));
     return std::to_string(change.first) + " -" + std::to_string(change.removed) + " +" +
            std::to_string(change.added);
 }
@@ -152,9 +181,9 @@ TEST(StringsCompare, FindsTheRowsThatChanged)
 
 TEST(StringsKeyOf, EndsAtTheFirstBlank)
 {
-    EXPECT_EQ("jan", Strings_KeyOf("jan = January"));
-    EXPECT_EQ("stray", Strings_KeyOf("stray line"));
-    EXPECT_EQ("alone", Strings_KeyOf("alone"));
+    EXPECT_EQ("jan", Strings_KeyOf({"jan = January", Enc_Current()}));
+    EXPECT_EQ("stray", Strings_KeyOf({"stray line", Enc_Current()}));
+    EXPECT_EQ("alone", Strings_KeyOf({"alone", Enc_Current()}));
 }
 
 TEST(StringsFindCommand, KnowsThreeLetters)

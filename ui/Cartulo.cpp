@@ -126,6 +126,8 @@ Cartulo::~Cartulo()
 void Cartulo::ReadSchema()
 {
     m_ini = Schema_FindIni();
+    if (!Schema_SelectEncoding(m_ini.c_str(), &m_set))
+        ForceMessages();
     m_name = Schema_ApplicationName(m_ini.c_str());
     Bib_Initialize();
     Schema_RegisterTypes(m_ini.c_str());
@@ -387,18 +389,22 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *)
     CommandResult result = Command_Process(&m_set, m_state, commandLine);
     m_busy = false;
     if (Enc_Current() != encoding)
-        m_search = Value_Read(m_searchText);
+        m_search = Value_Read(m_searchText, Enc_Current());
     if (m_list) {
         m_list->Update_Index(IsOpen(&m_set, file, path) ? entry : nullptr, m_search.c_str());
         Arrange();
     }
     if (m_messages)
         m_messages->Fill(&m_set);
-    if (result.errors != 0) {
-        TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
-        GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, ID_MESSAGES));
-    }
+    if (result.errors != 0)
+        ForceMessages();
     return 0;
+}
+
+void Cartulo::ForceMessages()
+{
+    TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
+    GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, ID_MESSAGES));
 }
 
 void Cartulo::ShowOpenFiles()
@@ -430,6 +436,16 @@ void Cartulo::OpenFile(const std::string &path)
     }
     ProcessCommand(commandLine.c_str(), "OnOpen");
     ShowOpenFiles();
+}
+
+const EncodingRecord *Cartulo::Encoding() const
+{
+    return Enc_OfFile(m_set.files[m_file]);
+}
+
+wxString Cartulo::EncodingText() const
+{
+    return m_entry ? Enc_Label(Encoding()) : "";
 }
 
 wxString Cartulo::CountText() const
@@ -475,7 +491,7 @@ void Cartulo::OnInsertCite(wxCommandEvent &)
     TNSMessage("INFO: Cartulo::OnInsertCite", "", TNS_ACTION);
     if (!m_entry || m_state->companionWindow == 0 || !*m_state->companionService)
         return;
-    wxString command = "-s (" + StoreText(m_entry->key) + ") ...InsCite";
+    wxString command = "-s (" + StoreText(m_entry->key, Encoding()) + ") ...InsCite";
     AppLog("Pass* ", command.utf8_str());
     Native_BringForward(m_state->companionWindow);
     if (!SendCommand(m_state->companionService, command.utf8_str()))
@@ -584,8 +600,8 @@ void Cartulo::OnSearch(wxCommandEvent &event)
         return;
     }
     m_searchText = field->GetValue().ToStdWstring();
-    m_search = Value_Read(m_searchText);
-    TNSMessage("INFO: Cartulo::OnSearch ", StoreText(m_search.c_str()).utf8_str(), TNS_ACTION);
+    m_search = Value_Read(m_searchText, Enc_Current());
+    TNSMessage("INFO: Cartulo::OnSearch ", field->GetValue().utf8_str(), TNS_ACTION);
     m_list->Update_Index(m_entry, m_search.c_str());
     bool found = m_list->GetItemCount() > 0 || m_search.empty();
     ShowStatus(this, found ? "" : "No entry holds this text.");

@@ -55,7 +55,8 @@ public:
     // nothing was saved or a save failed, 1 when every modified file was saved.
     int SaveAll(bool quiet);
 
-    wxString CountText() const; // "There are ... entries in ... BIB files."
+    wxString CountText() const;    // "There are ... entries in ... BIB files."
+    wxString EncodingText() const; // of the file of the current entry
 
     // The files with unsaved changes, and why they could not be saved where that was tried.
     wxString UnsavedText() const;
@@ -79,6 +80,7 @@ private:
     };
 
     void ReadSchema();
+    void ForceMessages();
     void CreateEntryPane();
     wxSizer *CreateFieldGrid();
     void CreateRow(int index);
@@ -122,12 +124,16 @@ private:
     void CommitEntry();
     bool Commit();
     int Ask(const wxString &text, int buttons);
+    int ChosenType() const;
     bool AcceptLosses();
     bool CheckRows();
     bool ReplaceEntry(int type);
     void AddField(const std::string &key);
+    wxString KeyText(int row) const;
+    void LogRow(const char *prefix, int row) const;
     int RowForCommand(const char *logPrefix);
     void RemoveRow(int row);
+    const EncodingRecord *Encoding() const; // of the current entry
     void SelectInList(BibEntry *entry);
     void ShowChanged(BibEntry *entry, int file);
     void RemoveEntry(int row);
@@ -165,7 +171,7 @@ private:
     int m_file = -1;             // index of the file that holds m_entry
     std::string m_typeName;      // of the current entry, as it is chosen now
     std::wstring m_searchText;   // what the search field holds
-    std::string m_search;        // the same as store text
+    std::string m_search;        // the same in the selected encoding
     bool m_isPainted = false;
     bool m_editMode = false; // else the list is in use
     bool m_busy = false;     // see IsBusy

@@ -19,8 +19,10 @@
 #include "app/Ids.h"
 #include "app/Log.h"
 #include "app/Native.h"
+#include "encoding/Encoding.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
+#include "ui/EntryRules.h"
 #include "ui/QListBox.h"
 #include "ui/Schema.h"
 #include "ui/Theme.h"
@@ -89,7 +91,7 @@ void Cartulo::WriteRow(int index)
     const GridRow &row = m_grid.rows[index];
     FieldRow &controls = m_rows[index];
     bool own = m_editMode && !row.inherited;
-    controls.label->SetLabelText(StoreText(row.key.c_str()));
+    controls.label->SetLabelText(KeyText(index));
     if (controls.value->GetValue().ToStdWstring() != row.text)
         controls.value->ChangeValue(wxString(row.text));
     bool locked = !own || row.crossref || row.locked;
@@ -136,7 +138,7 @@ void Cartulo::WriteRows()
 void Cartulo::ShowMoreFields()
 {
     std::string text = Grid_HiddenText(&m_grid);
-    m_moreFields->SetLabelText(StoreText(text.c_str()));
+    m_moreFields->SetLabelText(text);
     m_moreFields->Show(!text.empty());
 }
 
@@ -243,7 +245,8 @@ void Cartulo::ShowEntry(BibEntry *entry, int file)
     TypeChoice_Fill(m_type, LONGEST_TYPE);
     TypeChoice_Select(m_type, entry->type);
     m_type->Enable(m_editMode);
-    Grid_Fill(&m_grid, entry);
+    ShowEncoding(this, EncodingText());
+    Grid_Fill(&m_grid, entry, Encoding());
     FillRows();
     Update_Tools();
     if (m_editMode)
@@ -260,6 +263,7 @@ void Cartulo::ClearEntry()
     m_entry = nullptr;
     m_file = -1;
     m_typeName.clear();
+    ShowEncoding(this, EncodingText());
     m_fileName->SetLabelText("");
     m_fileName->UnsetToolTip();
     m_type->SetSelection(wxNOT_FOUND);
@@ -297,10 +301,10 @@ void Cartulo::CheckMandatoryFields(int last)
     SchemaAdvice advice = Schema_Advise(m_ini.c_str(), m_typeName.c_str(), rows);
     m_newFieldKey->Clear();
     for (const std::string &key : advice.proposals)
-        m_newFieldKey->Append(StoreText(key.c_str()));
+        m_newFieldKey->Append(OwnText(key.c_str()));
     if (advice.selected >= 0)
         m_newFieldKey->SetSelection(advice.selected);
-    wxString note = StoreText(advice.note.c_str());
+    wxString note = OwnText(advice.note.c_str());
     m_missingFields->SetLabelText(note);
     m_missingFields->SetToolTip(note);
 }
@@ -308,7 +312,7 @@ void Cartulo::CheckMandatoryFields(int last)
 void Cartulo::UpdateHelpText()
 {
     std::string text = Schema_HelpText(m_ini.c_str(), m_typeName.c_str(), m_editMode);
-    m_help->ChangeValue(StoreText(text.c_str()));
+    m_help->ChangeValue(OwnText(text.c_str()));
 }
 
 // --- The mode ---
@@ -397,17 +401,25 @@ bool Cartulo::FinishEditing()
     return !m_editMode;
 }
 
+int Cartulo::ChosenType() const
+{
+    int type = TypeChoice_Type(m_type);
+    if (type < 0 || type == m_entry->type)
+        return m_entry->type;
+    return Entry_TypeFor(m_set.files[m_file], type);
+}
+
 // Takes the edits over or drops them, as the user says. False when the editing goes on.
 bool Cartulo::Commit()
 {
     if (!m_entry || !m_editMode || m_set.files[m_file]->readOnly)
         return true;
     ReadRows();
-    int chosen = TypeChoice_Type(m_type), type = chosen >= 0 ? chosen : m_entry->type;
+    int type = ChosenType();
     GridChanges changes = Grid_Compare(&m_grid, type);
     if (!Grid_HasChanges(&changes))
         return true;
-    int answer = Ask(StoreText(Grid_Question(&changes).c_str()), wxYES_NO | wxCANCEL);
+    int answer = Ask(Grid_Question(&changes), wxYES_NO | wxCANCEL);
     if (answer != wxYES)
         return answer == wxNO;
     if (!Grid_ChangesOnlyType(&changes))
@@ -438,14 +450,13 @@ bool Cartulo::CheckRows()
 {
     int firstBad = -1;
     for (int i = 0; i < m_grid.count; ++i) {
-        const char *reason = Grid_CheckRow(&m_grid.rows[i]);
+        const char *reason = Grid_CheckRow(&m_grid, i);
         if (!reason)
             continue;
         if (firstBad < 0)
             firstBad = i;
-        ShowWarning(CommitTitle, "Wrong syntax of value in the field: `" +
-                                     StoreText(m_grid.rows[i].key.c_str()) + "':\n\n" +
-                                     StoreText(reason) +
+        ShowWarning(CommitTitle, "Wrong syntax of value in the field: `" + KeyText(i) + "':\n\n" +
+                                     reason +
                                      "\n\nIn this reason modification of entire entry can't be "
                                      "accepted.\nFix an error and try again.");
     }

@@ -94,9 +94,10 @@ void Cartulo::RemoveEntry(int row)
     std::string referrers = Entry_Referrers(file, m_entry);
     if (!referrers.empty()) {
         ShowWarning("Removing Bibliography Entry",
-                    "The entry `" + StoreText(m_entry->key) +
+                    "The entry `" + StoreText(m_entry->key, Encoding()) +
                         "' can't be removed, because following entries:\n\n" +
-                        StoreText(referrers.c_str()) + ".\n\nrefer it in `crossref' field.");
+                        StoreText(referrers.c_str(), Encoding()) +
+                        ".\n\nrefer it in `crossref' field.");
         return;
     }
     BibEntry *next = Entry_NextInList(m_list->Item(0), int(m_list->GetItemCount()), row);

@@ -36,9 +36,14 @@ int Cartulo::RowWithFocus(int count) const
     return -1;
 }
 
-static void LogRow(const char *prefix, int row, const std::string &key)
+wxString Cartulo::KeyText(int row) const
 {
-    wxString text = wxString::Format("k=%d, name=", row) + StoreText(key.c_str());
+    return StoreText(m_grid.rows[row].key.c_str(), m_grid.encoding);
+}
+
+void Cartulo::LogRow(const char *prefix, int row) const
+{
+    wxString text = wxString::Format("k=%d, name=", row) + KeyText(row);
     TNSMessage(prefix, text.utf8_str(), TNS_ACTION);
 }
 
@@ -49,7 +54,7 @@ void Cartulo::OnNewField(wxCommandEvent &)
     TNSMessage("INFO: Cartulo::OnNewField", "", TNS_ACTION);
     if (!m_editMode || !m_entry)
         return;
-    TypedKey key = Key_Read(m_newFieldKey->GetValue().ToStdWstring().c_str());
+    TypedKey key = Key_Read(m_newFieldKey->GetValue().ToStdWstring().c_str(), m_grid.encoding);
     switch (Name_Check(key)) {
     case NAME_EMPTY:
         ShowWarning(AddTitle, "Field key is undefined.\nPlease enter key name or choose some "
@@ -59,7 +64,7 @@ void Cartulo::OnNewField(wxCommandEvent &)
         Box_WarnOrCancel(wxGetTopLevelParent(this), AddTitle, FieldKey_BadCharsText);
         break;
     case NAME_MISFIT:
-        ShowWarning(AddTitle, StoreText(Key_MisfitText().c_str()));
+        ShowWarning(AddTitle, Key_MisfitText(key));
         break;
     case NAME_UNWRITABLE:
         ShowWarning(AddTitle, FieldKey_UnwritableText);
@@ -103,7 +108,7 @@ int Cartulo::RowForCommand(const char *logPrefix)
 {
     int row = m_editMode ? FocusedRow() : -1;
     if (row >= 0)
-        LogRow(logPrefix, row, m_grid.rows[row].key);
+        LogRow(logPrefix, row);
     else if (m_editMode)
         ShowStatus(this,
                    "Put the cursor into a field first, one that was there before the editing.");
@@ -115,7 +120,7 @@ void Cartulo::OnEditField(wxCommandEvent &)
     int row = RowForCommand("INFO: Editing Field: ");
     if (row < 0)
         return;
-    wxString key = StoreText(m_grid.rows[row].key.c_str());
+    wxString key = KeyText(row);
     wxString text = m_rows[row].value->GetValue();
     for (bool taken = false; !taken;) {
         Cartulo_EditField dialog(wxGetTopLevelParent(this), key, text);
@@ -134,7 +139,7 @@ void Cartulo::OnRenameField(wxCommandEvent &)
     int row = RowForCommand("INFO: Renaming Field: ");
     if (row < 0)
         return;
-    wxString key = StoreText(m_grid.rows[row].key.c_str());
+    wxString key = KeyText(row);
     ReadRows();
     Cartulo_RenameField dialog(wxGetTopLevelParent(this), &m_grid, key, m_newFieldKey->GetStrings(),
                                m_newFieldKey->GetValue());
@@ -176,7 +181,7 @@ void Cartulo::RemoveRow(int row)
     if (row >= m_grid.count || m_grid.rows[row].inherited)
         return;
     std::string key = m_grid.rows[row].key;
-    LogRow("INFO: Cartulo::OnRemoveField ", row, key);
+    LogRow("INFO: Cartulo::OnRemoveField ", row);
     int focused = RowWithFocus(m_grid.count);
     ReadRows();
     GridRemove result = Grid_Remove(&m_grid, row);
@@ -188,11 +193,11 @@ void Cartulo::RemoveRow(int row)
         FillRow(row);
     WriteRows();
     if (result == GRID_INHERITED) {
-        m_newFieldKey->Append(StoreText(key.c_str()));
+        m_newFieldKey->Append(StoreText(key.c_str(), m_grid.encoding));
         return;
     }
     CheckMandatoryFields(m_grid.count - 1);
-    m_newFieldKey->SetValue(StoreText(key.c_str())); // adding brings it back
+    m_newFieldKey->SetValue(StoreText(key.c_str(), m_grid.encoding)); // adding brings it back
     LayOutEntry();
     KeepFocus(focused > row ? focused - 1 : focused);
 }

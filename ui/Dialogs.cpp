@@ -11,6 +11,7 @@
 
 #include "store/BibStore.h"
 #include "ui/DisplayText.h"
+#include "ui/Keys.h"
 
 enum { LONG_WORD = 1000 }; // characters
 
@@ -82,7 +83,7 @@ bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, lo
 }
 
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
-                       std::string key, wxWindow *field)
+                       const TypedKey &key, wxWindow *field)
 {
     wxTextEntry *entry = dynamic_cast<wxTextEntry *>(field);
     const bool accepted = Box_WarnOrCancel(parent, caption, text);
@@ -91,8 +92,9 @@ void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString
     entry->SetInsertionPoint(at); // the focus has selected all
     if (!accepted)
         return;
-    Bib_StripKeyChars(key.data());
-    entry->ChangeValue(StoreText(key.c_str()));
+    std::string stripped = key.text;
+    Bib_StripKeyChars(stripped.data());
+    entry->ChangeValue(StoreText(stripped.c_str(), key.encoding));
     entry->SetInsertionPointEnd();
 }
 

@@ -1,11 +1,10 @@
 // ui/Dialogs.h - what the program's windows and boxes have in common.
 #pragma once
 
-#include <string>
-
 #include <wx/sizer.h>
 #include <wx/string.h>
 
+struct TypedKey;
 class wxDialog;
 class wxTextCtrl;
 class wxWindow;
@@ -38,10 +37,10 @@ bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString 
 // True for Yes. `style` may be wxNO_DEFAULT.
 bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, long style = 0);
 
-// Offers to take the characters out of `key` (store text) that no key may hold; what is left goes
-// into `field`, which is a text entry and gets the focus.
+// Offers to take the characters out of `key` that no key may hold; what is left goes into `field`,
+// which is a text entry and gets the focus.
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
-                       std::string key, wxWindow *field);
+                       const TypedKey &key, wxWindow *field);
 
 // --- Texts in controls ---
 

@@ -4,14 +4,20 @@
 #include <wx/dcclient.h>
 #include <wx/strconv.h>
 
+#include "encoding/Encoding.h"
 #include "store/BibStore.h"
 #include "ui/Values.h"
 
 enum { LONGEST_TEXT = 1000 }; // characters
 
-wxString StoreText(const char *text)
+wxString StoreText(const char *text, const EncodingRecord *encoding)
 {
-    return wxString(Value_Show(text));
+    return wxString(Value_Show(text, encoding));
+}
+
+wxString OwnText(const char *text)
+{
+    return StoreText(text, Enc_OfText(text));
 }
 
 wxString PathText(const char *text)

@@ -7,9 +7,11 @@
 
 class wxWindow;
 struct BibFile;
+struct EncodingRecord;
 
-wxString StoreText(const char *text); // contents of BIB files, in the selected code page
-wxString PathText(const char *text);  // names of files, and messages that hold them
+wxString StoreText(const char *text, const EncodingRecord *encoding); // contents of a BIB file
+wxString OwnText(const char *text);  // of the INI file, and names that the open files share
+wxString PathText(const char *text); // names of files, and messages that hold them
 std::wstring PathTextWide(const char *text);
 
 // `text`, its middle left out where it is wider than `width` (device-independent pixels) in the

@@ -6,6 +6,7 @@
 #include <wx/textctrl.h>
 
 #include "app/Companion.h"
+#include "encoding/Encoding.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/Keys.h"
@@ -52,9 +53,10 @@ int EntryDialog::CurrentChoice() const
     return wxNOT_FOUND;
 }
 
-TypedKey EntryDialog::Key() const
+TypedKey EntryDialog::Key(const BibFile *file) const
 {
-    return Key_Read(m_key->GetValue().ToStdWstring().c_str());
+    return Key_Read(m_key->GetValue().ToStdWstring().c_str(),
+                    file ? Enc_OfFile(file) : Enc_Current());
 }
 
 void EntryDialog::Refuse(const wxString &text)
@@ -68,7 +70,7 @@ bool EntryDialog::AcceptDuplicate()
     return Box_Ask(this, m_texts.caption, m_texts.takenElsewhere);
 }
 
-bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)
+bool EntryDialog::Accept(KeyVerdict verdict, const TypedKey &key)
 {
     switch (verdict) {
     case KEY_OK:
@@ -84,7 +86,7 @@ bool EntryDialog::Accept(KeyVerdict verdict, const std::string &key)
                           key, m_key);
         return false;
     case KEY_MISFIT:
-        Refuse(StoreText(Key_MisfitText().c_str()));
+        Refuse(Key_MisfitText(key));
         return false;
     case KEY_UNWRITABLE:
         Refuse("An entry with this key can't be written to a BIB file.");
@@ -130,7 +132,8 @@ Cartulo_NewEntry::Cartulo_NewEntry(wxWindow *parent, const EntryPlace &current,
     const BibFile *file = current.file >= 0 ? current.set->files[current.file] : nullptr;
     m_child->Enable(Entry_MayBeParent(file, current.entry));
     if (m_child->IsEnabled())
-        m_child->SetToolTip("The new entry refers to `" + StoreText(current.entry->key) + "'.");
+        m_child->SetToolTip("The new entry refers to `" +
+                            StoreText(current.entry->key, Enc_OfFile(file)) + "'.");
     Dialog_AddRow(m_rows, this, "Create 'crossref':", m_child);
     Dialog_Finish(this, m_rows, m_key);
 }
@@ -158,29 +161,32 @@ int Cartulo_NewEntry::TargetFile() const
 
 void Cartulo_NewEntry::OnOK(wxCommandEvent &event)
 {
-    TypedKey key = Key();
     int file = TargetFile();
     const BibFile *target = file >= 0 ? m_current.set->files[file] : nullptr;
+    TypedKey key = Key(target);
     KeyVerdict verdict = Entry_CheckNewKey(m_current.set, target, key);
-    if (Accept(verdict, key.text) && Create(file, key.text))
+    if (Accept(verdict, key) && Create(file, key.text))
         event.Skip(); // closes
 }
 
 bool Cartulo_NewEntry::Create(int file, const std::string &key)
 {
+    BibFile *target = m_current.set->files[file];
     int index = TypeChoice_Type(m_type);
-    const char *type = index < 0 ? "" : BibTypeTable[index];
+    const char *chosen = index < 0 ? "" : BibTypeTable[index];
     const bool child = m_child->GetValue();
     char section[SCHEMA_SECTION_SIZE];
-    Schema_FieldSpecs(m_ini.c_str(), type, section, sizeof section);
-    const char *specs = child ? Entry_ChildSpecs : section;
+    Schema_FieldSpecs(m_ini.c_str(), chosen, section, sizeof section);
+    std::string recoded = Entry_SpecsFor(target, section);
+    const char *specs = child ? Entry_ChildSpecs : recoded.c_str();
+    const char *type = index < 0 ? "" : BibTypeTable[Entry_TypeFor(target, index)];
     std::string reason = Entry_CheckType(type, specs);
     if (!reason.empty()) {
-        Refuse(StoreText(reason.c_str()));
+        Refuse(OwnText(reason.c_str()));
         return false;
     }
-    BibEntry *entry = Entry_Create(m_current.set->files[file], key.c_str(), type, specs,
-                                   child ? m_current.entry : nullptr);
+    BibEntry *entry =
+        Entry_Create(target, key.c_str(), type, specs, child ? m_current.entry : nullptr);
     if (!entry) {
         Refuse("There is not enough memory for a new entry.");
         return false;
@@ -207,7 +213,8 @@ Cartulo_RenameEntry::Cartulo_RenameEntry(wxWindow *parent, const EntryPlace &cur
     m_file->Disable();
     m_type->Disable();
     if (current.entry)
-        m_key->ChangeValue(StoreText(current.entry->key));
+        m_key->ChangeValue(
+            StoreText(current.entry->key, Enc_OfFile(current.set->files[current.file])));
     Dialog_Finish(this, m_rows, m_key);
 }
 
@@ -224,10 +231,10 @@ void Cartulo_RenameEntry::OnOK(wxCommandEvent &event)
         event.Skip();
         return;
     }
-    TypedKey key = Key();
     BibFile *file = m_current.set->files[m_current.file];
+    TypedKey key = Key(file);
     KeyVerdict verdict = Entry_CheckRename(m_current.set, file, m_current.entry, key);
-    if (Accept(verdict, key.text)) {
+    if (Accept(verdict, key)) {
         Entry_Rename(file, m_current.entry, key.text.c_str());
         SetChanged(m_current.entry, m_current.file);
     } else if (verdict != KEY_EMPTY) {

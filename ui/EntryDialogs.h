@@ -42,10 +42,10 @@ protected:
     EntryDialog(wxWindow *parent, const EntryPlace &current, const Texts &texts);
 
     int CurrentChoice() const;
-    TypedKey Key() const;
+    TypedKey Key(const BibFile *file) const; // as text of the file; null for none
 
     // False when it can't be the key; the user knows why then, or has one without bad characters.
-    bool Accept(KeyVerdict verdict, const std::string &key);
+    bool Accept(KeyVerdict verdict, const TypedKey &key);
     void Refuse(const wxString &text);
     void SetChanged(BibEntry *entry, int file);
 

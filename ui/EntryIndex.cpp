@@ -1,12 +1,14 @@
 // ui/EntryIndex.cpp - the rows of the entry list and the search while typing.
 #include "ui/EntryIndex.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
-#include <cstring>
+#include <cwchar>
 
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
+#include "ui/SearchText.h"
 
 // --- Rows ---
 
@@ -35,11 +37,6 @@ static int CompareItems(const void *a, const void *b)
                                   static_cast<const IndexItem *>(b)->entry->key);
 }
 
-static bool Passes(const BibEntry *entry, const char *filter)
-{
-    return filter == nullptr || *filter == 0 || Bib_EntryContains(entry, filter);
-}
-
 int EntryIndex_Build(IndexItem **index, BibFile *const *files, int fileCount, const char *filter)
 {
     size_t room = CountEntries(files, fileCount);
@@ -47,10 +44,12 @@ int EntryIndex_Build(IndexItem **index, BibFile *const *files, int fileCount, co
     if (*index == nullptr)
         return 0;
     int count = 0;
-    for (int i = 0; i < fileCount; ++i)
+    for (int i = 0; i < fileCount; ++i) {
+        SearchText search = Search_For(filter, files[i]);
         for (BibEntry *entry = files[i]->entries; entry != nullptr; entry = entry->next)
-            if (Passes(entry, filter))
+            if (Search_Finds(&search, entry))
                 (*index)[count++] = {entry, i};
+    }
     qsort(*index, count, sizeof(IndexItem), CompareItems);
     return count;
 }
@@ -134,26 +133,31 @@ static bool Continues(const TypeAhead *state, uint32_t key, bool modified, int32
            selection == state->lastFound;
 }
 
-// The character's byte in the selected code page; 0 when it has none.
-static char StoreByte(uint32_t key)
+static const EncodingRecord *EncodingOf(const IndexItem *item, BibFile *const *files, int fileCount)
 {
-    if (key < 0x80)
-        return static_cast<char>(key);
-    const wchar_t text[] = {static_cast<wchar_t>(key), 0};
-    char bytes[2];
-    Enc_FromUnicode(bytes, text);
-    // Byte 0xFF also stands for "not in the code page".
-    if (static_cast<unsigned char>(bytes[0]) == 0xFF && Enc_Current()->map[0xFF] != key)
-        return 0;
-    return bytes[0];
+    bool hasFile = files != nullptr && item->file >= 0 && item->file < fileCount;
+    return hasFile ? Enc_OfFile(files[item->file]) : Enc_Current();
 }
 
-static int FindByPrefix(const char *prefix, const IndexItem *index, int count,
+static bool Holds(const wchar_t *text, const EncodingRecord *encoding)
+{
+    return std::all_of(text, text + wcslen(text),
+                       [encoding](wchar_t c) { return Enc_Holds(c, encoding) != 0; });
+}
+
+static int FindByPrefix(const wchar_t *prefix, const IndexItem *index, int count,
                         BibFile *const *files, int fileCount)
 {
-    for (int row = 0; row < count; ++row)
-        if (RowBeginsWith(&index[row], files, fileCount, prefix))
+    const EncodingRecord *last = nullptr; // what `bytes` is in
+    std::string bytes;                    // "" when the encoding lacks a character
+    for (int row = 0; row < count; ++row) {
+        const EncodingRecord *encoding = EncodingOf(&index[row], files, fileCount);
+        if (encoding != last)
+            bytes = Holds(prefix, encoding) ? Enc_Encode(prefix, encoding) : "";
+        last = encoding;
+        if (!bytes.empty() && RowBeginsWith(&index[row], files, fileCount, bytes.c_str()))
             return row;
+    }
     return -1;
 }
 
@@ -165,15 +169,12 @@ TypeAheadVerdict TypeAhead_Key(TypeAhead *state, uint32_t key, bool modified, in
         StartOver(state);
     if (key == 0 || modified)
         return TYPE_AHEAD_SKIP;
-    if (strlen(state->prefix) >= TYPE_AHEAD_LIMIT)
+    if (wcslen(state->prefix) >= TYPE_AHEAD_LIMIT)
         StartOver(state);
     state->lastKeyTime = now;
 
-    char byte = StoreByte(key);
-    if (byte == 0)
-        return TYPE_AHEAD_NO_ROW;
-    size_t length = strlen(state->prefix);
-    state->prefix[length] = byte;
+    size_t length = wcslen(state->prefix);
+    state->prefix[length] = static_cast<wchar_t>(key);
     state->prefix[length + 1] = 0;
     int row = FindByPrefix(state->prefix, index, count, files, fileCount);
     if (row < 0) {

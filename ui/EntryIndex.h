@@ -14,9 +14,9 @@ struct IndexItem {
 };
 static_assert(sizeof(IndexItem) == 16);
 
-// The rows of all entries that pass `filter` ("" or null: all), sorted by key. Returns their count;
-// *index gets a malloc'd array with room for every entry, never null unless memory is out. The
-// filter looks at field values, not at keys. Rows with equal keys come in no particular order.
+// The rows of all entries that pass `filter` (see SearchText.h), sorted by key. Returns their
+// count; *index gets a malloc'd array with room for every entry, never null unless memory is out.
+// The filter looks at field values, not at keys. Rows with equal keys come in no particular order.
 int EntryIndex_Build(IndexItem **index, BibFile *const *files, int fileCount, const char *filter);
 
 // The order of two keys: case ignored, one leading backslash or opening brace skipped.
@@ -29,7 +29,7 @@ int EntryIndex_Find(const IndexItem *index, int count, const BibEntry *entry);
 // -1 when there are no rows.
 int EntryIndex_RowToSelect(const IndexItem *index, int count, const BibEntry *select);
 
-// "key (file)" as store text. "key (number)" when `files` is null or has no such file.
+// "key (file)", the key as store text. "key (number)" when `files` is null or has no such file.
 std::string EntryIndex_RowText(const IndexItem *item, BibFile *const *files, int fileCount);
 
 enum { TYPE_AHEAD_PAUSE = 1000, TYPE_AHEAD_LIMIT = 30 }; // milliseconds; characters
@@ -37,8 +37,8 @@ enum { TYPE_AHEAD_PAUSE = 1000, TYPE_AHEAD_LIMIT = 30 }; // milliseconds; charac
 // What was typed so far to find a key.
 struct TypeAhead {
     int32_t lastKeyTime = 0;
-    int lastFound = -1;   // row selected by the last letter that matched
-    char prefix[32] = ""; // store text
+    int lastFound = -1; // row selected by the last letter that matched
+    wchar_t prefix[TYPE_AHEAD_LIMIT + 2] = L"";
 };
 
 enum TypeAheadVerdict {
@@ -50,9 +50,9 @@ enum TypeAheadVerdict {
 // One key of the keyboard. `key` is its Unicode character (0 for none), `now` its time in
 // milliseconds, which may wrap around, `selection` the row that is selected now.
 //
-// Row texts are compared as store text, so the character counts as its byte in the selected code
-// page. One that the code page lacks matches nothing. The whole row text is searched: unlike the
-// order of the rows, the search does not skip a leading backslash or brace.
+// Row texts are compared as store text, each in the encoding of its file. A character that this
+// lacks matches nothing. The case of the ASCII letters is ignored. The whole row text is searched:
+// unlike the order of the rows, the search does not skip a leading backslash or brace.
 TypeAheadVerdict TypeAhead_Key(TypeAhead *state, uint32_t key, bool modified, int32_t now,
                                int selection, const IndexItem *index, int count,
                                BibFile *const *files, int fileCount);

@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "app/Log.h"
+#include "encoding/Encoding.h"
 #include "store/Ascii.h"
 
 // --- Fields ---
@@ -76,12 +77,20 @@ static KeyVerdict CheckForm(const TypedKey &key)
     return Bib_IsKey(key.text.c_str()) ? KEY_OK : KEY_UNWRITABLE;
 }
 
+// `key` is text of `file`.
+static bool HasKeyOf(const BibFile *other, const char *key, const BibFile *file)
+{
+    const EncodingRecord *from = Enc_OfFile(file), *to = Enc_OfFile(other);
+    std::string recoded = Enc_Recode(key, from, to);
+    return HasKey(other, recoded.c_str()) && Enc_Recode(recoded.c_str(), to, from) == key;
+}
+
 static KeyVerdict CheckFree(const BibFileSet *set, const BibFile *file, const char *key)
 {
     if (HasKey(file, key))
         return KEY_TAKEN;
     for (int i = 0; i < set->count; ++i)
-        if (set->files[i] != file && HasKey(set->files[i], key))
+        if (set->files[i] != file && HasKeyOf(set->files[i], key, file))
             return KEY_TAKEN_ELSEWHERE;
     return KEY_OK;
 }
@@ -106,9 +115,30 @@ KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const B
     return form == KEY_OK ? CheckFree(set, file, key.text.c_str()) : form;
 }
 
+// --- Types ---
+
+static std::string RecodeName(const char *name, const BibFile *file)
+{
+    return Enc_Recode(name, Enc_OfText(name), Enc_OfFile(file));
+}
+
+int Entry_TypeFor(const BibFile *file, int type)
+{
+    std::string name = RecodeName(BibTypeTable[type], file);
+    return Bib_HasTypeRoom(name.c_str()) ? Bib_TypeIndex(name.c_str()) : type;
+}
+
 // --- New entries ---
 
 const char Entry_ChildSpecs[] = "crossref=*\0";
+
+std::string Entry_SpecsFor(const BibFile *file, const char *specs)
+{
+    std::string recoded;
+    for (const char *item = specs; *item; item += strlen(item) + 1)
+        recoded += RecodeName(item, file) + '\0';
+    return recoded + '\0';
+}
 
 static std::vector<std::string> MandatoryFields(const char *specs)
 {

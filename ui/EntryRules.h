@@ -40,7 +40,15 @@ KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const
 KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const BibEntry *entry,
                              const TypedKey &key);
 
+// --- Types ---
+
+// The type of this name in the encoding of the file; the same one when the table of types is full.
+int Entry_TypeFor(const BibFile *file, int type);
+
 // --- New entries ---
+
+// The lines of a type's section (Schema_FieldSpecs) in the encoding of the file.
+std::string Entry_SpecsFor(const BibFile *file, const char *specs);
 
 // The fields of an entry that refers to another one, as Bib_NewEntry wants them.
 extern const char Entry_ChildSpecs[];

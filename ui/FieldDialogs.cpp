@@ -81,10 +81,10 @@ bool Cartulo_RenameField::Accept(const TypedKey &name)
     case NAME_EMPTY:
         return true;
     case NAME_BAD_CHARS:
-        Box_OfferStripped(this, GetTitle(), FieldKey_BadCharsText, name.text, m_name);
+        Box_OfferStripped(this, GetTitle(), FieldKey_BadCharsText, name, m_name);
         return false;
     case NAME_MISFIT:
-        Box_Warn(this, GetTitle(), StoreText(Key_MisfitText().c_str()));
+        Box_Warn(this, GetTitle(), Key_MisfitText(name));
         return false;
     case NAME_UNWRITABLE:
         Box_Warn(this, GetTitle(), FieldKey_UnwritableText);
@@ -97,7 +97,7 @@ bool Cartulo_RenameField::Accept(const TypedKey &name)
 
 void Cartulo_RenameField::OnOK(wxCommandEvent &event)
 {
-    TypedKey name = Key_Read(m_name->GetValue().ToStdWstring().c_str());
+    TypedKey name = Key_Read(m_name->GetValue().ToStdWstring().c_str(), m_grid->encoding);
     if (!Accept(name))
         return;
     m_newName = name.text;

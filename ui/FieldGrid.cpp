@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 
 #include "encoding/Encoding.h"
@@ -47,27 +48,27 @@ const BibEntry *Grid_FindParent(const BibEntry *entry)
     return parent;
 }
 
-static void FillRow(GridRow *row, const char *key, const char *value)
+static void FillRow(const FieldGrid *grid, GridRow *row, const char *key, const char *value)
 {
     *row = {};
     row->key = key;
     row->stored = value;
-    row->filled = row->text = Value_Show(value);
+    row->filled = row->text = Value_Show(value, grid->encoding);
     row->field = GRID_NO_FIELD;
 }
 
-static void FillOwnRow(GridRow *row, const BibEntry *entry, int index)
+static void FillOwnRow(const FieldGrid *grid, GridRow *row, int index)
 {
-    const BibField *field = &entry->fields[index];
-    FillRow(row, NameOf(field), field->value);
+    const BibField *field = &grid->entry->fields[index];
+    FillRow(grid, row, NameOf(field), field->value);
     row->crossref = SameName(NameOf(field), "crossref");
     row->field = index;
     row->companion = field->companion;
 }
 
-static void FillInheritedRow(GridRow *row, const BibField *field)
+static void FillInheritedRow(const FieldGrid *grid, GridRow *row, const BibField *field)
 {
-    FillRow(row, NameOf(field), field->value);
+    FillRow(grid, row, NameOf(field), field->value);
     row->inherited = true;
 }
 
@@ -76,18 +77,19 @@ static void FillInheritedRows(FieldGrid *grid)
     for (int i = 0; i < grid->parent->fieldCount && grid->count < GRID_ROWS; ++i) {
         const BibField *field = &grid->parent->fields[i];
         if (!FindField(grid->entry, NameOf(field)))
-            FillInheritedRow(&grid->rows[grid->count++], field);
+            FillInheritedRow(grid, &grid->rows[grid->count++], field);
     }
 }
 
-void Grid_Fill(FieldGrid *grid, const BibEntry *entry)
+void Grid_Fill(FieldGrid *grid, const BibEntry *entry, const EncodingRecord *encoding)
 {
     Grid_Clear(grid);
+    grid->encoding = encoding;
     grid->entry = entry;
     grid->parent = Grid_FindParent(entry);
     grid->count = CountShown(entry);
     for (int i = 0; i < grid->count; ++i)
-        FillOwnRow(&grid->rows[i], entry, i);
+        FillOwnRow(grid, &grid->rows[i], i);
     if (grid->parent)
         FillInheritedRows(grid);
 }
@@ -172,7 +174,7 @@ GridAdd Grid_Add(FieldGrid *grid, const char *key, int *row)
     if (grid->count == GRID_ROWS)
         return GRID_FULL;
     *row = grid->count++;
-    FillRow(&grid->rows[*row], key, "");
+    FillRow(grid, &grid->rows[*row], key, "");
     return GRID_ADDED;
 }
 
@@ -184,7 +186,7 @@ GridRemove Grid_Remove(FieldGrid *grid, int row)
     const BibField *inherited = grid->parent ? FindField(grid->parent, key.c_str()) : nullptr;
     grid->rows[row].key.clear();
     if (inherited && FindRow(grid, key.c_str()) < 0) {
-        FillInheritedRow(&grid->rows[row], inherited);
+        FillInheritedRow(grid, &grid->rows[row], inherited);
         return GRID_INHERITED;
     }
     std::move(grid->rows + row + 1, grid->rows + grid->count, grid->rows + row);
@@ -200,8 +202,7 @@ static bool SameLetter(wchar_t a, wchar_t b)
 
 bool Grid_MayRename(const FieldGrid *grid, const char *name)
 {
-    std::wstring shown;
-    Enc_ToUnicode(shown, name);
+    std::wstring shown = Enc_Decode(name, grid->encoding);
     for (int i = 0; i < grid->count; ++i) {
         const std::wstring &text = grid->rows[i].text;
         if (std::equal(text.begin(), text.end(), shown.begin(), shown.end(), SameLetter))
@@ -222,18 +223,24 @@ static bool IsChanged(const GridRow *row)
     return !row->inherited && !row->locked && row->text != row->filled;
 }
 
-static std::string ValueOf(const GridRow *row)
+static std::string ValueOf(const FieldGrid *grid, const GridRow *row)
 {
-    return IsChanged(row) ? Value_Read(row->text) : row->stored;
+    return IsChanged(row) ? Value_Read(row->text, grid->encoding) : row->stored;
 }
 
 // A heap copy of that; null when memory is out.
-static char *CopyValue(const GridRow *row)
+static char *CopyValue(const FieldGrid *grid, const GridRow *row)
 {
     if (!IsChanged(row))
         return Bib_CopyText(row->stored.data(), row->stored.size());
-    char *buffer = static_cast<char *>(Bib_Alloc(row->text.size() + 1));
-    return buffer ? Enc_FromUnicode(buffer, row->text.c_str()) : nullptr;
+    char *buffer = static_cast<char *>(Bib_Alloc(row->text.size() * ENC_LONGEST + 1));
+    if (!buffer)
+        return nullptr;
+    Enc_EncodeTo(buffer, row->text.c_str(), grid->encoding);
+    Enc_LogConversion(row->text.c_str(), buffer);
+    char *value = Bib_CopyText(buffer, strlen(buffer));
+    free(buffer);
+    return value;
 }
 
 static int CountOwnRows(const FieldGrid *grid)
@@ -301,7 +308,7 @@ GridChanges Grid_Compare(const FieldGrid *grid, int type)
         int field = match.fields[i];
         if (field == GRID_NO_FIELD)
             ++changes.added;
-        else if (ValueOf(&grid->rows[i]) != grid->entry->fields[field].value)
+        else if (ValueOf(grid, &grid->rows[i]) != grid->entry->fields[field].value)
             ++changes.modified;
     }
     changes.removed = CountShown(grid->entry) - CountOwnRows(grid) + changes.added;
@@ -334,37 +341,38 @@ std::string Grid_Question(const GridChanges *changes)
 
 // --- Losses ---
 
-static bool HoldsGuillemets(const BibEntry *entry)
+static bool HoldsGuillemets(const BibEntry *entry, const EncodingRecord *encoding)
 {
-    return std::any_of(entry->fields, entry->fields + entry->fieldCount,
-                       [](const BibField &field) { return Value_HoldsGuillemets(field.value); });
+    return std::any_of(
+        entry->fields, entry->fields + entry->fieldCount,
+        [encoding](const BibField &field) { return Value_HoldsGuillemets(field.value, encoding); });
 }
 
-static std::wstring RowLosses(const GridRow *row, bool textGuillemets)
+static std::wstring RowLosses(const FieldGrid *grid, const GridRow *row, bool textGuillemets)
 {
-    std::wstring key;
-    Enc_ToUnicode(key, row->key.c_str());
-    return Value_Losses(key, row->text, row->stored, textGuillemets);
+    return Value_Losses(Enc_Decode(row->key.c_str(), grid->encoding), row->text, row->stored,
+                        textGuillemets, grid->encoding);
 }
 
 std::wstring Grid_Losses(const FieldGrid *grid)
 {
-    bool textGuillemets =
-        HoldsGuillemets(grid->entry) || (grid->parent && HoldsGuillemets(grid->parent));
+    bool textGuillemets = HoldsGuillemets(grid->entry, grid->encoding) ||
+                          (grid->parent && HoldsGuillemets(grid->parent, grid->encoding));
     std::wstring text;
     for (int i = 0; i < grid->count; ++i)
         if (IsChanged(&grid->rows[i]))
-            text += RowLosses(&grid->rows[i], textGuillemets);
+            text += RowLosses(grid, &grid->rows[i], textGuillemets);
     return text.empty() ? text : text + Value_LossesQuestion;
 }
 
 // --- Checking ---
 
-const char *Grid_CheckRow(const GridRow *row)
+const char *Grid_CheckRow(const FieldGrid *grid, int index)
 {
+    const GridRow *row = &grid->rows[index];
     if (row->inherited)
         return nullptr;
-    std::string value = ValueOf(row);
+    std::string value = ValueOf(grid, row);
     return IsChanged(row) ? Value_Check(value.c_str()) : Bib_CheckValue(value.c_str());
 }
 
@@ -395,7 +403,7 @@ static int BuildFields(BibField *field, const FieldGrid *grid)
         const GridRow *row = &grid->rows[i];
         if (row->inherited)
             continue;
-        *field = {Bib_FieldIndex(row->key.c_str()), row->companion, CopyValue(row)};
+        *field = {Bib_FieldIndex(row->key.c_str()), row->companion, CopyValue(grid, row)};
         complete &= field++->value != nullptr;
     }
     for (int i = CountShown(grid->entry); i < grid->entry->fieldCount; ++i) {

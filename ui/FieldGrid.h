@@ -3,7 +3,7 @@
 //
 // A row belongs to the entry, unless it is inherited: shown, for reading only, from the parent,
 // which `crossref` names. A row that the user did not change, or that is locked, keeps its stored
-// bytes, even those that the code page cannot show.
+// bytes, even those that its encoding cannot show.
 //
 // The grid reads `entry` and `parent` as long as it shows them: clear or fill it before they go.
 #pragma once
@@ -12,6 +12,8 @@
 #include <vector>
 
 #include "store/BibStore.h"
+
+struct EncodingRecord;
 
 enum { GRID_ROWS = 16, GRID_NO_FIELD = -1 };
 
@@ -30,8 +32,9 @@ struct GridRow {
 
 struct FieldGrid {
     GridRow rows[GRID_ROWS];
-    int count;              // rows that are shown
-    const BibEntry *entry;  // whose fields these are; belongs to its file; null for none
+    int count;                      // rows that are shown
+    const EncodingRecord *encoding; // of the file
+    const BibEntry *entry;          // whose fields these are; belongs to its file; null for none
     const BibEntry *parent; // the entry that it inherits from; of the same file; null for none
 };
 
@@ -41,9 +44,9 @@ struct FieldGrid {
 // ignoring case; null for none.
 const BibEntry *Grid_FindParent(const BibEntry *entry);
 
-// One row per field, then the inherited ones. `filled` and `text` are the values as the code page
-// shows them; the window puts into both what its control really holds.
-void Grid_Fill(FieldGrid *grid, const BibEntry *entry);
+// One row per field, then the inherited ones. `filled` and `text` are the values as the file's
+// encoding shows them; the window puts into both what its control really holds.
+void Grid_Fill(FieldGrid *grid, const BibEntry *entry, const EncodingRecord *encoding);
 void Grid_Clear(FieldGrid *grid);
 
 // How many of the entry's stored fields have a row when it is filled.
@@ -97,7 +100,7 @@ std::string Grid_Question(const GridChanges *changes); // "There are changes in 
 
 // The question before a commit that would lose something; "" when it would not. It names each
 // changed row with
-// - characters that the code page would not bring back;
+// - characters that the encoding would not bring back;
 // - guillemets, when some stored value of the entry or its parent has some that are text: those
 //   would become the marks of abbreviations, and which of them the user typed cannot be told.
 //   Without any there, guillemets are what the user types for an abbreviation.
@@ -105,7 +108,7 @@ std::wstring Grid_Losses(const FieldGrid *grid);
 
 // Why a row's value cannot be written as BibTeX, or not be read back (static text); null when all
 // is well. Also null for an inherited row.
-const char *Grid_CheckRow(const GridRow *row);
+const char *Grid_CheckRow(const FieldGrid *grid, int row);
 
 // True when the table of field names has room for the keys of all rows.
 bool Grid_HasRoom(const FieldGrid *grid);

@@ -2,30 +2,31 @@
 
 #include <algorithm>
 #include <cwchar>
-#include <vector>
 
 #include "encoding/Encoding.h"
 #include "store/BibStore.h"
+#include "ui/Values.h"
 
-static bool Fits(wchar_t c)
+static bool Fits(wchar_t c, const EncodingRecord *encoding)
 {
     bool isMark = c == L'\xAB' || c == L'\xBB';
-    return c <= 32 || (Enc_Holds(c) && !isMark);
+    return c <= 32 || (Enc_Holds(c, encoding) && !isMark);
 }
 
-TypedKey Key_Read(const wchar_t *typed)
+TypedKey Key_Read(const wchar_t *typed, const EncodingRecord *encoding)
 {
-    std::vector<char> narrow(wcslen(typed) + 1);
-    std::string text = Enc_FromUnicode(narrow.data(), typed);
+    std::string text = Value_Read(typed, encoding);
     text.erase(std::remove_if(text.begin(), text.end(), [](unsigned char c) { return c <= 32; }),
                text.end());
-    return {text, std::all_of(typed, typed + wcslen(typed), Fits)};
+    bool fits = std::all_of(typed, typed + wcslen(typed),
+                            [encoding](wchar_t c) { return Fits(c, encoding); });
+    return {text, fits, encoding};
 }
 
-std::string Key_MisfitText()
+std::string Key_MisfitText(const TypedKey &key)
 {
     return std::string("The key includes characters that can't be stored in ") +
-           Enc_Current()->name + ".";
+           Enc_Label(key.encoding) + ".";
 }
 
 NameVerdict Name_Check(const TypedKey &name)

@@ -3,14 +3,17 @@
 
 #include <string>
 
+struct EncodingRecord;
+
 struct TypedKey {
     std::string text; // store text, without characters of code 32 and below
     bool fits;        // false: `text` lacks guillemets, which mark abbreviations, or has other
-                      // characters for those that the code page lacks
+                      // characters for those that the encoding lacks
+    const EncodingRecord *encoding = nullptr; // of `text`
 };
-TypedKey Key_Read(const wchar_t *typed);
+TypedKey Key_Read(const wchar_t *typed, const EncodingRecord *encoding);
 
-std::string Key_MisfitText(); // what to say of a key that does not fit; store text
+std::string Key_MisfitText(const TypedKey &key); // what to say of a key that does not fit
 
 // --- Names of fields and abbreviations ---
 

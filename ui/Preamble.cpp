@@ -10,6 +10,7 @@
 
 #include "app/Companion.h"
 #include "app/Log.h"
+#include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
@@ -71,7 +72,7 @@ void Cartulo_Preamble::UpdatePreamble()
     const BibFile *file = set->files[CurrentPreamble];
     m_file->SetSelection(CurrentPreamble);
     m_file->SetToolTip(FileTip(file));
-    m_filled = StoreText(file->preamble);
+    m_filled = StoreText(file->preamble, Enc_OfFile(file));
     m_text->ChangeValue(m_filled);
     m_text->SetInsertionPoint(0);
     bool isWhole = m_text->GetValue() == m_filled;
@@ -86,6 +87,11 @@ void Cartulo_Preamble::ShowEditable(bool editable)
                                          : Theme_LockedColour());
 }
 
+const EncodingRecord *Cartulo_Preamble::Encoding() const
+{
+    return Enc_OfFile(m_panel->Files()->files[CurrentPreamble]);
+}
+
 // The file that is shown; null when its preamble can't be changed.
 BibFile *Cartulo_Preamble::WritableFile() const
 {
@@ -95,7 +101,7 @@ BibFile *Cartulo_Preamble::WritableFile() const
 
 PreambleEdit Cartulo_Preamble::ReadEdit(const BibFile *file) const
 {
-    return Preamble_Read(m_text->GetValue().ToStdWstring(), file->preamble);
+    return Preamble_Read(m_text->GetValue().ToStdWstring(), file->preamble, Enc_OfFile(file));
 }
 
 bool Cartulo_Preamble::IsChanged(const BibFile *file, const PreambleEdit &edit) const
@@ -108,8 +114,10 @@ bool Cartulo_Preamble::MayStore(const PreambleEdit &edit)
 {
     if (!Allow(Preamble_CheckSize(edit.text)))
         return false;
-    std::wstring losses = Value_Losses(L"PREAMBLE", edit.touched, edit.replaced,
-                                       Value_HoldsGuillemets(edit.replaced.c_str()));
+    const EncodingRecord *encoding = Encoding();
+    std::wstring losses =
+        Value_Losses(L"PREAMBLE", edit.touched, edit.replaced,
+                     Value_HoldsGuillemets(edit.replaced.c_str(), encoding), encoding);
     return losses.empty() ||
            Box_Ask(this, QuestionCaption, losses + Value_LossesQuestion, wxNO_DEFAULT);
 }
@@ -118,13 +126,13 @@ bool Cartulo_Preamble::MayStore(const PreambleEdit &edit)
 bool Cartulo_Preamble::Allow(const std::string &reason)
 {
     if (!reason.empty())
-        Box_Warn(this, GetTitle(), StoreText(reason.c_str()));
+        Box_Warn(this, GetTitle(), reason);
     return reason.empty();
 }
 
 void Cartulo_Preamble::Store(BibFile *file, const PreambleEdit &edit)
 {
-    Preamble_Store(file, edit.text);
+    Preamble_Store(file, edit);
     m_panel->SetModified(CurrentPreamble);
 }
 
@@ -177,7 +185,7 @@ void Cartulo_Preamble::OnPaste(wxClipboardTextEvent &event)
     wxString text;
     if (!m_text->IsEditable() || !ReadClipboard(&text))
         event.Skip();
-    else if (Allow(Preamble_CheckSize(Value_Read(text.ToStdWstring()))))
+    else if (Allow(Preamble_CheckSize(Value_Read(text.ToStdWstring(), Encoding()))))
         m_text->WriteText(text);
 }
 
@@ -193,7 +201,7 @@ bool Cartulo_Preamble::Refuse(const std::vector<PreambleFault> &faults)
 {
     for (const PreambleFault &fault : faults)
         Box_Warn(this, "Editing Preamble - Syntax Error",
-                 BoundedText(StoreText(fault.piece.c_str())) + "\n:" + fault.reason +
+                 BoundedText(StoreText(fault.piece.c_str(), Encoding())) + "\n:" + fault.reason +
                      "\n\nWrong preamble can;t be accepted.\nFix it and then try again.");
     if (!CopyText(m_text->GetValue())) {
         Box_Warn(this, GetTitle(),

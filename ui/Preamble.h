@@ -24,6 +24,7 @@ private:
     void FillFiles();
     void UpdatePreamble();
     void ShowEditable(bool editable);
+    const EncodingRecord *Encoding() const;
     BibFile *WritableFile() const;
     PreambleEdit ReadEdit(const BibFile *file) const;
     bool IsChanged(const BibFile *file, const PreambleEdit &edit) const;

@@ -74,13 +74,14 @@ struct OldPiece {
     std::string bytes;
     std::wstring shown;
     bool isKept;
+    int place; // index of the typed piece that it is, or became; -1 for none
 };
 
-static std::vector<OldPiece> OldPieces(const char *stored)
+static std::vector<OldPiece> OldPieces(const char *stored, const EncodingRecord *encoding)
 {
     std::vector<OldPiece> pieces;
     for (const std::string &bytes : SplitPieces(stored))
-        pieces.push_back({bytes, Value_Show(bytes.c_str()), false});
+        pieces.push_back({bytes, Value_Show(bytes.c_str(), encoding), false, -1});
     return pieces;
 }
 
@@ -91,6 +92,8 @@ static std::vector<OldPiece *> MatchPieces(const std::vector<std::wstring> &type
 {
     std::vector<OldPiece *> matches(typed.size());
     auto take = [&](size_t i, OldPiece *piece) {
+        if (!piece->isKept)
+            piece->place = static_cast<int>(i);
         piece->isKept = true;
         matches[i] = piece;
     };
@@ -109,22 +112,38 @@ static std::vector<OldPiece *> MatchPieces(const std::vector<std::wstring> &type
     return matches;
 }
 
-PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored)
+// A typed piece that is new, and stands where an old one is missing, is what became of that.
+static void PlaceEdited(std::vector<OldPiece> *old, const std::vector<OldPiece *> &matches)
+{
+    size_t next = 0;
+    for (OldPiece &piece : *old) {
+        if (piece.isKept)
+            next = static_cast<size_t>(piece.place) + 1;
+        else if (next < matches.size() && !matches[next])
+            piece.place = static_cast<int>(next++);
+    }
+}
+
+PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored,
+                           const EncodingRecord *encoding)
 {
     PreambleEdit edit;
-    std::vector<OldPiece> old = OldPieces(stored);
+    std::vector<OldPiece> old = OldPieces(stored, encoding);
     std::vector<std::wstring> pieces;
     if (typed.find_first_not_of(L"\r\n") != typed.npos)
         pieces = TypedPieces(typed);
     std::vector<OldPiece *> matches = MatchPieces(pieces, &old);
+    PlaceEdited(&old, matches);
     for (size_t i = 0; i < pieces.size(); ++i) {
         if (!matches[i])
             edit.touched += pieces[i] + L'\n';
-        edit.text += (matches[i] ? matches[i]->bytes : Value_Read(pieces[i])) + "\r\n";
+        edit.text += (matches[i] ? matches[i]->bytes : Value_Read(pieces[i], encoding)) + "\r\n";
     }
-    for (const OldPiece &piece : old)
+    for (const OldPiece &piece : old) {
+        edit.places.push_back(piece.place);
         if (!piece.isKept)
             edit.replaced += piece.bytes;
+    }
     return edit;
 }
 
@@ -159,7 +178,7 @@ std::string Preamble_CheckMarks(const std::string &text)
            "Else the file could not be read any more.\n\nFix it to continue.";
 }
 
-void Preamble_Store(BibFile *file, const std::string &text)
+void Preamble_Store(BibFile *file, const PreambleEdit &edit)
 {
-    memcpy(file->preamble, text.c_str(), text.size() + 1);
+    memcpy(file->preamble, edit.text.c_str(), edit.text.size() + 1);
 }

@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "encoding/Encoding.h"
 #include "store/BibFileSet.h"
 
 extern int CurrentPreamble; // index of the file that the window showed last
@@ -20,15 +21,17 @@ int Preamble_FindFile(const BibFileSet *set, const char *baseName);
 
 // What an edit makes of a preamble.
 struct PreambleEdit {
-    std::string text;     // as the store keeps it
-    std::wstring touched; // what was typed in pieces that are not what they were
-    std::string replaced; // the old pieces that are not there any more
+    std::string text;        // as the store keeps it
+    std::vector<int> places; // of each old piece, maybe changed: its index now; -1 for none
+    std::wstring touched;    // what was typed in pieces that are not what they were
+    std::string replaced;    // the old pieces that are not there any more
 };
 
 // `typed` is what the control holds that was filled with `stored`. The ends of pieces stay; a line
 // feed outside braces ends a piece, one inside is part of it. Pieces that were not touched, and
 // copies of them, keep their bytes.
-PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored);
+PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored,
+                           const EncodingRecord *encoding);
 
 // Why the text would make the file one that can't be read any more, for the user; "" when it would
 // not.
@@ -44,5 +47,5 @@ struct PreambleFault {
 };
 std::vector<PreambleFault> Preamble_Check(const std::string &text);
 
-// The text is of an allowed size.
-void Preamble_Store(BibFile *file, const std::string &text);
+// The text is of an allowed size, and was read from what the file has.
+void Preamble_Store(BibFile *file, const PreambleEdit &edit);

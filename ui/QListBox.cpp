@@ -5,10 +5,12 @@
 #include <wx/dc.h>
 #include <wx/frame.h>
 #include <wx/settings.h>
+#include <wx/statusbr.h>
 #include <wx/utils.h>
 
 #include "app/Companion.h"
 #include "app/FrameRules.h"
+#include "encoding/Encoding.h"
 #include "store/Sys.h"
 #include "ui/Cartulo.h"
 #include "ui/DisplayText.h"
@@ -77,9 +79,10 @@ wxString QListBox::GetItemText(size_t n) const
     if (!item)
         return "";
     if (!m_owner || item->file >= FileCount())
-        return StoreText(EntryIndex_RowText(item, nullptr, 0).c_str());
+        return OwnText(EntryIndex_RowText(item, nullptr, 0).c_str());
     // The two halves come in different encodings: a key from a file, a name from the system.
-    return StoreText(item->entry->key) + " (" + PathText(Files()[item->file]->baseName) + ")";
+    const BibFile *file = Files()[item->file];
+    return StoreText(item->entry->key, Enc_OfFile(file)) + " (" + PathText(file->baseName) + ")";
 }
 
 void QListBox::OnDrawItem(wxDC &dc, const wxRect &rect, size_t n) const
@@ -157,21 +160,27 @@ void QListBox::OnChar(wxKeyEvent &event)
         return;
     case TYPE_AHEAD_NO_ROW:
         wxBell();
-        ShowStatus(this, StoreText(m_typeAhead.prefix));
+        ShowStatus(this, m_typeAhead.prefix);
         return;
     case TYPE_AHEAD_ROW:
         SetSelection(m_typeAhead.lastFound);
-        ShowStatus(this, StoreText(m_typeAhead.prefix));
+        ShowStatus(this, m_typeAhead.prefix);
         SendSelectedEvent();
     }
 }
 
-void ShowStatus(wxWindow *window, const wxString &text, bool bell)
+static wxStatusBar *StatusBarOf(wxWindow *window)
 {
     wxFrame *frame = dynamic_cast<wxFrame *>(wxGetTopLevelParent(window));
-    if (!frame || !frame->GetStatusBar())
+    return frame ? frame->GetStatusBar() : nullptr;
+}
+
+void ShowStatus(wxWindow *window, const wxString &text, bool bell)
+{
+    wxStatusBar *bar = StatusBarOf(window);
+    if (!bar)
         return;
-    frame->SetStatusText(text, 0);
+    bar->SetStatusText(text, 0);
     if (bell)
         wxBell();
 }
@@ -179,4 +188,10 @@ void ShowStatus(wxWindow *window, const wxString &text, bool bell)
 void ShowStatusError(wxWindow *window, const wxString &text)
 {
     ShowStatus(window, text, true);
+}
+
+void ShowEncoding(wxWindow *window, const wxString &name)
+{
+    if (wxStatusBar *bar = StatusBarOf(window))
+        bar->SetStatusText(name, 1);
 }

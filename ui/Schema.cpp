@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "app/Log.h"
+#include "encoding/Encoding.h"
 #include "store/Ascii.h"
 #include "store/BibStore.h"
 #include "store/Profile.h"
@@ -52,6 +53,22 @@ std::string Schema_ApplicationName(const char *ini)
     char name[NAME_SIZE];
     Profile_GetString("Preamble", "AppName", "Cartulo", name, sizeof name, ini);
     return name;
+}
+
+int Schema_SelectEncoding(const char *ini, BibFileSet *set)
+{
+    char name[NAME_SIZE];
+    Profile_GetString("Preamble", "Encoding", "", name, sizeof name, ini);
+    if (!*name)
+        return 1;
+    Enc_Select(name);
+    if (Ascii_Compare(Enc_Current()->name, name) == 0)
+        return 1;
+    FileSet_AppendError(set,
+                        "ERROR: The file '%s' names the encoding '%s', which is not known; %s "
+                        "stays selected (CP65001 is UTF-8)\n",
+                        ini, name, Enc_Current()->name);
+    return 0;
 }
 
 void Schema_RegisterTypes(const char *ini)

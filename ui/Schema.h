@@ -19,6 +19,10 @@ std::string Schema_FindIni();
 
 std::string Schema_ApplicationName(const char *ini); // "Cartulo" unless the file has another
 
+// Selects the encoding that the file names, if it names one. Returns 0, with a line in the set's
+// load errors, for one that is not known.
+int Schema_SelectEncoding(const char *ini, BibFileSet *set);
+
 // Makes the entry types of the file known to the store. A type for which the store has no room is
 // left out, and logged.
 void Schema_RegisterTypes(const char *ini);

@@ -5,6 +5,7 @@
 #include <cstring>
 #include <iterator>
 
+#include "encoding/Encoding.h"
 #include "store/Ascii.h"
 #include "store/Profile.h"
 
@@ -58,38 +59,44 @@ static std::string Line(const std::string &key, const std::string &value)
     return key + " = " + value;
 }
 
-static std::vector<std::string> ListLines(const std::string &list, const char *ini)
+static std::vector<StringLine> ListLines(const std::string &list, const char *ini)
 {
     char section[SECTION_NAME_SIZE];
     Profile_GetString("String", list.c_str(), "", section, sizeof section, ini);
-    std::vector<std::string> lines = ReadSection(section, LIST_SIZE, ini);
-    for (std::string &line : lines) {
+    std::vector<StringLine> lines;
+    for (const std::string &line : ReadSection(section, LIST_SIZE, ini)) {
         size_t equals = line.find('=');
-        if (equals != line.npos)
-            line = Line(line.substr(0, equals), line.substr(equals + 1));
+        bool isPair = equals != line.npos;
+        lines.push_back({isPair ? Line(line.substr(0, equals), line.substr(equals + 1)) : line,
+                         Enc_OfText(line.c_str())});
     }
     return lines;
 }
 
-static void AppendLines(std::vector<std::string> *lines, const BibFile *file)
+static void AppendLines(std::vector<StringLine> *lines, const BibFile *file)
 {
     for (const BibString *string = file->strings; string; string = string->next)
-        lines->push_back(Line(string->name, string->value));
+        lines->push_back({Line(string->name, string->value), Enc_OfFile(file)});
 }
 
-std::vector<std::string> Strings_Lines(const StringSources *sources, int source)
+std::vector<StringLine> Strings_Lines(const StringSources *sources, int source)
 {
     if (source < STRINGS_OF_ALL_FILES)
         return ListLines(sources->lists[source + Strings_FirstFile(sources)], sources->ini.c_str());
-    std::vector<std::string> lines;
+    std::vector<StringLine> lines;
     for (int i = 0; i < sources->set->count; ++i)
         if (source == i || source == STRINGS_OF_ALL_FILES)
             AppendLines(&lines, sources->set->files[i]);
     return lines;
 }
 
-LineChange Strings_Compare(const std::vector<std::string> &before,
-                           const std::vector<std::string> &after)
+bool StringLine::operator==(const StringLine &other) const
+{
+    return text == other.text && encoding == other.encoding;
+}
+
+LineChange Strings_Compare(const std::vector<StringLine> &before,
+                           const std::vector<StringLine> &after)
 {
     auto start = std::mismatch(before.begin(), before.end(), after.begin(), after.end());
     auto end = std::mismatch(before.rbegin(), std::make_reverse_iterator(start.first),
@@ -99,9 +106,9 @@ LineChange Strings_Compare(const std::vector<std::string> &before,
             static_cast<size_t>(end.second.base() - start.second)};
 }
 
-std::string Strings_KeyOf(const std::string &line)
+std::string Strings_KeyOf(const StringLine &line)
 {
-    return line.substr(0, line.find(' '));
+    return line.text.substr(0, line.text.find(' '));
 }
 
 BibFile *Strings_WritableFile(const StringSources *sources, int source)

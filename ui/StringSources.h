@@ -4,13 +4,14 @@
 // of the INI file (-2 is the last list). So the lists, all files and each file stand in this order
 // in a choice, and a source becomes a position there when the position of the first file is added.
 //
-// Names and values are store text.
+// Names and values are store text, each in the encoding of its source.
 #pragma once
 
 #include <cstdint>
 #include <string>
 #include <vector>
 
+#include "encoding/Encoding.h"
 #include "store/BibFileSet.h"
 #include "ui/Keys.h"
 
@@ -38,17 +39,22 @@ int Strings_FirstFile(const StringSources *sources);
 int Strings_FitSource(const StringSources *sources, int source);
 
 // A line for each abbreviation, like "jan = January"; those of a file in the order of its list.
-std::vector<std::string> Strings_Lines(const StringSources *sources, int source);
+struct StringLine {
+    std::string text;
+    const EncodingRecord *encoding;
+    bool operator==(const StringLine &other) const;
+};
+std::vector<StringLine> Strings_Lines(const StringSources *sources, int source);
 
 // How lines came to be others: from `first` on, `removed` of the old ones made way for `added` new
 // ones.
 struct LineChange {
     size_t first, removed, added;
 };
-LineChange Strings_Compare(const std::vector<std::string> &before,
-                           const std::vector<std::string> &after);
+LineChange Strings_Compare(const std::vector<StringLine> &before,
+                           const std::vector<StringLine> &after);
 
-std::string Strings_KeyOf(const std::string &line); // its text up to the first blank
+std::string Strings_KeyOf(const StringLine &line); // its text up to the first blank
 
 // The file whose abbreviations may be changed now; null when the source is no file or read-only.
 BibFile *Strings_WritableFile(const StringSources *sources, int source);

@@ -11,6 +11,7 @@
 #include "app/Icons.h"
 #include "app/Log.h"
 #include "app/Native.h"
+#include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
@@ -105,7 +106,7 @@ void Cartulo_Strings::FillSources()
     const BibFileSet *set = m_sources.set;
     wxArrayString items;
     for (const std::string &list : m_sources.lists)
-        items.Add(ShortText(m_source, StoreText(list.c_str()), DIALOG_ITEM));
+        items.Add(ShortText(m_source, OwnText(list.c_str()), DIALOG_ITEM));
     items.Add("*All Files*");
     for (int i = 0; i < set->count; ++i)
         items.Add(ShortText(m_source, PathText(set->files[i]->baseName), DIALOG_ITEM));
@@ -132,12 +133,13 @@ void Cartulo_Strings::UpdateStrings()
 }
 
 // A list that is filled anew takes a second until it shows the right rows at the right place.
-void Cartulo_Strings::ShowLines(const std::vector<std::string> &lines)
+void Cartulo_Strings::ShowLines(const std::vector<StringLine> &lines)
 {
     LineChange change = Strings_Compare(m_lines, lines);
     wxArrayString items;
     for (size_t i = 0; i < change.added; ++i)
-        items.Add(BoundedText(StoreText(lines[change.first + i].c_str())));
+        items.Add(BoundedText(
+            StoreText(lines[change.first + i].text.c_str(), lines[change.first + i].encoding)));
     bool replacesAll = change.removed == m_lines.size();
     m_lines = lines;
     if (replacesAll) {
@@ -261,7 +263,8 @@ void Cartulo_Strings::OnOK(wxCommandEvent &event)
         return;
     AppLog("Cartulo_Strings::OnOK, Insert ");
     if (m_list->GetSelection() != wxNOT_FOUND) {
-        Insert(L"\xAB" + StoreText(SelectedKey().c_str()) + L"\xBB");
+        const EncodingRecord *encoding = m_lines[m_list->GetSelection()].encoding;
+        Insert(L"\xAB" + StoreText(SelectedKey().c_str(), encoding) + L"\xBB");
         return;
     }
     TNSMessage("WARNING: ", "Cartulo_Strings::OnOK has no selection.", TNS_WARNING);
@@ -320,7 +323,7 @@ Cartulo_Strings_Edit::Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxStr
                                            BibString *string)
     : wxDialog(strings, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
-      m_file(strings->WritableFile()), m_string(string)
+      m_file(strings->WritableFile()), m_encoding(Enc_OfFile(m_file)), m_string(string)
 {
     SetFont(wxFontInfo(10));
     m_key = new wxTextCtrl(this, ID_STRING_KEY);
@@ -339,9 +342,9 @@ Cartulo_Strings_Edit::Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxStr
 // A value that the control can't hold stays as it is.
 void Cartulo_Strings_Edit::Fill()
 {
-    m_key->ChangeValue(StoreText(m_string->name));
+    m_key->ChangeValue(StoreText(m_string->name, m_encoding));
     m_key->Disable();
-    wxString value = StoreText(m_string->value);
+    wxString value = StoreText(m_string->value, m_encoding);
     m_value->ChangeValue(value);
     m_filled = m_value->GetValue();
     if (m_filled == value)
@@ -357,7 +360,7 @@ void Cartulo_Strings_Edit::Refuse(const wxString &text, wxTextCtrl *at)
 }
 
 // False when the user has to see to the key first.
-bool Cartulo_Strings_Edit::AcceptKey(const std::string &key, NameVerdict verdict)
+bool Cartulo_Strings_Edit::AcceptKey(const TypedKey &key, NameVerdict verdict)
 {
     switch (verdict) {
     case NAME_OK:
@@ -366,7 +369,7 @@ bool Cartulo_Strings_Edit::AcceptKey(const std::string &key, NameVerdict verdict
         Refuse("Please enter key for new string.", m_key);
         return false;
     case NAME_MISFIT:
-        Refuse(StoreText(Key_MisfitText().c_str()), m_key);
+        Refuse(Key_MisfitText(key), m_key);
         return false;
     case NAME_BAD_CHARS:
         Box_OfferStripped(this, Caption,
@@ -403,7 +406,7 @@ bool Cartulo_Strings_Edit::AcceptLosses()
     const char *stored = m_string ? m_string->value : "";
     std::wstring losses =
         Value_Losses(m_key->GetValue().ToStdWstring(), m_value->GetValue().ToStdWstring(), stored,
-                     Value_HoldsGuillemets(stored));
+                     Value_HoldsGuillemets(stored, m_encoding), m_encoding);
     if (losses.empty() || Box_Ask(this, Caption, losses + Value_LossesQuestion, wxNO_DEFAULT))
         return true;
     Text_Focus(m_value);
@@ -418,10 +421,10 @@ bool Cartulo_Strings_Edit::RefuseForMemory() // false
 
 bool Cartulo_Strings_Edit::Add()
 {
-    TypedKey key = Key_Read(m_key->GetValue().ToStdWstring().c_str());
-    if (!AcceptKey(key.text, String_CheckNewKey(m_file, key)))
+    TypedKey key = Key_Read(m_key->GetValue().ToStdWstring().c_str(), m_encoding);
+    if (!AcceptKey(key, String_CheckNewKey(m_file, key)))
         return false;
-    std::string value = Value_Read(m_value->GetValue().ToStdWstring());
+    std::string value = Value_Read(m_value->GetValue().ToStdWstring(), m_encoding);
     if (!AcceptValue(value))
         return false;
     m_isChanged = String_Add(m_file, key.text.c_str(), value.c_str()) != 0;
@@ -430,7 +433,7 @@ bool Cartulo_Strings_Edit::Add()
 
 bool Cartulo_Strings_Edit::Edit()
 {
-    std::string value = Value_Read(m_value->GetValue().ToStdWstring());
+    std::string value = Value_Read(m_value->GetValue().ToStdWstring(), m_encoding);
     if (m_value->GetValue() == m_filled || value == m_string->value)
         return true;
     if (!AcceptValue(value))

@@ -28,7 +28,7 @@ private:
     wxSizer *CreateClosers();
     void FillSources();
     void UpdateStrings();
-    void ShowLines(const std::vector<std::string> &lines);
+    void ShowLines(const std::vector<StringLine> &lines);
     void Select(int row);
     std::string SelectedKey() const;
     BibString *SelectedString() const;
@@ -46,8 +46,8 @@ private:
     Cartulo *m_panel;
     wxTextCtrl *m_target;
     StringSources m_sources;
-    std::vector<std::string> m_lines; // of the list, as the store has them
-    wxChoice *m_source;               // child windows
+    std::vector<StringLine> m_lines; // of the list
+    wxChoice *m_source;              // child windows
     wxListBox *m_list;
     int32_t m_removeTime = 0; // of the last press of the key that deletes, until it is released
 
@@ -65,7 +65,7 @@ public:
 private:
     void Fill();
     void Refuse(const wxString &text, wxTextCtrl *at);
-    bool AcceptKey(const std::string &key, NameVerdict verdict);
+    bool AcceptKey(const TypedKey &key, NameVerdict verdict);
     bool AcceptValue(const std::string &value);
     bool AcceptLosses();
     bool RefuseForMemory();
@@ -73,9 +73,10 @@ private:
     bool Edit();
     void OnOK(wxCommandEvent &event);
 
-    BibFile *m_file;     // outlives the dialog, as m_string does
-    BibString *m_string; // null for a new one
-    wxTextCtrl *m_key;   // child windows
+    BibFile *m_file;                  // outlives the dialog, as m_string does
+    const EncodingRecord *m_encoding; // of the file
+    BibString *m_string;              // null for a new one
+    wxTextCtrl *m_key;                // child windows
     wxTextCtrl *m_value;
     wxString m_filled; // what the value's control made of the stored value
     bool m_isChanged = false;

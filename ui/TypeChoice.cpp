@@ -16,7 +16,7 @@ void TypeChoice_Fill(wxChoice *choice, int width)
     const size_t fits = size_t(choice->FromDIP(width) / choice->GetCharHeight());
     wxArrayString names;
     for (int i = known; i < BibTypeCount; ++i) {
-        wxString name = StoreText(BibTypeTable[i]);
+        wxString name = OwnText(BibTypeTable[i]);
         names.Add(name.length() <= fits ? name : ShortText(choice, name, width));
     }
     choice->Append(names);

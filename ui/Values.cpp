@@ -9,17 +9,16 @@
 
 const wchar_t Value_LossesQuestion[] = L"\nDo you want to accept these changes anyway ?";
 
-std::string Value_Read(const std::wstring &typed)
+std::string Value_Read(const std::wstring &typed, const EncodingRecord *encoding)
 {
-    std::string value(typed.size() + 1, 0);
-    value.resize(strlen(Enc_FromUnicode(value.data(), typed.c_str())));
+    std::string value = Enc_Encode(typed.c_str(), encoding);
+    Enc_LogConversion(typed.c_str(), value.c_str());
     return value;
 }
 
-std::wstring Value_Show(const char *value)
+std::wstring Value_Show(const char *value, const EncodingRecord *encoding)
 {
-    std::wstring shown;
-    Enc_ToUnicode(shown, value);
+    std::wstring shown = Enc_Decode(value, encoding);
     std::replace(shown.begin(), shown.end(), L'\0', L'\xFFFD');
     return shown;
 }
@@ -56,6 +55,11 @@ const char *Value_Check(const char *value)
 
 // --- Losses ---
 
+static bool IsMark(char c)
+{
+    return c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION;
+}
+
 static bool IsGuillemet(uint32_t c)
 {
     return c == 0xAB || c == 0xBB;
@@ -67,20 +71,20 @@ static bool HoldsGuillemets(const std::wstring &text)
                        [](wchar_t c) { return IsGuillemet(static_cast<uint32_t>(c)); });
 }
 
-// A mark is not in the code page, only shown as one.
-bool Value_HoldsGuillemets(const char *value)
+// A mark is not in the encoding, only shown as one.
+bool Value_HoldsGuillemets(const char *value, const EncodingRecord *encoding)
 {
-    const uint32_t *map = Enc_Current()->map;
-    return std::any_of(value, value + strlen(value),
-                       [map](char c) { return IsGuillemet(map[static_cast<unsigned char>(c)]); });
+    std::string text = value;
+    text.erase(std::remove_if(text.begin(), text.end(), IsMark), text.end());
+    return HoldsGuillemets(Enc_Decode(text.c_str(), encoding));
 }
 
 // The characters that would not come back, each once, in their order.
-static std::wstring LostCharacters(const std::wstring &text)
+static std::wstring LostCharacters(const std::wstring &text, const EncodingRecord *encoding)
 {
     std::wstring lost;
     for (wchar_t c : text)
-        if (!Enc_Holds(c) && lost.find(c) == lost.npos)
+        if (!Enc_Holds(c, encoding) && lost.find(c) == lost.npos)
             lost += c;
     return lost;
 }
@@ -106,20 +110,22 @@ static std::wstring ListCharacters(const std::wstring &characters)
 }
 
 // What the store makes of it.
-static std::wstring Stored(wchar_t c)
+static std::wstring Stored(wchar_t c, const EncodingRecord *encoding)
 {
-    const wchar_t character[] = {c, 0};
-    char byte[2];
-    std::wstring stored;
-    return Enc_ToUnicode(stored, Enc_FromUnicode(byte, character));
+    const wchar_t text[] = {c, 0};
+    return Enc_Decode(Enc_Encode(text, encoding).c_str(), encoding);
 }
 
 // The characters of the text that stand for other bytes of the stored value than they will become.
-// Guillemets are a case of their own.
-static std::wstring ReplacedCharacters(const std::wstring &text, const std::string &stored)
+// Guillemets are a case of their own: the only one in UTF-8.
+static std::wstring ReplacedCharacters(const std::wstring &text, const std::string &stored,
+                                       const EncodingRecord *encoding)
 {
-    std::wstring shown, replaced;
-    std::string back = Value_Read(Enc_ToUnicode(shown, stored.c_str()));
+    std::wstring replaced;
+    if (encoding == &EncodingUtf8)
+        return replaced;
+    std::wstring shown = Enc_Decode(stored.c_str(), encoding);
+    std::string back = Enc_Encode(shown.c_str(), encoding);
     for (size_t i = 0; i < stored.size() && i < back.size(); ++i) {
         wchar_t c = shown[i];
         if (back[i] != stored[i] && !IsGuillemet(static_cast<uint32_t>(c)) &&
@@ -130,17 +136,17 @@ static std::wstring ReplacedCharacters(const std::wstring &text, const std::stri
 }
 
 std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
-                          const std::string &stored, bool textGuillemets)
+                          const std::string &stored, bool textGuillemets,
+                          const EncodingRecord *encoding)
 {
-    std::wstring page, losses;
-    Enc_ToUnicode(page, Enc_Current()->name);
-    std::wstring lost = LostCharacters(text);
+    std::wstring label = Enc_Decode(Enc_Label(encoding), encoding), losses;
+    std::wstring lost = LostCharacters(text, encoding);
     if (!lost.empty())
-        losses += L"`" + name + L"': " + ListCharacters(lost) + L" can't be stored in " + page +
-                  L" and would become " + Stored(lost[0]) + L".\n";
-    std::wstring replaced = ReplacedCharacters(text, stored);
+        losses += L"`" + name + L"': " + ListCharacters(lost) + L" can't be stored in " + label +
+                  L" and would become " + Stored(lost[0], encoding) + L".\n";
+    std::wstring replaced = ReplacedCharacters(text, stored, encoding);
     if (!replaced.empty())
-        losses += L"`" + name + L"': " + page + L" shows bytes of the old value as " +
+        losses += L"`" + name + L"': " + label + L" shows bytes of the old value as " +
                   ListCharacters(replaced) + L", and they would become just that.\n";
     if (textGuillemets && HoldsGuillemets(text))
         losses += L"`" + name + L"': \xAB and \xBB will mark an abbreviation, not stand as text.\n";

@@ -1,0 +1,43 @@
+#include "ui/SearchText.h"
+
+#include <algorithm>
+
+#include "encoding/Encoding.h"
+
+static bool IsAscii(char32_t c)
+{
+    return c < 0x80;
+}
+
+SearchText Search_For(const char *text, const BibFile *file)
+{
+    SearchText search = {};
+    search.isEmpty = !text || !*text;
+    if (search.isEmpty)
+        return search;
+    const EncodingRecord *from = Enc_Current(), *to = Enc_OfFile(file);
+    search.bytes = Enc_Recode(text, from, to);
+    search.isForeign = Enc_Recode(search.bytes.c_str(), to, from) != text;
+    if (to != &EncodingUtf8)
+        return search;
+    std::u32string folded = Enc_FoldUtf8(search.bytes.c_str());
+    if (!std::all_of(folded.begin(), folded.end(), IsAscii))
+        search.folded = folded;
+    return search;
+}
+
+static bool Contains(const BibEntry *entry, const std::u32string &folded)
+{
+    return std::any_of(
+        entry->fields, entry->fields + entry->fieldCount,
+        [&folded](const BibField &field) { return Enc_Utf8Contains(field.value, folded) != 0; });
+}
+
+bool Search_Finds(const SearchText *search, const BibEntry *entry)
+{
+    if (search->isEmpty || search->isForeign)
+        return search->isEmpty;
+    if (!search->folded.empty())
+        return Contains(entry, search->folded);
+    return Bib_EntryContains(entry, search->bytes.c_str()) != 0;
+}
