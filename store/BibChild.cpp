@@ -5,20 +5,24 @@
 // called through the dynamic symbol table, so they must be exported from the executable. They
 // stand in this object because every user of the loader links it.
 
+#include <algorithm>
+#include <climits>
 #include <cstdarg>
 #include <cstdlib>
 #include <cstring>
+#include <vector>
 
 #include <btparse.h>
 
-#include "encoding/Encoding.h"
 #include "store/BibItem.h"
 #include "store/BibStore.h"
+#include "store/BibText.h"
 #include "store/Sys.h"
 
 extern "C" {
 // The lexer's state, exported by the library.
 extern int zzline;
+extern int zzendcol; // how many bytes of the text are read
 extern char *zzlextext;
 
 // The library's own, replaced below.
@@ -26,6 +30,8 @@ void report_error(bt_errclass errclass, char *filename, int line, char *item_des
                   char *fmt, va_list arglist);
 void zzerrstd(const char *text);
 char *strlwr(char *text);
+void zzmode(int mode);
+void comment();
 
 void dump_ast(char *heading, AST *ast); // prints to standard output
 }
@@ -238,47 +244,70 @@ static void OnExit()
     Sys_LeaveChild(0);
 }
 
-static size_t RemoveMark(char *text, size_t length)
+// --- Text between the items ---
+//
+// The parser drops it, or counts it as junk. Where it stands is known from the modes of the lexer,
+// which runs one token ahead of the parser: with an item the text that follows it is known.
+
+enum { LEXER_TOP = 0 }; // the mode between items
+
+static struct {
+    const char *text; // what is parsed
+    size_t length;
+    int mode;                  // of the lexer; -1 before the first
+    size_t start;              // of the text behind the last item
+    int inBrackets;            // that item is @article(...), not @article{...}
+    std::vector<BibSpan> kept; // of which nothing was sent yet
+} Outside = {nullptr, 0, -1, 0, 0, {}};
+
+static void ReportLostFields(BibSpan span)
 {
-    static const char mark[] = "\xEF\xBB\xBF";
-    if (length < 3 || memcmp(text, mark, 3) != 0)
-        return length;
-    memmove(text, text + 3, length - 3);
-    return length - 3;
+    size_t lost = BibText_FindLostFields(Outside.text, span, Outside.inBrackets);
+    if (lost < span.end)
+        PackMessage(Sending, BTERR_LEXERR, BibText_LineAt(Outside.text, lost),
+                    "fields stand behind the end of their entry, which has a closing brace too "
+                    "many");
 }
 
-// CR LF and lone CR become LF, NUL a blank.
-static size_t PlainLines(char *text, size_t length)
+// The lexer has come to the end of the text between two items.
+static void EndOutside(size_t end)
 {
-    if (!memchr(text, '\r', length) && !memchr(text, 0, length))
-        return length;
-    size_t written = 0;
-    for (size_t read = 0; read < length; ++read) {
-        char c = text[read];
-        if (c == '\r' && read + 1 < length && text[read + 1] == '\n')
-            continue;
-        text[written++] = c == '\r' ? '\n' : c ? c : ' ';
+    BibSpan span = {Outside.start, std::max(Outside.start, end)};
+    span = BibText_TrimLines(Outside.text, span);
+    if (span.start == span.end)
+        return;
+    ReportLostFields(span);
+    Outside.kept.push_back(span);
+}
+
+static void FollowMode(int mode)
+{
+    // It counts the end of the file as well.
+    size_t read = std::min(static_cast<size_t>(zzendcol), Outside.length);
+    if (mode == LEXER_TOP && Outside.mode != LEXER_TOP)
+        Outside.start = read;
+    if (mode == LEXER_TOP && Outside.mode > LEXER_TOP)
+        Outside.inBrackets = Outside.text[read - 1] == ')';
+    if (mode != LEXER_TOP && Outside.mode == LEXER_TOP)
+        EndOutside(read - 1); // an @ was read
+    Outside.mode = mode;
+}
+
+// What stands before an offset.
+static void PackOutside(BibItems *items, size_t offset)
+{
+    auto next = Outside.kept.begin();
+    for (; next != Outside.kept.end() && next->end <= offset; ++next) {
+        BeginItem(items, BIB_ITEM_OUTSIDE, 0, 0);
+        size_t start = BeginText(items);
+        Append(items, Outside.text + next->start, next->end - next->start);
+        EndText(items, start);
+        EndItem(items);
     }
-    return written;
+    Outside.kept.erase(Outside.kept.begin(), next);
 }
 
-// Prepares the text for the parser, in place: no byte order mark, plain line ends, and an end on
-// the last line too. `text` has a spare byte behind it.
-static size_t Normalise(char *text, size_t length)
-{
-    length = PlainLines(text, RemoveMark(text, length));
-    if (length > 0 && text[length - 1] != '\n')
-        text[length++] = '\n';
-    return length;
-}
-
-static int IsBlank(const char *text, size_t length)
-{
-    for (size_t i = 0; i < length; ++i)
-        if (!memchr(" \t\n\v\f", text[i], 5))
-            return 0;
-    return 1;
-}
+// --- Parsing ---
 
 // Frees an item's tree, unless the library's recursion would use up the stack.
 static void FreeTree(AST *ast, size_t pieces)
@@ -296,10 +325,7 @@ static void ReportMarks(const char *text, size_t length)
         mark = memchr(text, BIB_CLOSE_ABBREVIATION, length);
     if (!mark)
         return;
-    int line = 1;
-    for (const char *at = text; at < mark; ++at)
-        line += *at == '\n';
-    PackMessage(Sending, BTERR_LEXERR, line,
+    PackMessage(Sending, BTERR_LEXERR, BibText_LineAt(text, static_cast<const char *>(mark) - text),
                 "control character 0x02 or 0x05, which marks abbreviations in this program");
 }
 
@@ -314,6 +340,7 @@ static BibEnd ParseAll(FILE *stream, const char *path)
 {
     boolean status;
     while (AST *ast = bt_parse_entry(stream, const_cast<char *>(path), BTO_NOSTORE, &status)) {
+        PackOutside(Sending, static_cast<size_t>(ast->offset));
         size_t pieces = BibItems_PackAst(Sending, ast);
         bt_metatype metatype = bt_entry_metatype(ast);
         if (metatype < BTE_REGULAR || metatype > BTE_MACRODEF)
@@ -322,6 +349,9 @@ static BibEnd ParseAll(FILE *stream, const char *path)
         if (Sending->whole >= FLUSH_SIZE)
             Send(Sending);
     }
+    if (Outside.mode == LEXER_TOP)
+        EndOutside(Outside.length);
+    PackOutside(Sending, Outside.length);
     return feof(stream) ? BIB_END_OF_FILE : BIB_END_EARLY;
 }
 
@@ -336,13 +366,18 @@ void BibChild_Parse(void *argument)
     size_t length = 0;
     char *text = job->text ? Bib_CopyText(job->text, length = strlen(job->text))
                            : Sys_ReadAll(job->stream, &length);
-    if (!text)
+    if (!text || length >= INT_MAX) // the lexer counts with int
         Leave(BIB_END_UNREADABLE);
-    BeginItem(Sending, BIB_ITEM_FORM, 0, Enc_IsUtf8(text, length) ? 0 : BIB_FORM_CODE_PAGE);
+    BeginItem(Sending, BIB_ITEM_FORM, 0, BibText_Form(text, length));
     EndItem(Sending);
-    length = Normalise(text, length);
-    if (IsBlank(text, length))
+    length = BibText_Normalise(text, length);
+    Outside.text = text;
+    Outside.length = length;
+    if (BibText_HasNoItem(text, length)) {
+        EndOutside(length);
+        PackOutside(Sending, length);
         Leave(BIB_END_OF_FILE);
+    }
     FILE *stream = Sys_OpenText(text, length);
     if (!stream)
         Leave(BIB_END_UNREADABLE);
@@ -412,4 +447,29 @@ REPLACES_LIBRARY void zzerrstd(const char *)
 REPLACES_LIBRARY char *strlwr(char *text)
 {
     return text;
+}
+
+// The library's own goes on with this, so it is called from here.
+template <class Function> static Function *Replaced(const char *name)
+{
+    return reinterpret_cast<Function *>(Sys_ReplacedFunction(name));
+}
+
+// The lexer enters an item, a string in it, or leaves it.
+REPLACES_LIBRARY void zzmode(int mode)
+{
+    static void (*const original)(int) = Replaced<void(int)>("zzmode");
+    if (Sending)
+        FollowMode(mode);
+    original(mode);
+}
+
+// A comment line, which the library drops.
+REPLACES_LIBRARY void comment()
+{
+    static void (*const original)() = Replaced<void()>("comment");
+    if (Sending && Outside.mode != LEXER_TOP)
+        PackMessage(Sending, BTERR_CONTENT, zzline,
+                    "a comment inside an entry is not kept when the file is saved");
+    original();
 }

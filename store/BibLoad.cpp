@@ -11,6 +11,7 @@
 
 #include "app/Log.h"
 #include "store/Ascii.h"
+#include "store/BibOutside.h"
 #include "store/Sys.h"
 
 int BibLoadSeconds = 10;
@@ -58,6 +59,7 @@ static int64_t TextCount(const BibItemHeader *header)
     int64_t number = header->number;
     switch (header->kind) {
     case BIB_ITEM_MESSAGE:
+    case BIB_ITEM_OUTSIDE:
         return 1;
     case BIB_ITEM_ENTRY:
         return number < 0 ? -1 : 2 + 2 * number;
@@ -176,6 +178,7 @@ static BibStored StoreEntry(BibFile *file, ItemReader reader)
     MoveCrossrefToFront(entry, crossref);
     entry->next = file->entries;
     file->entries = entry;
+    Outside_GiveTo(file, BIB_ENTRIES, entry);
     return BIB_STORED;
 }
 
@@ -200,6 +203,7 @@ static BibStored StoreStrings(BibFile *file, ItemReader reader)
         }
         string->next = file->strings;
         file->strings = string;
+        Outside_GiveTo(file, BIB_STRINGS, string);
     }
     return BIB_STORED;
 }
@@ -209,6 +213,14 @@ static void ReportLostPieces(const BibFile *file, int line)
 {
     Bib_ReportMessage(nullptr, BTERR_LEXERR, file->path, line, nullptr, -1,
                       "the preamble is too long, a part of it was not loaded");
+}
+
+static int CountPieces(const char *preamble)
+{
+    int count = 0;
+    for (const char *end = strchr(preamble, '\r'); end; end = strchr(end + 1, '\r'))
+        ++count;
+    return count;
 }
 
 static void StorePreamble(BibFile *file, ItemReader reader)
@@ -225,6 +237,7 @@ static void StorePreamble(BibFile *file, ItemReader reader)
             ++lost;
             continue;
         }
+        Outside_GiveToPiece(file, CountPieces(file->preamble));
         memcpy(file->preamble + used, piece, length);
         memcpy(file->preamble + used + length, "\r\n", 3);
     }
@@ -252,8 +265,16 @@ static BibStored StoreComments(BibFile *file, ItemReader reader)
         AppLog("Comment: ", comment->text);
         comment->next = file->comments;
         file->comments = comment;
+        Outside_GiveTo(file, BIB_COMMENTS, comment);
     }
     return BIB_STORED;
+}
+
+static BibStored StoreOutside(BibFile *file, ItemReader reader)
+{
+    uint32_t length;
+    const char *text = NextText(&reader, &length);
+    return Outside_Add(file, text, length) ? BIB_STORED : BIB_NO_MEMORY;
 }
 
 BibStored BibItem_Store(BibFile *file, const char *item)
@@ -269,6 +290,8 @@ BibStored BibItem_Store(BibFile *file, const char *item)
         break;
     case BIB_ITEM_COMMENT:
         return StoreComments(file, reader);
+    case BIB_ITEM_OUTSIDE:
+        return StoreOutside(file, reader);
     case BIB_ITEM_FORM:
         file->form = reader.header.number & BIB_FORM_ALL;
         break;
@@ -471,7 +494,8 @@ static BibFile *NewFile(const char *path, FILE *stream)
     file->path = Bib_CopyText(path, strlen(path));
     file->baseName = BaseName(path);
     file->readOnly = Sys_WriteAccess(path);
-    file->stamp = Sys_StreamStamp(stream);
+    if (Bib_Origin(file))
+        file->origin->stamp = Sys_StreamStamp(stream);
     return file;
 }
 
@@ -506,6 +530,7 @@ BibFile *Bib_LoadFile(const char *path)
     Reverse(&file->strings);
     Reverse(&file->entries);
     Reverse(&file->comments);
+    Outside_Finish(file);
     return file;
 }
 
@@ -514,6 +539,7 @@ void Bib_FreeFile(BibFile *file)
     if (BibCurrentFile == file)
         BibCurrentFile = nullptr;
     free(file->messages);
+    Outside_Free(file);
     while (BibEntry *entry = file->entries) {
         file->entries = entry->next;
         Bib_FreeEntry(entry);
@@ -564,17 +590,34 @@ int Bib_AddCommentFromAst(BibFile *file, AST *ast)
     return StoreAst(file, ast);
 }
 
-// The child parses a text that must give a message, in the way it parses files.
+static int HasItem(const char *bytes, size_t length, BibItemKind kind)
+{
+    while (long size = BibItem_Size(bytes, length)) {
+        BibItemHeader header = {};
+        if (size > 0)
+            memcpy(&header, bytes, sizeof header);
+        if (size < 0 || header.kind == kind)
+            return size > 0;
+        bytes += size;
+        length -= static_cast<size_t>(size);
+    }
+    return 0;
+}
+
+// The child parses a text that must give a message and a comment line, in the way it parses files.
 int Bib_SelfTest()
 {
-    BibParseJob job = {nullptr, "@misc{key, field = }\n", "self-test"};
+    BibParseJob job = {nullptr, "% comment\n@misc{key, field = }\n", "self-test"};
     SysChild child;
     if (!Sys_StartChild(&child, BibChild_Parse, &job, BibLoadSeconds))
         return 0;
-    BibItemHeader form = {}, first = {};
-    int found = Sys_ReadChild(&child, &form, sizeof form, BibLoadSeconds) == sizeof form &&
-                Sys_ReadChild(&child, &first, sizeof first, BibLoadSeconds) == sizeof first &&
-                first.kind == BIB_ITEM_MESSAGE;
+    char bytes[4096]; // more than it sends
+    size_t length = 0;
+    long got = 1;
+    while (got > 0 && length < sizeof bytes) {
+        got = Sys_ReadChild(&child, bytes + length, sizeof bytes - length, BibLoadSeconds);
+        length += got > 0 ? static_cast<size_t>(got) : 0;
+    }
     Sys_EndChild(&child);
-    return found;
+    return HasItem(bytes, length, BIB_ITEM_MESSAGE) && HasItem(bytes, length, BIB_ITEM_OUTSIDE);
 }

@@ -7,6 +7,7 @@
 #include <ctime>
 
 #include "app/Log.h"
+#include "store/BibOutside.h"
 #include "store/Sys.h"
 
 // --- Values ---
@@ -15,15 +16,17 @@
 // Write errors stay with the stream.
 struct Output {
     FILE *stream;
+    int crlf; // lines end with CR LF
     size_t used;
     char block[1024 * 1024];
 };
 
 // Too large for the stack; one serves all, as nothing here runs twice at a time.
-static Output *StartOutput(FILE *stream)
+static Output *StartOutput(FILE *stream, int crlf)
 {
     static Output output;
     output.stream = stream;
+    output.crlf = crlf;
     output.used = 0;
     return &output;
 }
@@ -34,7 +37,7 @@ static void Flush(Output *out)
     out->used = 0;
 }
 
-static void Put(Output *out, const char *text, size_t length)
+static void PutBytes(Output *out, const char *text, size_t length)
 {
     if (length > sizeof out->block - out->used)
         Flush(out);
@@ -44,6 +47,27 @@ static void Put(Output *out, const char *text, size_t length)
     }
     memcpy(out->block + out->used, text, length);
     out->used += length;
+}
+
+static void PutLines(Output *out, const char *text, size_t length)
+{
+    const char *end = text + length;
+    while (const void *found = memchr(text, '\n', static_cast<size_t>(end - text))) {
+        const char *lineEnd = static_cast<const char *>(found);
+        const char *textEnd = lineEnd > text && lineEnd[-1] == '\r' ? lineEnd - 1 : lineEnd;
+        PutBytes(out, text, static_cast<size_t>(textEnd - text));
+        PutBytes(out, "\r\n", 2);
+        text = lineEnd + 1;
+    }
+    PutBytes(out, text, static_cast<size_t>(end - text));
+}
+
+static void Put(Output *out, const char *text, size_t length)
+{
+    if (out->crlf)
+        PutLines(out, text, length);
+    else
+        PutBytes(out, text, length);
 }
 
 static void Put(Output *out, const char *text)
@@ -150,58 +174,110 @@ static void PutValue(Output *out, const char *value)
 
 void Bib_WriteValue(const char *value, FILE *stream)
 {
-    Output *out = StartOutput(stream);
+    Output *out = StartOutput(stream, 0);
     PutValue(out, value);
     Flush(out);
 }
 
 // --- The file's text ---
 
-static void PutComments(Output *out, const BibComment *comment)
+// What stood between the items is written as they come.
+struct OutsideWriter {
+    Output *out;
+    const BibOutside *next;
+};
+
+static int IsNext(const OutsideWriter *outside, BibKind kind, const void *item, int piece)
 {
-    if (!comment)
-        return;
+    const BibOutside *next = outside->next;
+    return next && next->kind == kind && next->item == item && next->piece == piece;
+}
+
+static void PutNext(OutsideWriter *outside)
+{
+    Put(outside->out, outside->next->text);
+    Put(outside->out, "\n");
+    outside->next = outside->next->next;
+}
+
+static void PutOutside(OutsideWriter *outside, BibKind kind, const void *item)
+{
+    while (IsNext(outside, kind, item, 0))
+        PutNext(outside);
+}
+
+// What is left when all items of the kind are written: nothing, unless an item was taken away
+// without a word.
+static void PutRest(OutsideWriter *outside, BibKind kind)
+{
+    while (outside->next && outside->next->kind <= kind)
+        PutNext(outside);
+}
+
+static void PutComments(OutsideWriter *outside, const BibComment *comment)
+{
+    Output *out = outside->out;
+    int any = comment != nullptr;
     for (; comment; comment = comment->next) {
+        PutOutside(outside, BIB_COMMENTS, comment);
         Put(out, "@COMMENT{");
         Put(out, comment->text);
         Put(out, "}\n");
     }
-    Put(out, "\n");
+    if (any)
+        Put(out, "\n");
+    PutRest(outside, BIB_COMMENTS);
+}
+
+// Starts another item where text stands between two pieces: inside of one it would be lost.
+static void JoinPieces(OutsideWriter *outside, int piece)
+{
+    Output *out = outside->out;
+    int isNew = IsNext(outside, BIB_PIECES, nullptr, piece);
+    if (piece > 0)
+        Put(out, isNew ? " }\n\n" : "\n\t# ");
+    while (IsNext(outside, BIB_PIECES, nullptr, piece))
+        PutNext(outside);
+    if (piece == 0 || isNew)
+        Put(out, "@PREAMBLE{");
 }
 
 // A piece per line. The last one has no line end when it was edited by hand.
-static void PutPreamble(Output *out, const char *preamble)
+static void PutPreamble(OutsideWriter *outside, const char *preamble)
 {
-    if (!*preamble)
-        return;
-    Put(out, "@PREAMBLE{");
+    Output *out = outside->out;
+    int piece = 0;
     for (const char *at = preamble; *at;) {
         char line[BIB_PREAMBLE_SIZE];
         size_t length = strcspn(at, "\r");
         memcpy(line, at, length);
         line[length] = 0;
-        if (at != preamble)
-            Put(out, "\n\t# ");
+        JoinPieces(outside, piece++);
         PutValue(out, line);
         at += length;
         if (*at == '\r')
             at += at[1] == '\n' ? 2 : 1;
     }
-    Put(out, " }\n\n");
+    if (piece > 0)
+        Put(out, " }\n\n");
+    PutRest(outside, BIB_PIECES);
 }
 
-static void PutStrings(Output *out, const BibString *string)
+static void PutStrings(OutsideWriter *outside, const BibString *string)
 {
-    if (!string)
-        return;
+    Output *out = outside->out;
+    int any = string != nullptr;
     for (; string; string = string->next) {
+        PutOutside(outside, BIB_STRINGS, string);
         Put(out, "@STRING{");
         Put(out, string->name);
         Put(out, " = ");
         PutValue(out, string->value);
         Put(out, "}\n");
     }
-    Put(out, "\n");
+    if (any)
+        Put(out, "\n");
+    PutRest(outside, BIB_STRINGS);
 }
 
 // A key without the comma after it is a syntax error to the parser: the file would be read-only
@@ -223,12 +299,18 @@ static void PutEntry(Output *out, const BibEntry *entry)
 
 static void WriteContents(const BibFile *file, FILE *stream)
 {
-    Output *out = StartOutput(stream);
-    PutComments(out, file->comments);
-    PutPreamble(out, file->preamble);
-    PutStrings(out, file->strings);
-    for (const BibEntry *entry = file->entries; entry; entry = entry->next)
+    Output *out = StartOutput(stream, file->form & BIB_FORM_CRLF);
+    OutsideWriter outside = {out, file->origin ? file->origin->outside : nullptr};
+    if (file->form & BIB_FORM_MARK)
+        Put(out, BIB_BYTE_ORDER_MARK);
+    PutComments(&outside, file->comments);
+    PutPreamble(&outside, file->preamble);
+    PutStrings(&outside, file->strings);
+    for (const BibEntry *entry = file->entries; entry; entry = entry->next) {
+        PutOutside(&outside, BIB_ENTRIES, entry);
         PutEntry(out, entry);
+    }
+    PutRest(&outside, BIB_END);
     Flush(out);
 }
 
@@ -319,7 +401,7 @@ static int MakeRoom(const BibFile *file, Backup *backup)
 static int ChangedOutside(const BibFile *file)
 {
     uint64_t stamp = Sys_FileStamp(file->path);
-    if (stamp == 0 || stamp == file->stamp)
+    if (stamp == 0 || (file->origin && stamp == file->origin->stamp))
         return 0;
     AppLog("WARNING: Another program has changed the Bib-file: ", file->path);
     return 1;
@@ -395,6 +477,7 @@ int Bib_SaveFile(BibFile *file)
         return 0;
     file->backupDone = 1;
     file->modified = 0;
-    file->stamp = Sys_FileStamp(file->path);
+    if (Bib_Origin(file))
+        file->origin->stamp = Sys_FileStamp(file->path);
     return 1;
 }

@@ -56,11 +56,15 @@ struct BibComment { // one @COMMENT
     char *text; // heap, without its delimiters
 };
 
-// How a file was written. A new one has none of these.
+// How a file was written. A new one of plain lines has none of these.
 enum {
     BIB_FORM_CODE_PAGE = 1, // it is no valid UTF-8
-    BIB_FORM_ALL = 1
+    BIB_FORM_CRLF = 2,      // every line ends with CR LF
+    BIB_FORM_MARK = 4,      // it begins with a byte order mark
+    BIB_FORM_ALL = 7
 };
+
+constexpr char BIB_BYTE_ORDER_MARK[] = "\xEF\xBB\xBF";
 
 struct BibFile {
     FILE *stream;             // null: no stream is kept open
@@ -80,7 +84,25 @@ struct BibFile {
     int32_t warningCount;
     char *messages;                   // heap, BIB_MESSAGES_SIZE bytes; null without a message
     char preamble[BIB_PREAMBLE_SIZE]; // each piece is followed by CR LF
-    uint64_t stamp;                   // Sys_FileStamp of what was loaded or saved last
+    struct BibOrigin *origin;         // heap; null when nothing is known
+};
+
+enum BibKind { BIB_COMMENTS, BIB_PIECES, BIB_STRINGS, BIB_ENTRIES, BIB_END, BIB_KINDS };
+
+// Text that stood between the items of a file: comment lines, and whatever else is no item. It
+// belongs to the item that followed it, the text at the end of the file to none (BIB_END).
+struct BibOutside {
+    BibOutside *next;
+    BibKind kind;     // of the item
+    const void *item; // the BibComment, BibString or BibEntry; else null
+    int piece;        // index of the piece of the preamble; else 0
+    char *text;       // heap: lines, the last one without its end
+};
+
+// What a save needs to know of the file on the disk, besides its records.
+struct BibOrigin {
+    uint64_t stamp;      // Sys_FileStamp of what was loaded or saved last
+    BibOutside *outside; // in the order in which a save writes the items
 };
 
 // Process-wide name tables: shared by all files, they only grow.

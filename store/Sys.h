@@ -168,3 +168,8 @@ void Sys_OnChildCrash(void (*handler)());            // runs on a stack of its o
                                                      // ends as it would have
 FILE *Sys_OpenText(const char *text, size_t length); // a stream over memory, for one thread
 void Sys_UsePlainLocale();                           // letters and cases are ASCII's
+
+// --- Libraries ---
+
+// The function of a library that one of this program with the same name has replaced.
+void *Sys_ReplacedFunction(const char *name);

@@ -8,6 +8,7 @@
 #include <csignal>
 #include <cstdlib>
 
+#include <dlfcn.h>
 #include <fcntl.h>
 #include <locale.h>
 #include <poll.h>
@@ -216,4 +217,9 @@ void Sys_UsePlainLocale()
     locale_t plain = newlocale(LC_ALL_MASK, "C", nullptr);
     if (plain)
         uselocale(plain);
+}
+
+void *Sys_ReplacedFunction(const char *name)
+{
+    return dlsym(RTLD_NEXT, name);
 }

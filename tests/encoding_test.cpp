@@ -527,7 +527,7 @@ TEST_F(EncUtf8, IsFoundInValidTextOnly)
 TEST_F(EncUtf8, IsTheEncodingOfEachFileThatWasFoundSo)
 {
     BibFile utf8 = {}, other = {};
-    other.form = BIB_FORM_CODE_PAGE;
+    other.form = BIB_FORM_CODE_PAGE | BIB_FORM_CRLF;
     EXPECT_EQ(&EncodingUtf8, Enc_OfFile(&utf8));
     EXPECT_EQ(Row("CP1252"), Enc_OfFile(&other));
     Enc_Select("CP1251");

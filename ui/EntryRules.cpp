@@ -7,6 +7,7 @@
 #include "app/Log.h"
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
+#include "store/BibOutside.h"
 
 // --- Fields ---
 
@@ -221,6 +222,7 @@ int Entry_Remove(BibFile *file, BibEntry *entry)
         AppLog("DELETEENTRY: ", "Current entry not found.");
         return 0;
     }
+    Outside_HandOnEntry(file, entry);
     *link = entry->next;
     Bib_FreeEntry(entry);
     return 1;

@@ -8,6 +8,7 @@
 
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
+#include "store/BibOutside.h"
 #include "ui/Values.h"
 
 static bool SameName(const char *a, const char *b)
@@ -435,6 +436,7 @@ int Grid_Replace(BibFile *file, BibEntry *old, BibEntry *entry)
     BibEntry **link = Bib_FindLink(file, old);
     if (!link)
         return 0;
+    Outside_MoveEntry(file, old, entry);
     entry->next = old->next;
     *link = entry;
     Bib_FreeEntry(old);

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "store/BibOutside.h"
 #include "ui/Values.h"
 
 int CurrentPreamble = 0;
@@ -180,5 +181,6 @@ std::string Preamble_CheckMarks(const std::string &text)
 
 void Preamble_Store(BibFile *file, const PreambleEdit &edit)
 {
+    Outside_MovePieces(file, edit.places.data(), static_cast<int>(edit.places.size()));
     memcpy(file->preamble, edit.text.c_str(), edit.text.size() + 1);
 }

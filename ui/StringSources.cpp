@@ -7,6 +7,7 @@
 
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
+#include "store/BibOutside.h"
 #include "store/Profile.h"
 
 // Of buffers, in bytes with the end: what does not fit is not read.
@@ -206,6 +207,7 @@ void String_Remove(BibFile *file, BibString *string)
     BibString **link = &file->strings;
     while (*link != string)
         link = &(*link)->next;
+    Outside_HandOnString(file, string);
     *link = string->next;
     free(string->value);
     free(string->name);

@@ -1,0 +1,424 @@
+// What stands between the items of a file is there again after a save.
+#include "store/BibOutside.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <cstring>
+#include <string>
+
+#include "encoding/Encoding.h"
+#include "store/BibFileSet.h"
+#include "tests/support/LoadText.h"
+#include "tests/support/TempFolder.h"
+#include "ui/EntryRules.h"
+#include "ui/FieldGrid.h"
+#include "ui/PreambleText.h"
+#include "ui/StringSources.h"
+
+using testing::HasSubstr;
+
+namespace
+{
+
+class BibOutsideTest : public testing::Test
+{
+protected:
+    TempFolder folder;
+    BibFile *file = nullptr;
+
+    BibOutsideTest()
+    {
+        Bib_Initialize();
+        Enc_Select("CP1252");
+    }
+    ~BibOutsideTest() override
+    {
+        if (file)
+            Bib_FreeFile(file);
+    }
+
+    void Load(const std::string &text)
+    {
+        if (file)
+            Bib_FreeFile(file);
+        file = Bib_LoadFile(folder.Write("a.bib", text).c_str());
+        ASSERT_NE(nullptr, file);
+    }
+
+    std::string Saved()
+    {
+        EXPECT_EQ(1, Bib_SaveFile(file));
+        return folder.Read("a.bib");
+    }
+
+    std::string SavedFrom(const std::string &text)
+    {
+        Load(text);
+        EXPECT_EQ(0, file->errorCount) << Messages(file);
+        return Saved();
+    }
+
+    // A save does not change the text.
+    void ExpectKept(const std::string &text)
+    {
+        EXPECT_EQ(text, SavedFrom(text));
+        EXPECT_EQ(text, SavedFrom(text)) << "the second time";
+    }
+
+    BibEntry *Entry(const std::string &key)
+    {
+        BibEntry *entry = file->entries;
+        while (entry && key != entry->key)
+            entry = entry->next;
+        return entry;
+    }
+
+    void RemoveEntry(const std::string &key) { EXPECT_EQ(1, Entry_Remove(file, Entry(key))); }
+
+    void RemoveString(const std::string &name)
+    {
+        String_Remove(file, String_Find(file, 0, name.c_str()));
+    }
+
+    // As the panel commits it.
+    void Commit(const std::string &key, const std::wstring &value)
+    {
+        FieldGrid grid = {};
+        Grid_Fill(&grid, Entry(key), Enc_OfFile(file));
+        grid.rows[0].text = value;
+        BibEntry *changed = Grid_Build(&grid, grid.entry->type);
+        ASSERT_EQ(1, Grid_Replace(file, Entry(key), changed));
+    }
+
+    void EditPreamble(const std::wstring &typed)
+    {
+        Preamble_Store(file, Preamble_Read(typed, file->preamble, Enc_OfFile(file)));
+    }
+
+    std::string MessagesOf(const std::string &text)
+    {
+        Load(text);
+        return Messages(file);
+    }
+};
+
+// Comment lines before, between and after items of all four kinds, in the order and layout of a
+// save.
+const char AllKinds[] = "% comment one\n"
+                        "@COMMENT{one}\n"
+                        "% comment two\n"
+                        "@COMMENT{two}\n"
+                        "\n"
+                        "% piece one\n"
+                        "@PREAMBLE{{a} }\n"
+                        "\n"
+                        "% piece two\n"
+                        "@PREAMBLE{{b}\n"
+                        "\t# {c} }\n"
+                        "\n"
+                        "% string s\n"
+                        "@STRING{s = {S}}\n"
+                        "% string t\n"
+                        "@STRING{t = {T}}\n"
+                        "\n"
+                        "% entry a\n"
+                        "@misc{a,\n\tx = {1 a}\n}\n"
+                        "% entry b\n"
+                        "@misc{b,\n\tx = {1 b}\n}\n"
+                        "% entry c\n"
+                        "@misc{c,\n\tx = {1 c}\n}\n"
+                        "% end\n";
+
+} // namespace
+
+// --- Where it stands ---
+
+TEST_F(BibOutsideTest, StaysWithTheItemThatFollows)
+{
+    ExpectKept(AllKinds);
+}
+
+TEST_F(BibOutsideTest, FollowsItsItemToThePlaceWhereThatIsWritten)
+{
+    EXPECT_EQ("% of the comment\n@COMMENT{c}\n\n"
+              "% of the preamble\n@PREAMBLE{{p} }\n\n"
+              "% of the string\n@STRING{s = {S}}\n\n"
+              "% of the entry\n@misc{e,\n\tx = s\n}\n"
+              "% at the end\n",
+              SavedFrom("% of the entry\n@misc{e, x = s}\n% of the string\n@string{s = {S}}\n"
+                        "% of the preamble\n@preamble{{p}}\n% of the comment\n@comment{c}\n"
+                        "% at the end\n"));
+}
+
+TEST_F(BibOutsideTest, IsKeptLineByLine)
+{
+    ExpectKept("%% head\n\n\t  free words  \n% 50% {\"}\n@misc{a,\n}\n\\LaTeX{} #1 = 'x'\n"
+               "@misc{b,\n}\n  ~ )\n");
+}
+
+TEST_F(BibOutsideTest, LosesTheEmptyLinesAroundItOnly)
+{
+    EXPECT_EQ("% a\n\n\n% b\n@misc{k,\n}\n  % c \n",
+              SavedFrom("\n \n% a\n\n\n% b\n \t\n\n@misc{k,}\n\n\n  % c \n\n"));
+    EXPECT_EQ("@misc{k,\n}\n@misc{l,\n}\n", SavedFrom("\n\n@misc{k,}\n \t \n\n@misc{l,}\n\n"));
+}
+
+TEST_F(BibOutsideTest, MayStandOnTheLineOfAnItem)
+{
+    EXPECT_EQ("before \n@misc{k,\n}\n % behind\n@misc{l,\n}\n.\n",
+              SavedFrom("before @misc{k,} % behind\n @misc{l,}."));
+    EXPECT_EQ(Saved(), SavedFrom(Saved()));
+}
+
+TEST_F(BibOutsideTest, MayHoldAnItemThatIsCommentedOut)
+{
+    ExpectKept("% @misc{old,\n%   x = {y}\n% }\n@misc{k,\n}\n");
+    ExpectKept("@misc{k,\n}\n%@misc{old,\n  x = {y},\n}\n@misc{l,\n}\nmisc{m, x = {y}}\n");
+}
+
+TEST_F(BibOutsideTest, MayBeAllThereIs)
+{
+    ExpectKept("% nothing yet\n\n  % but this\n");
+    EXPECT_EQ(0, file->warningCount);
+    EXPECT_EQ("% a\n", SavedFrom("\n% a"));
+}
+
+// Another file than one of ours, most likely.
+TEST_F(BibOutsideTest, IsAnErrorWhenItIsAllThereIsAndNoComment)
+{
+    Load("To whom it may concern\n");
+    EXPECT_EQ(1, file->errorCount);
+}
+
+TEST_F(BibOutsideTest, GoesToTheNextItemWhenItsOwnIsDropped)
+{
+    EXPECT_EQ("% a\n% b\n@STRING{s = {S}}\n\n", SavedFrom("% a\n@string{}\n% b\n@string{s = {S}}"));
+}
+
+TEST_F(BibOutsideTest, StandsBeforeTheFirstOfSeveralAbbreviations)
+{
+    EXPECT_EQ("% a\n@STRING{s = {S}}\n@STRING{t = {T}}\n% b\n@STRING{u = {U}}\n\n",
+              SavedFrom("% a\n@string{s = {S}, t = {T}}\n% b\n@string{u = {U}}\n"));
+}
+
+TEST_F(BibOutsideTest, KeepsItsBytes)
+{
+    std::string text = "%";
+    for (int byte = 1; byte < 256; ++byte)
+        if (!strchr("\2\5\n\r", byte)) // marks are errors, line ends become one
+            text += static_cast<char>(byte);
+    ExpectKept(text + "\n@misc{k,\n}\n");
+}
+
+TEST_F(BibOutsideTest, MayBeLong)
+{
+    std::string text;
+    for (int i = 0; i < 20000; ++i)
+        text += "% line " + std::to_string(i) + " of a long comment\n";
+    ExpectKept(text + "@misc{k,\n}\n" + text);
+    ExpectKept("% " + std::string(3000000, 'x') + "\n@misc{k,\n}\n");
+}
+
+// --- Editing ---
+
+TEST_F(BibOutsideTest, StaysWhenItsItemIsRenamedOrChanged)
+{
+    Load(AllKinds);
+    Entry_Rename(file, Entry("b"), "z");
+    Commit("z", L"changed");
+    Commit("a", L"changed, too");
+    Entry("c")->type = Bib_TypeIndex("book");
+    EXPECT_EQ(1, String_SetValue(String_Find(file, 0, "s"), "new"));
+    EditPreamble(L"A\r\nb\r\nc!\r\n");
+    std::string expected = AllKinds;
+    for (auto [from, to] : {std::pair("{a}", "{A}"), std::pair("{c}", "{c!}"),
+                            std::pair("{S}", "{new}"), std::pair("{1 a}", "{changed, too}"),
+                            std::pair("misc{b,\n\tx = {1 b}", "misc{z,\n\tx = "
+                                                              "{changed}"),
+                            std::pair("@misc{c", "@book{c")})
+        expected.replace(expected.find(from), strlen(from), to);
+    EXPECT_EQ(expected, Saved());
+}
+
+TEST_F(BibOutsideTest, GoesToTheNextItemWhenItsOwnIsRemoved)
+{
+    Load(AllKinds);
+    RemoveEntry("b");
+    RemoveString("s");
+    EditPreamble(L"b\r\nc\r\n");
+    EXPECT_EQ("% comment one\n@COMMENT{one}\n% comment two\n@COMMENT{two}\n\n"
+              "% piece one\n% piece two\n@PREAMBLE{{b}\n\t# {c} }\n\n"
+              "% string s\n% string t\n@STRING{t = {T}}\n\n"
+              "% entry a\n@misc{a,\n\tx = {1 a}\n}\n"
+              "% entry b\n% entry c\n@misc{c,\n\tx = {1 c}\n}\n% end\n",
+              Saved());
+}
+
+TEST_F(BibOutsideTest, GoesToTheNextKindWhenTheLastOfItsOwnIsRemoved)
+{
+    Load(AllKinds);
+    RemoveString("t");
+    RemoveString("s");
+    RemoveEntry("c");
+    EXPECT_EQ("% comment one\n@COMMENT{one}\n% comment two\n@COMMENT{two}\n\n"
+              "% piece one\n@PREAMBLE{{a} }\n\n% piece two\n@PREAMBLE{{b}\n\t# {c} }\n\n"
+              "% string s\n% string t\n% entry a\n@misc{a,\n\tx = {1 a}\n}\n"
+              "% entry b\n@misc{b,\n\tx = {1 b}\n}\n% entry c\n% end\n",
+              Saved());
+}
+
+TEST_F(BibOutsideTest, GoesToTheEndWhenNothingFollows)
+{
+    Load(AllKinds);
+    EditPreamble(L"");
+    for (const char *name : {"s", "t"})
+        RemoveString(name);
+    for (const char *key : {"c", "a", "b"})
+        RemoveEntry(key);
+    EXPECT_EQ("% comment one\n@COMMENT{one}\n% comment two\n@COMMENT{two}\n\n"
+              "% piece one\n% piece two\n% string s\n% string t\n% entry a\n% entry b\n"
+              "% entry c\n% end\n",
+              Saved());
+}
+
+TEST_F(BibOutsideTest, IsNotThatOfANewItem)
+{
+    Load("% a\n@misc{a,\n}\n% b\n@misc{b,\n}\n% end\n");
+    Bib_NewEntry(file, "new", "misc", "\0", 0);
+    EXPECT_EQ(1, String_Add(file, "s", "S"));
+    EXPECT_EQ("@STRING{s = {S}}\n\n@misc{new,\n}\n% a\n@misc{a,\n}\n% b\n@misc{b,\n}\n% end\n",
+              Saved());
+}
+
+// The new one may stand where the old one stood in memory.
+TEST_F(BibOutsideTest, IsNotThatOfAnItemThatComesAfterARemoval)
+{
+    Load("% a\n@misc{a,\n}\n@misc{b,\n}\n");
+    RemoveEntry("a");
+    Bib_NewEntry(file, "c", "misc", "\0", 0)->reserved = 1;
+    EXPECT_EQ("@misc{c,\n}\n% a\n@misc{b,\n}\n", Saved());
+}
+
+TEST_F(BibOutsideTest, FollowsThePiecesOfAPreambleThatMove)
+{
+    Load("% one\n@PREAMBLE{{a} }\n\n% two\n@PREAMBLE{{b} }\n\n% end\n");
+    EditPreamble(L"b\r\nnew\r\na\r\n");
+    EXPECT_EQ("% two\n@PREAMBLE{{b}\n\t# {new} }\n\n% one\n@PREAMBLE{{a} }\n\n% end\n", Saved());
+    EditPreamble(L"a\r\n");
+    EXPECT_EQ("% two\n% one\n@PREAMBLE{{a} }\n\n% end\n", Saved());
+    EditPreamble(L"");
+    EXPECT_EQ("% two\n% one\n% end\n", Saved());
+}
+
+TEST_F(BibOutsideTest, IsWrittenEvenWhenItsItemIsTakenAwayWithoutAWord)
+{
+    Load(AllKinds);
+    for (const char *key : {"a", "b"}) {
+        BibEntry **link = Bib_FindLink(file, Entry(key));
+        BibEntry *entry = *link;
+        *link = entry->next;
+        Bib_FreeEntry(entry);
+    }
+    std::string saved = Saved();
+    for (const char *line : {"% entry a\n", "% entry b\n", "% entry c\n", "% end\n"})
+        EXPECT_THAT(saved, HasSubstr(line));
+}
+
+// --- Messages ---
+
+TEST_F(BibOutsideTest, IsNoCommentInsideAnItem)
+{
+    EXPECT_EQ("WARNING: line 3: a comment inside an entry is not kept when the file is saved\r\n"
+              "WARNING: line 5: a comment inside an entry is not kept when the file is saved\r\n",
+              MessagesOf("% kept\n@misc{k, x = {% text},\n% dropped\n y = {2}\n% }\n} % kept\n"));
+    EXPECT_EQ(2, file->warningCount);
+    EXPECT_EQ("% kept\n@misc{k,\n\tx = {% text},\n\ty = 2\n}\n % kept\n", Saved());
+    EXPECT_EQ("WARNING: line 1: a comment inside an entry is not kept when the file is saved\r\n",
+              MessagesOf("@string{a = %\n {b}}"));
+}
+
+TEST_F(BibOutsideTest, IsReportedByTheParserAsBefore)
+{
+    EXPECT_EQ("WARNING: line 3: 1 characters of junk seen at toplevel\r\n",
+              MessagesOf("@misc{k, x = {y}\n}}\n@misc{l,}\n"));
+    EXPECT_EQ(0, file->errorCount);
+    EXPECT_EQ(1, file->warningCount);
+    EXPECT_EQ("@misc{k,\n\tx = {y}\n}\n}\n@misc{l,\n}\n", Saved());
+}
+
+TEST_F(BibOutsideTest, IsAnErrorWhenItHasTheFieldsOfAnEntry)
+{
+    const char lost[] = "fields stand behind the end of their entry, which has a closing brace too "
+                        "many\r\n";
+    for (const char *text : {"@misc{k, x = {y}},\n z = 12\n}\n", "@misc{k, x = {y}}\n z= {1}}\n",
+                             "@misc{k, x = {y}}\n% comment }\nz = \"a{}b\" }@misc{l,}",
+                             "@misc(k, x = {y}),\n z = 12)\n", "@misc(k, x = {y}),\n z = 12}\n"}) {
+        EXPECT_THAT(MessagesOf(text), HasSubstr(lost)) << text;
+        EXPECT_EQ(1, file->errorCount) << text;
+    }
+    EXPECT_THAT(MessagesOf("@misc{k, x = {y}}\n,\n z = 12\n}\n"),
+                HasSubstr(std::string("ERROR: line 3: ") + lost));
+}
+
+TEST_F(BibOutsideTest, IsNoErrorWhenItHasNoFieldsOfAnEntry)
+{
+    for (const char *text :
+         {"@misc{k,}\n}\n", "@misc{k,}\nnote = 1\n", "@misc{k,}\n}\nnote = 1\n",
+          "@misc{k,}\nmisc{l, x = {y}}\n", "@misc{k,}\n% x = 1 }\n", "@misc{k,}\n= }\n",
+          "@misc{k,}\nx = (1)\n)\n", "@misc(k,)\nx (= 1)\n", "@misc{k,}\n%misc{l,\nx = {y}\n}\n"}) {
+        Load(text);
+        EXPECT_EQ(0, file->errorCount) << text << Messages(file);
+    }
+}
+
+// --- The form of the file ---
+
+TEST_F(BibOutsideTest, HasTheLineEndsOfTheFile)
+{
+    const std::string text = "% a\r\n\r\n% b\r\n@COMMENT{c}\r\n\r\n@PREAMBLE{{p}\r\n\t# {q} }\r\n"
+                             "\r\n@STRING{s = {S}}\r\n\r\n@misc{k,\r\n\tx = {y}\r\n}\r\n% end\r\n";
+    ExpectKept(text);
+    EXPECT_EQ(BIB_FORM_CRLF, file->form);
+    std::string plain = text;
+    for (size_t at = plain.find('\r'); at != plain.npos; at = plain.find('\r', at))
+        plain.erase(at, 1);
+    ExpectKept(plain);
+    EXPECT_EQ(0, file->form);
+}
+
+TEST_F(BibOutsideTest, HasPlainLineEndsUnlessAllAreOthers)
+{
+    EXPECT_EQ("@misc{k,\r\n}\r\n", SavedFrom("@misc{k,}\r\n"));
+    EXPECT_EQ("@misc{k,\r\n}\r\n", SavedFrom("\r\n@misc{k,}"));
+    for (const char *text : {"@misc{k,\r\n}\n", "@misc{k,\n}\r\n", "@misc{k,\r}\r\n",
+                             "@misc{k,\r}\r", "@misc{k,}\r\n\r", "@misc{k,}"})
+        EXPECT_EQ("@misc{k,\n}\n", SavedFrom(text)) << text;
+}
+
+TEST_F(BibOutsideTest, EndsLinesInValuesLikeTheOthers)
+{
+    Load("@misc{k, x = {y}}\r\n");
+    Commit("k", L"a\nb\r\nc");
+    EXPECT_EQ("@misc{k,\r\n\tx = {a\r\nb\r\nc}\r\n}\r\n", Saved());
+}
+
+TEST_F(BibOutsideTest, ComesAfterTheByteOrderMark)
+{
+    ExpectKept("\xEF\xBB\xBF% a\n@misc{k,\n}\n");
+    EXPECT_EQ(0, file->warningCount);
+    EXPECT_EQ(BIB_FORM_MARK, file->form);
+    EXPECT_EQ("\xEF\xBB\xBF@COMMENT{c}\n\n% a\n@misc{k,\n}\n",
+              SavedFrom("\xEF\xBB\xBF% a\n@misc{k,}\n@comment{c}\n"));
+    ExpectKept("\xEF\xBB\xBF@misc{k,\r\n}\r\n");
+    ExpectKept("\xEF\xBB\xBF% all\n");
+}
+
+TEST_F(BibOutsideTest, IsCountedForTheFormOfTheFile)
+{
+    Load("% M\xFCller\n@misc{k,\n}\n");
+    EXPECT_EQ(BIB_FORM_CODE_PAGE, file->form);
+    Load("% M\xC3\xBCller\n@misc{k,\n}\n");
+    EXPECT_EQ(0, file->form);
+}
