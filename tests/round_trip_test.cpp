@@ -1,6 +1,7 @@
 // What was loaded is what a save writes: real files, loaded, saved, and loaded again.
 #include "store/BibStore.h"
 
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include <cstdlib>
@@ -9,6 +10,7 @@
 
 #include "store/Ascii.h"
 #include "tests/support/LoadText.h"
+#include "tests/support/OutsideLines.h"
 #include "tests/support/TempFolder.h"
 
 namespace
@@ -49,6 +51,7 @@ class RoundTrip : public testing::Test
 {
 protected:
     TempFolder folder;
+    size_t outside = 0; // kinds of items with lines that were compared
 
     void SetUp() override
     {
@@ -82,6 +85,15 @@ protected:
         Bib_FreeFile(again);
     }
 
+    // The lines outside the items, each before the item of its kind that it stood before.
+    void CheckOutside(const std::string &original)
+    {
+        OutsideLines before(original), after(folder.Read("first.bib"));
+        for (const auto &[kind, lines] : before.lines)
+            EXPECT_THAT(after.lines[kind], testing::ElementsAreArray(lines)) << kind;
+        outside += before.lines.size();
+    }
+
     void CheckFolder(const fs::path &corpus)
     {
         int clean = 0;
@@ -94,10 +106,12 @@ protected:
             if (file->errorCount == 0) {
                 ++clean;
                 Check(file);
+                CheckOutside(TempFolder::ReadFile(item.path()));
             }
             Bib_FreeFile(file);
         }
         EXPECT_LT(2, clean) << "no BIB files in " << corpus;
+        EXPECT_LT(0u, outside);
     }
 };
 

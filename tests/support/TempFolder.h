@@ -33,11 +33,13 @@ public:
         return Path(name);
     }
 
-    std::string Read(const std::string &name) const
+    static std::string ReadFile(const std::string &path)
     {
-        std::ifstream stream(Path(name), std::ios::binary);
+        std::ifstream stream(path, std::ios::binary);
         return {std::istreambuf_iterator<char>(stream), std::istreambuf_iterator<char>()};
     }
+
+    std::string Read(const std::string &name) const { return ReadFile(Path(name)); }
 
     // Of everything in the folder, hidden files too.
     std::set<std::string> Names() const
