@@ -65,9 +65,23 @@ static std::string DescribeEntry(const BibEntry *entry)
     return text;
 }
 
+// What stands before one item is one text.
+static std::string DescribeOutside(const BibFile *file)
+{
+    std::string text = file->form & BIB_FORM_MARK ? "mark\n" : "";
+    const BibOutside *last = nullptr;
+    for (const BibOutside *at = file->origin ? file->origin->outside : nullptr; at; at = at->next) {
+        if (!last || last->item != at->item || last->piece != at->piece || last->kind != at->kind)
+            text += "outside " + std::to_string(at->kind) + " " + std::to_string(at->piece) + "\n";
+        text += std::string(at->text) + "\n";
+        last = at;
+    }
+    return text;
+}
+
 std::string DescribeRecords(const BibFile *file)
 {
-    std::string text;
+    std::string text = DescribeOutside(file);
     for (const BibComment *comment = file->comments; comment; comment = comment->next)
         text += std::string("comment ") + comment->text + "\n";
     text += std::string("preamble ") + file->preamble + "\n";
