@@ -273,5 +273,53 @@ class Fields(EditorTest):
         self.assertEqual(b"@misc{a,\n\tnote = {Newer}\n}\n", self.read("a.bib"))
 
 
+WORLD = """\ufeff% Библиотека, до 2001
+@STRING{zürich = {Zürich}}
+% between
+
+@misc{müller,
+	title = {שלום e\u0301 €},
+	note = {«😀»},
+	year = 2001
+}
+ free text
+@misc{nagy,
+	year = 2002
+}
+% конец
+""".replace("\n", "\r\n")
+LATIN = "% Alt: Müller\n@misc{ölaf,\n\tauthor = {Jürgen},\n\tyear = 1950\n}\n"
+
+
+class WhatAFileHeld(EditorTest):
+    def test_is_still_there_after_an_edit(self):
+        world = WORLD.replace("% between\r\n\r\n", "\r\n% between\r\n")  # as a save writes it
+        self.write("world.bib", WORLD.encode())
+        self.write("latin.bib", LATIN.encode("cp1252"))
+        editor = self.start("world.bib", "latin.bib").ready()
+        editor.press("Escape", "Tab", "Tab", "Tab", "End")
+        editor.type("0")
+        editor.commit()
+        self.assertEqual(["ölaf (latin)"], editor.press("End"))
+        editor.press("Escape", "Tab", "Tab", "End")
+        editor.type("1")
+        editor.commit()
+        editor.press("alt+b")
+        self.assertEqual(LATIN.replace("1950", "19501").encode("cp1252"), self.read("latin.bib"))
+        self.assertEqual(world.replace("2001\r\n}", "20010\r\n}").encode(),
+                         self.read("world.bib"))
+
+    def test_goes_to_the_next_entry_when_one_is_removed(self):
+        self.write("world.bib", WORLD.encode())
+        editor = self.start("world.bib").ready()
+        editor.begin("alt+d")
+        editor.answer(REMOVE_ENTRY)
+        editor.wait_until_active()
+        editor.press("alt+b")
+        start, rest = WORLD.split("% between")
+        expected = start + "\r\n% between\r\n free text" + rest.split(" free text")[1]
+        self.assertEqual(expected.encode(), self.read("world.bib"))
+
+
 if __name__ == "__main__":
     cases.run()

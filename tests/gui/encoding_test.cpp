@@ -18,6 +18,7 @@ using Texts = std::vector<wxString>;
 // As a save writes them. Characters of 1 to 4 bytes, right-to-left and combining ones, private
 // ones, and guillemets that are text.
 static const char World[] =
+    "% \xD0\xB1\xD0\xB8\xD0\xB1\xD0\xBB\xD0\xB8\xD0\xBE\n"
     "@PREAMBLE{{\xC3\xBC} }\n\n"
     "@STRING{z\xC3\xBCrich = {Z\xC3\xBCrich}}\n\n"
     "@misc{M\xC3\xBCller,\n"
@@ -259,4 +260,22 @@ TEST_F(Encodings, AreThoseOfTheFileForItsMessages)
         },
         ExpectMessages("There are errors in loading BIB files", &text));
     EXPECT_TRUE(text.Contains(L"found \"\u00FC\"")) << text;
+}
+
+// --- Text between the items ---
+
+TEST_F(Encodings, KeepTheTextBetweenTheItems)
+{
+    const std::string text = "% head\n@STRING{s = {S}}\n% s\n@STRING{t = {T}}\n\n% one\n"
+                             "@misc{one,\n\ta = 1\n}\n% two\n@misc{two,\n\ta = 2\n}\n% end\n";
+    OpenText(text);
+    StartEditing();
+    SetValue("a", "3");
+    Commit();
+    EXPECT_EQ(Replaced(text, "a = 1", "a = 3"), Saved());
+    List()->SetSelection(0);
+    wxTEST_DIALOG(Send(ID_REMOVE_ENTRY), ExpectBox("Removing Entry", "one (a)", wxID_YES));
+    EXPECT_EQ("% head\n@STRING{s = {S}}\n% s\n@STRING{t = {T}}\n\n% one\n% two\n"
+              "@misc{two,\n\ta = 2\n}\n% end\n",
+              Saved());
 }
