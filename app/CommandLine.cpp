@@ -294,18 +294,17 @@ static void UpdateForms(BibFile *const *files, int count)
 // Option e. A name that is not known leaves the code page as it is, and letters may look wrong.
 static void SelectEncoding(Command *command, const char *name)
 {
-    const EncodingRecord *before = Enc_Current();
-    Enc_Select(name);
-    if (Enc_Current() != before) {
-        UpdateForms(command->previous.files, command->previous.count);
-        UpdateForms(command->set->files, command->set->count);
-        UpdateForms(command->set->aside, command->set->asideCount);
-    }
-    if (Ascii_Compare(Enc_Current()->name, name) == 0)
+    const BibFileSet *previous = &command->previous, *set = command->set;
+    if (Enc_Select(name)) {
+        UpdateForms(previous->files, previous->count);
+        UpdateForms(set->files, set->count);
+        UpdateForms(set->aside, set->asideCount);
         return;
+    }
     FileSet_AppendError(command->set,
-                        "ERROR: There is no code page '%s', %s stays selected (CP65001 is UTF-8)\n",
-                        name, Enc_Current()->name);
+                        "ERROR: There is no code page '%s' (UTF-8 is called CP65001), %s stays "
+                        "selected\n",
+                        name, Enc_Label(Enc_Current()));
     ++command->result.errors;
 }
 

@@ -10,7 +10,7 @@
 
 #include "app/Log.h"
 #include "store/Ascii.h"
-#include "store/BibStore.h"
+#include "store/BibStore.h" // the marks
 
 static const wchar_t SHOWN_OPEN = 0xAB;  // of BIB_OPEN_ABBREVIATION
 static const wchar_t SHOWN_CLOSE = 0xBB; // of BIB_CLOSE_ABBREVIATION
@@ -57,15 +57,16 @@ static void Use(const EncodingRecord *encoding)
     UsePage(encoding->map ? encoding : FindRow(DefaultPage));
 }
 
-void Enc_Select(const char *name)
+int Enc_Select(const char *name)
 {
     const EncodingRecord *encoding = Find(name);
     if (!encoding) {
         AppLog("ERROR: Can't select unknown encoding: ", name);
-        return;
+        return 0;
     }
     Use(encoding);
     AppLog("INFO: Selecting Encoding: ", name);
+    return 1;
 }
 
 const EncodingRecord *Enc_Current()
@@ -86,18 +87,16 @@ const char *Enc_Label(const EncodingRecord *encoding)
     return encoding == &EncodingUtf8 ? encoding->displayName : encoding->name;
 }
 
-const EncodingRecord *Enc_OfFile(const BibFile *file)
+const EncodingRecord *Enc_For(int isUtf8)
 {
     if (Enc_Current() != &EncodingUtf8)
         return selected;
-    return file->form & BIB_FORM_CODE_PAGE ? page : &EncodingUtf8;
+    return isUtf8 ? &EncodingUtf8 : page;
 }
 
 const EncodingRecord *Enc_OfText(const char *text)
 {
-    if (Enc_Current() != &EncodingUtf8)
-        return selected;
-    return Enc_IsUtf8(text, strlen(text)) ? &EncodingUtf8 : page;
+    return Enc_For(Enc_IsUtf8(text, strlen(text)));
 }
 
 // --- To Unicode ---
@@ -161,7 +160,13 @@ std::wstring Enc_Decode(const char *text, const EncodingRecord *encoding)
 
 // --- From Unicode ---
 
-static unsigned char ToByte(wchar_t character)
+static unsigned char FindByte(const uint32_t *map, uint32_t c)
+{
+    const uint32_t *end = map + NO_BYTE;
+    return static_cast<unsigned char>(std::find(map, end, c) - map);
+}
+
+static unsigned char ToByte(wchar_t character, const EncodingRecord *encoding)
 {
     switch (character) {
     case SHOWN_OPEN:
@@ -170,6 +175,8 @@ static unsigned char ToByte(wchar_t character)
         return BIB_CLOSE_ABBREVIATION;
     }
     uint32_t c = static_cast<uint32_t>(character);
+    if (encoding != page)
+        return FindByte(encoding->map, c);
     return c < CODE_POINTS ? pageBytes[c] : NO_BYTE;
 }
 
@@ -201,10 +208,10 @@ void Enc_LogConversion(const wchar_t *in, const char *out)
 
 char *Enc_FromUnicode(char *buffer, const wchar_t *text)
 {
-    CurrentPage();
+    const EncodingRecord *current = CurrentPage();
     char *out = buffer;
     for (const wchar_t *at = text; *at; ++at)
-        *out++ = static_cast<char>(ToByte(*at));
+        *out++ = static_cast<char>(ToByte(*at, current));
     *out = 0;
     Enc_LogConversion(text, buffer);
     return buffer;
@@ -214,7 +221,7 @@ static size_t PutCharacter(char *out, wchar_t c, const EncodingRecord *encoding)
 {
     if (!encoding->map && c != SHOWN_OPEN && c != SHOWN_CLOSE)
         return Enc_PutUtf8(out, static_cast<uint32_t>(c));
-    *out = static_cast<char>(ToByte(c));
+    *out = static_cast<char>(ToByte(c, encoding));
     return 1;
 }
 
@@ -237,7 +244,7 @@ std::string Enc_Encode(const wchar_t *text, const EncodingRecord *encoding)
 int Enc_Holds(wchar_t character, const EncodingRecord *encoding)
 {
     if (encoding->map)
-        return ToCharacter(encoding->map, ToByte(character)) == character;
+        return ToCharacter(encoding->map, ToByte(character, encoding)) == character;
     uint32_t c = static_cast<uint32_t>(character);
     bool isMark = c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION;
     return c <= 0x10FFFF && !U_IS_SURROGATE(c) && !isMark;
@@ -265,21 +272,30 @@ static size_t AsciiLength(const char *text, size_t length)
     return i;
 }
 
-int Enc_IsUtf8(const char *text, size_t length)
+size_t Enc_Utf8Length(const char *text, size_t length)
 {
     size_t i = AsciiLength(text, length);
     while (i < length) {
+        size_t next = i;
         UChar32 c;
-        U8_NEXT(text, i, length, c);
+        U8_NEXT(text, next, length, c);
         if (c < 0)
-            return 0;
-        i += AsciiLength(text + i, length - i);
+            return i;
+        i = next + AsciiLength(text + next, length - next);
     }
-    return 1;
+    return i;
 }
 
+int Enc_IsUtf8(const char *text, size_t length)
+{
+    return Enc_Utf8Length(text, length) == length;
+}
+
+// Marks are found like the guillemets that they are shown as.
 static char32_t FoldCase(uint32_t c)
 {
+    if (c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION)
+        return c == BIB_OPEN_ABBREVIATION ? SHOWN_OPEN : SHOWN_CLOSE;
     if (c < 0x80)
         return Ascii_Lower(static_cast<unsigned char>(c));
     return static_cast<char32_t>(u_foldCase(static_cast<UChar32>(c), U_FOLD_CASE_DEFAULT));
@@ -293,29 +309,28 @@ std::u32string Enc_FoldUtf8(const char *text)
     return folded;
 }
 
-// Whether the text goes on with the characters.
-static bool GoesOn(const char *text, const std::u32string &folded)
+int Enc_Utf8BeginsWith(const char *text, const std::u32string &folded)
 {
     for (char32_t c : folded)
         if (!*text || FoldCase(NextCharacter(&text)) != c)
-            return false;
-    return true;
+            return 0;
+    return 1;
 }
 
-// ASCII text holds nothing but ASCII, whatever the case.
-static bool MayContain(const char *text, const std::u32string &folded)
+// Neither other letters nor marks: most values are like that.
+static bool IsPlain(const char *text)
 {
     size_t length = strlen(text);
-    bool isAscii = std::all_of(folded.begin(), folded.end(), [](char32_t c) { return c < 0x80; });
-    return isAscii || AsciiLength(text, length) < length;
+    return AsciiLength(text, length) == length && !strpbrk(text, "\2\5");
 }
 
 int Enc_Utf8Contains(const char *text, const std::u32string &folded)
 {
-    if (!MayContain(text, folded))
+    bool isPlain = std::all_of(folded.begin(), folded.end(), [](char32_t c) { return c < 0x80; });
+    if (!isPlain && IsPlain(text))
         return 0;
     for (; *text; NextCharacter(&text))
-        if (GoesOn(text, folded))
+        if (Enc_Utf8BeginsWith(text, folded))
             return 1;
     return folded.empty();
 }

@@ -1,8 +1,8 @@
 // encoding/Encoding.h - store text (8-bit) to and from Unicode.
 //
 // One encoding is selected for the whole process: a code page, in which every text is then, or
-// UTF-8. While UTF-8 is selected, each file is in UTF-8 or in CP1252, as it was found when it was
-// loaded, and texts of a file are converted with Enc_OfFile.
+// UTF-8. While UTF-8 is selected, a text is in UTF-8 or in CP1252, as it was found to be; that of a
+// file's texts is decided for the whole file (Bib_Encoding in store/BibStore.h).
 //
 // The abbreviation marks of the store, bytes 0x02 and 0x05, are shown as U+00AB and U+00BB,
 // whatever the encoding.
@@ -11,8 +11,6 @@
 #include <cstddef>
 #include <cstdint>
 #include <string>
-
-struct BibFile;
 
 enum { ENC_LONGEST = 4 }; // bytes of a character in any encoding
 
@@ -28,9 +26,9 @@ extern const EncodingRecord EncodingTable[];
 
 extern const EncodingRecord EncodingUtf8; // "CP65001"; no row of the table
 
-// Selects the code page with this name, or UTF-8, ignoring case. An unknown name is logged and
-// changes nothing.
-void Enc_Select(const char *name);
+// Selects the code page with this name, or UTF-8, ignoring case. 1, or 0 for an unknown name, which
+// is logged and changes nothing.
+int Enc_Select(const char *name);
 
 // What is selected; CP1252 until the first Enc_Select.
 const EncodingRecord *Enc_Current();
@@ -50,13 +48,12 @@ char *Enc_FromUnicode(char *buffer, const wchar_t *text);
 // What Enc_FromUnicode logs; the conversions below log nothing.
 void Enc_LogConversion(const wchar_t *in, const char *out);
 
-// --- In UTF-8 or in that code page ---
+// --- In any encoding ---
 
-// The encoding of a file's texts.
-const EncodingRecord *Enc_OfFile(const BibFile *file);
+// That of a text: the selected one; while that is UTF-8, it depends on what was found.
+const EncodingRecord *Enc_For(int isUtf8);
 
-// That of a text which belongs to no file, or to several: names of types, the INI file. It is
-// looked at while UTF-8 is selected.
+// The same for a text that belongs to no file, or to several: names of types, the INI file.
 const EncodingRecord *Enc_OfText(const char *text);
 
 // Store text to display text. Bytes that are no UTF-8 become U+FFFD there.
@@ -77,13 +74,17 @@ std::string Enc_Recode(const char *text, const EncodingRecord *from, const Encod
 
 // --- UTF-8 ---
 
-int Enc_IsUtf8(const char *text, size_t length); // valid, without surrogates; ASCII is
+// How much of the text is valid: without surrogates. ASCII is.
+size_t Enc_Utf8Length(const char *text, size_t length);
+int Enc_IsUtf8(const char *text, size_t length); // 1 when all of it is
 
 // One character as UTF-8; what is none becomes U+FFFD. Returns the count of bytes.
 size_t Enc_PutUtf8(char *out, uint32_t character);
 
-// A text for Enc_Utf8Contains: its characters, without the differences of case.
+// The characters of a UTF-8 text for a search: without differences of case, and with guillemets for
+// marks.
 std::u32string Enc_FoldUtf8(const char *text);
 
-// 1 when the UTF-8 text contains the characters, ignoring the case of all letters.
+// 1 when the folded UTF-8 text contains the folded characters, or begins with them.
 int Enc_Utf8Contains(const char *text, const std::u32string &folded);
+int Enc_Utf8BeginsWith(const char *text, const std::u32string &folded);

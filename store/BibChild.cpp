@@ -258,53 +258,81 @@ static struct {
     size_t start;              // of the text behind the last item
     int inBrackets;            // that item is @article(...), not @article{...}
     std::vector<BibSpan> kept; // of which nothing was sent yet
-} Outside = {nullptr, 0, -1, 0, 0, {}};
+    size_t counted;            // lines are counted up to here
+    int line;
+} Source = {nullptr, 0, -1, 0, 0, {}, 0, 1};
+
+// The offsets must not fall.
+static int LineAt(size_t at)
+{
+    Source.line += BibText_CountLines(Source.text, {Source.counted, at});
+    Source.counted = at;
+    return Source.line;
+}
 
 static void ReportLostFields(BibSpan span)
 {
-    size_t lost = BibText_FindLostFields(Outside.text, span, Outside.inBrackets);
+    size_t lost = BibText_FindLostFields(Source.text, span, Source.inBrackets);
     if (lost < span.end)
-        PackMessage(Sending, BTERR_LEXERR, BibText_LineAt(Outside.text, lost),
-                    "fields stand behind the end of their entry, which has a closing brace too "
-                    "many");
+        PackMessage(Sending, BTERR_LEXERR, LineAt(lost),
+                    "fields stand outside an entry: there is a closing brace too many before them");
 }
 
 // The lexer has come to the end of the text between two items.
 static void EndOutside(size_t end)
 {
-    BibSpan span = {Outside.start, std::max(Outside.start, end)};
-    span = BibText_TrimLines(Outside.text, span);
+    BibSpan span = BibText_TrimLines(Source.text, {Source.start, end});
     if (span.start == span.end)
         return;
     ReportLostFields(span);
-    Outside.kept.push_back(span);
+    Source.kept.push_back(span);
+}
+
+// How the item was opened of which the @ stands there.
+static int IsInBrackets(size_t at)
+{
+    const char *end = Source.text + Source.length;
+    const char *open =
+        std::find_if(Source.text + at, end, [](char c) { return c == '{' || c == '('; });
+    return open < end && *open == '(';
 }
 
 static void FollowMode(int mode)
 {
     // It counts the end of the file as well.
-    size_t read = std::min(static_cast<size_t>(zzendcol), Outside.length);
-    if (mode == LEXER_TOP && Outside.mode != LEXER_TOP)
-        Outside.start = read;
-    if (mode == LEXER_TOP && Outside.mode > LEXER_TOP)
-        Outside.inBrackets = Outside.text[read - 1] == ')';
-    if (mode != LEXER_TOP && Outside.mode == LEXER_TOP)
-        EndOutside(read - 1); // an @ was read
-    Outside.mode = mode;
+    size_t read = std::min(static_cast<size_t>(zzendcol), Source.length);
+    if (mode == LEXER_TOP && Source.mode != LEXER_TOP)
+        Source.start = read;
+    if (mode != LEXER_TOP && Source.mode == LEXER_TOP) { // an @ was read
+        EndOutside(read - 1);
+        Source.inBrackets = IsInBrackets(read - 1);
+    }
+    Source.mode = mode;
 }
 
 // What stands before an offset.
 static void PackOutside(BibItems *items, size_t offset)
 {
-    auto next = Outside.kept.begin();
-    for (; next != Outside.kept.end() && next->end <= offset; ++next) {
+    auto next = Source.kept.begin();
+    for (; next != Source.kept.end() && next->end <= offset; ++next) {
         BeginItem(items, BIB_ITEM_OUTSIDE, 0, 0);
         size_t start = BeginText(items);
-        Append(items, Outside.text + next->start, next->end - next->start);
+        Append(items, Source.text + next->start, next->end - next->start);
         EndText(items, start);
         EndItem(items);
     }
-    Outside.kept.erase(Outside.kept.begin(), next);
+    Source.kept.erase(Source.kept.begin(), next);
+}
+
+// The parser would miss an item in such a file.
+static void KeepAll()
+{
+    size_t words = BibText_FindWords(Source.text, {0, Source.length});
+    if (words < Source.length)
+        PackMessage(Sending, BTERR_LEXWARN, LineAt(words),
+                    "there is text in the file, but no item");
+    EndOutside(Source.length);
+    PackOutside(Sending, Source.length);
 }
 
 // --- Parsing ---
@@ -325,7 +353,8 @@ static void ReportMarks(const char *text, size_t length)
         mark = memchr(text, BIB_CLOSE_ABBREVIATION, length);
     if (!mark)
         return;
-    PackMessage(Sending, BTERR_LEXERR, BibText_LineAt(text, static_cast<const char *>(mark) - text),
+    size_t at = static_cast<const char *>(mark) - text;
+    PackMessage(Sending, BTERR_LEXERR, 1 + BibText_CountLines(text, {0, at}),
                 "control character 0x02 or 0x05, which marks abbreviations in this program");
 }
 
@@ -349,9 +378,9 @@ static BibEnd ParseAll(FILE *stream, const char *path)
         if (Sending->whole >= FLUSH_SIZE)
             Send(Sending);
     }
-    if (Outside.mode == LEXER_TOP)
-        EndOutside(Outside.length);
-    PackOutside(Sending, Outside.length);
+    if (Source.mode == LEXER_TOP)
+        EndOutside(Source.length);
+    PackOutside(Sending, Source.length);
     return feof(stream) ? BIB_END_OF_FILE : BIB_END_EARLY;
 }
 
@@ -371,11 +400,10 @@ void BibChild_Parse(void *argument)
     BeginItem(Sending, BIB_ITEM_FORM, 0, BibText_Form(text, length));
     EndItem(Sending);
     length = BibText_Normalise(text, length);
-    Outside.text = text;
-    Outside.length = length;
+    Source.text = text;
+    Source.length = length;
     if (BibText_HasNoItem(text, length)) {
-        EndOutside(length);
-        PackOutside(Sending, length);
+        KeepAll();
         Leave(BIB_END_OF_FILE);
     }
     FILE *stream = Sys_OpenText(text, length);
@@ -449,27 +477,28 @@ REPLACES_LIBRARY char *strlwr(char *text)
     return text;
 }
 
-// The library's own goes on with this, so it is called from here.
+// The library's own, which still have to do their work. Looked up before any child is started.
 template <class Function> static Function *Replaced(const char *name)
 {
     return reinterpret_cast<Function *>(Sys_ReplacedFunction(name));
 }
+static void (*const OriginalMode)(int) = Replaced<void(int)>("zzmode");
+static void (*const OriginalComment)() = Replaced<void()>("comment");
 
 // The lexer enters an item, a string in it, or leaves it.
 REPLACES_LIBRARY void zzmode(int mode)
 {
-    static void (*const original)(int) = Replaced<void(int)>("zzmode");
     if (Sending)
         FollowMode(mode);
-    original(mode);
+    OriginalMode(mode);
 }
 
 // A comment line, which the library drops.
 REPLACES_LIBRARY void comment()
 {
-    static void (*const original)() = Replaced<void()>("comment");
-    if (Sending && Outside.mode != LEXER_TOP)
-        PackMessage(Sending, BTERR_CONTENT, zzline,
-                    "a comment inside an entry is not kept when the file is saved");
-    original();
+    if (Sending && Source.mode != LEXER_TOP) {
+        BeginItem(Sending, BIB_ITEM_DROPPED, zzline, 0);
+        EndItem(Sending);
+    }
+    OriginalComment();
 }

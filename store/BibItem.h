@@ -17,6 +17,7 @@ enum BibItemKind {
     BIB_ITEM_PREAMBLE, // number: the pieces; the type, then each piece
     BIB_ITEM_COMMENT,  // number: the pieces; each piece
     BIB_ITEM_OUTSIDE,  // number: 0; text that stands before the next item, or at the end
+    BIB_ITEM_DROPPED,  // number: 0; a comment line inside an item; no text
     BIB_ITEM_FORM,     // number: BIB_FORM_ bits; no text
     BIB_ITEM_STRANGE,  // number: 0 when the parser did not know the kind; no text
     BIB_ITEM_END       // number: a BibEnd; no text

@@ -16,6 +16,8 @@
 
 int BibLoadSeconds = 10;
 
+enum { DROPPED_LISTED = 50 }; // warnings of a file up to which comments inside items are listed
+
 // --- Items to records ---
 
 // Reads the texts of one item, one after the other.
@@ -69,6 +71,7 @@ static int64_t TextCount(const BibItemHeader *header)
         return number < 0 ? -1 : 1 + number;
     case BIB_ITEM_COMMENT:
         return number < 0 ? -1 : number;
+    case BIB_ITEM_DROPPED:
     case BIB_ITEM_FORM:
     case BIB_ITEM_STRANGE:
     case BIB_ITEM_END:
@@ -178,7 +181,7 @@ static BibStored StoreEntry(BibFile *file, ItemReader reader)
     MoveCrossrefToFront(entry, crossref);
     entry->next = file->entries;
     file->entries = entry;
-    Outside_GiveTo(file, BIB_ENTRIES, entry);
+    Outside_GiveTo(file, BIB_BEFORE_ENTRY, entry);
     return BIB_STORED;
 }
 
@@ -203,7 +206,7 @@ static BibStored StoreStrings(BibFile *file, ItemReader reader)
         }
         string->next = file->strings;
         file->strings = string;
-        Outside_GiveTo(file, BIB_STRINGS, string);
+        Outside_GiveTo(file, BIB_BEFORE_STRING, string);
     }
     return BIB_STORED;
 }
@@ -265,9 +268,19 @@ static BibStored StoreComments(BibFile *file, ItemReader reader)
         AppLog("Comment: ", comment->text);
         comment->next = file->comments;
         file->comments = comment;
-        Outside_GiveTo(file, BIB_COMMENTS, comment);
+        Outside_GiveTo(file, BIB_BEFORE_COMMENT, comment);
     }
     return BIB_STORED;
+}
+
+// All are counted, but only the first ones are listed: what follows may be more important.
+static void ReportDropped(BibFile *file, int line)
+{
+    if (file->warningCount >= DROPPED_LISTED)
+        ++file->warningCount;
+    else
+        Bib_ReportMessage(nullptr, BTERR_CONTENT, file->path, line, nullptr, -1,
+                          "a comment inside an entry is not kept when the file is saved");
 }
 
 static BibStored StoreOutside(BibFile *file, ItemReader reader)
@@ -292,6 +305,9 @@ BibStored BibItem_Store(BibFile *file, const char *item)
         return StoreComments(file, reader);
     case BIB_ITEM_OUTSIDE:
         return StoreOutside(file, reader);
+    case BIB_ITEM_DROPPED:
+        ReportDropped(file, reader.header.line);
+        break;
     case BIB_ITEM_FORM:
         file->form = reader.header.number & BIB_FORM_ALL;
         break;
@@ -540,6 +556,7 @@ void Bib_FreeFile(BibFile *file)
         BibCurrentFile = nullptr;
     free(file->messages);
     Outside_Free(file);
+    free(file->origin);
     while (BibEntry *entry = file->entries) {
         file->entries = entry->next;
         Bib_FreeEntry(entry);

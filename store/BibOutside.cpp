@@ -6,14 +6,25 @@
 #include <cstdlib>
 #include <vector>
 
-BibOrigin *Bib_Origin(BibFile *file)
+BibOutside *Outside_First(const BibFile *file)
 {
-    if (file->origin)
-        return file->origin;
-    file->origin = static_cast<BibOrigin *>(Bib_Alloc(sizeof(BibOrigin)));
-    if (file->origin)
-        *file->origin = {};
-    return file->origin;
+    return file->origin ? file->origin->outside : nullptr;
+}
+
+void Outside_Free(BibFile *file)
+{
+    while (BibOutside *outside = Outside_First(file)) {
+        file->origin->outside = outside->next;
+        free(outside->text);
+        free(outside);
+    }
+}
+
+static void PlaceAt(BibOutside *outside, BibPlace place, const void *item, int piece)
+{
+    outside->place = place;
+    outside->item = item;
+    outside->piece = piece;
 }
 
 // --- While a file is loaded: the last text is at the head of the list ---
@@ -28,121 +39,98 @@ int Outside_Add(BibFile *file, const char *text, size_t length)
         free(copy);
         return 0;
     }
-    *outside = {origin->outside, BIB_END, nullptr, 0, copy};
+    *outside = {origin->outside, BIB_NO_PLACE, nullptr, 0, copy};
     origin->outside = outside;
     return 1;
 }
 
-static BibOutside *First(const BibFile *file)
+static void GiveTo(BibFile *file, BibPlace place, const void *item, int piece)
 {
-    return file->origin ? file->origin->outside : nullptr;
+    for (BibOutside *at = Outside_First(file); at && at->place == BIB_NO_PLACE; at = at->next)
+        PlaceAt(at, place, item, piece);
 }
 
-static void PlaceAt(BibOutside *outside, BibKind kind, const void *item, int piece)
+void Outside_GiveTo(BibFile *file, BibPlace place, const void *item)
 {
-    outside->kind = kind;
-    outside->item = item;
-    outside->piece = piece;
-}
-
-static void GiveTo(BibFile *file, BibKind kind, const void *item, int piece)
-{
-    for (BibOutside *at = First(file); at && at->kind == BIB_END; at = at->next)
-        PlaceAt(at, kind, item, piece);
-}
-
-void Outside_GiveTo(BibFile *file, BibKind kind, const void *item)
-{
-    GiveTo(file, kind, item, 0);
+    GiveTo(file, place, item, 0);
 }
 
 void Outside_GiveToPiece(BibFile *file, int piece)
 {
-    GiveTo(file, BIB_PIECES, nullptr, piece);
+    GiveTo(file, BIB_BEFORE_PIECE, nullptr, piece);
 }
 
-// Sorts by kind, in the order of the file.
 void Outside_Finish(BibFile *file)
 {
-    BibOutside *lists[BIB_KINDS] = {};
-    while (BibOutside *outside = First(file)) {
+    GiveTo(file, BIB_AT_END, nullptr, 0);
+    BibOutside *lists[BIB_PLACES] = {};
+    while (BibOutside *outside = Outside_First(file)) {
         file->origin->outside = outside->next;
-        outside->next = lists[outside->kind];
-        lists[outside->kind] = outside;
+        outside->next = lists[outside->place];
+        lists[outside->place] = outside;
     }
-    for (int kind = BIB_END; kind >= 0; --kind) {
-        BibOutside **end = &lists[kind];
+    for (int place = BIB_AT_END; place >= 0; --place) {
+        BibOutside **end = &lists[place];
         while (*end)
             end = &(*end)->next;
-        *end = First(file);
+        *end = Outside_First(file);
         if (file->origin)
-            file->origin->outside = lists[kind];
+            file->origin->outside = lists[place];
     }
-}
-
-void Outside_Free(BibFile *file)
-{
-    while (BibOutside *outside = First(file)) {
-        file->origin->outside = outside->next;
-        free(outside->text);
-        free(outside);
-    }
-    free(file->origin);
-    file->origin = nullptr;
 }
 
 // --- While it is edited ---
 //
-// What follows an item in the list is the text of the next one already, so that nothing has to be
-// moved there.
+// What follows an item's text in the list is that of the next one already, so that nothing has to
+// be moved when it is handed on.
 
-static void Relabel(const BibFile *file, BibKind fromKind, const void *from, BibKind kind,
+static void Relabel(const BibFile *file, BibPlace fromPlace, const void *from, BibPlace place,
                     const void *item)
 {
-    for (BibOutside *at = First(file); at; at = at->next)
-        if (at->kind == fromKind && at->item == from)
-            PlaceAt(at, kind, item, 0);
+    for (BibOutside *at = Outside_First(file); at; at = at->next)
+        if (at->place == fromPlace && at->item == from)
+            PlaceAt(at, place, item, 0);
 }
 
-static BibKind KindOfEntry(const BibEntry *entry) // what stands where there is none
+static BibPlace PlaceOf(const BibEntry *entry) // null: all entries are over
 {
-    return entry ? BIB_ENTRIES : BIB_END;
+    return entry ? BIB_BEFORE_ENTRY : BIB_AT_END;
 }
 
 void Outside_HandOnEntry(BibFile *file, const BibEntry *entry)
 {
-    Relabel(file, BIB_ENTRIES, entry, KindOfEntry(entry->next), entry->next);
+    Relabel(file, BIB_BEFORE_ENTRY, entry, PlaceOf(entry->next), entry->next);
 }
 
 void Outside_HandOnString(BibFile *file, const BibString *string)
 {
     if (string->next)
-        Relabel(file, BIB_STRINGS, string, BIB_STRINGS, string->next);
+        Relabel(file, BIB_BEFORE_STRING, string, BIB_BEFORE_STRING, string->next);
     else
-        Relabel(file, BIB_STRINGS, string, KindOfEntry(file->entries), file->entries);
+        Relabel(file, BIB_BEFORE_STRING, string, PlaceOf(file->entries), file->entries);
 }
 
 void Outside_MoveEntry(BibFile *file, const BibEntry *from, const BibEntry *to)
 {
-    Relabel(file, BIB_ENTRIES, from, BIB_ENTRIES, to);
+    Relabel(file, BIB_BEFORE_ENTRY, from, BIB_BEFORE_ENTRY, to);
 }
 
-// The text of a piece for which no place is left.
+// The text of a piece that no other one follows any more.
 static void HandOnPiece(const BibFile *file, BibOutside *outside)
 {
     if (file->strings)
-        PlaceAt(outside, BIB_STRINGS, file->strings, 0);
+        PlaceAt(outside, BIB_BEFORE_STRING, file->strings, 0);
     else
-        PlaceAt(outside, KindOfEntry(file->entries), file->entries, 0);
+        PlaceAt(outside, PlaceOf(file->entries), file->entries, 0);
 }
 
 static void Sort(BibFile *file)
 {
     std::vector<BibOutside *> all;
-    for (BibOutside *at = First(file); at; at = at->next)
+    for (BibOutside *at = Outside_First(file); at; at = at->next)
         all.push_back(at);
     std::stable_sort(all.begin(), all.end(), [](const BibOutside *a, const BibOutside *b) {
-        return a->kind != b->kind ? a->kind < b->kind : a->piece < b->piece;
+        return a->place != b->place ? a->place < b->place : a->piece < b->piece;
     });
     BibOutside **end = &file->origin->outside;
     for (BibOutside *outside : all) {
@@ -155,16 +143,16 @@ static void Sort(BibFile *file)
 // The pieces may have changed their order, too.
 void Outside_MovePieces(BibFile *file, const int *places, int count)
 {
-    if (!First(file))
+    if (!Outside_First(file))
         return;
-    for (BibOutside *at = First(file); at; at = at->next) {
-        if (at->kind != BIB_PIECES)
+    for (BibOutside *at = Outside_First(file); at; at = at->next) {
+        if (at->place != BIB_BEFORE_PIECE)
             continue;
         int piece = at->piece;
         while (piece < count && places[piece] < 0)
             ++piece;
         if (piece < count)
-            PlaceAt(at, BIB_PIECES, nullptr, places[piece]);
+            PlaceAt(at, BIB_BEFORE_PIECE, nullptr, places[piece]);
         else
             HandOnPiece(file, at);
     }

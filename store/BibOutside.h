@@ -6,8 +6,10 @@
 
 #include "store/BibStore.h"
 
-// The file's origin, which is made when there is none. Null when memory is out.
-BibOrigin *Bib_Origin(BibFile *file);
+// The first one; null for none. The list is in the order in which a save comes to the places.
+BibOutside *Outside_First(const BibFile *file);
+
+void Outside_Free(BibFile *file);
 
 // --- While a file is loaded ---
 
@@ -15,11 +17,11 @@ BibOrigin *Bib_Origin(BibFile *file);
 int Outside_Add(BibFile *file, const char *text, size_t length);
 
 // Gives it to an item: a record, or a piece of the preamble.
-void Outside_GiveTo(BibFile *file, BibKind kind, const void *item);
+void Outside_GiveTo(BibFile *file, BibPlace place, const void *item);
 void Outside_GiveToPiece(BibFile *file, int piece);
 
-void Outside_Finish(BibFile *file); // puts the list in order
-void Outside_Free(BibFile *file);
+// Puts the list in order; what no item has followed stands at the end of the file. Call once.
+void Outside_Finish(BibFile *file);
 
 // --- While it is edited ---
 

@@ -187,10 +187,10 @@ struct OutsideWriter {
     const BibOutside *next;
 };
 
-static int IsNext(const OutsideWriter *outside, BibKind kind, const void *item, int piece)
+static int IsNext(const OutsideWriter *outside, BibPlace place, const void *item, int piece)
 {
     const BibOutside *next = outside->next;
-    return next && next->kind == kind && next->item == item && next->piece == piece;
+    return next && next->place == place && next->item == item && next->piece == piece;
 }
 
 static void PutNext(OutsideWriter *outside)
@@ -200,17 +200,17 @@ static void PutNext(OutsideWriter *outside)
     outside->next = outside->next->next;
 }
 
-static void PutOutside(OutsideWriter *outside, BibKind kind, const void *item)
+static void PutOutside(OutsideWriter *outside, BibPlace place, const void *item)
 {
-    while (IsNext(outside, kind, item, 0))
+    while (IsNext(outside, place, item, 0))
         PutNext(outside);
 }
 
-// What is left when all items of the kind are written: nothing, unless an item was taken away
-// without a word.
-static void PutRest(OutsideWriter *outside, BibKind kind)
+// What is left up to a place when its items are written: at the end of the file the text there;
+// before, nothing, unless an item was taken away without a word.
+static void PutRest(OutsideWriter *outside, BibPlace place)
 {
-    while (outside->next && outside->next->kind <= kind)
+    while (outside->next && outside->next->place <= place)
         PutNext(outside);
 }
 
@@ -219,24 +219,24 @@ static void PutComments(OutsideWriter *outside, const BibComment *comment)
     Output *out = outside->out;
     int any = comment != nullptr;
     for (; comment; comment = comment->next) {
-        PutOutside(outside, BIB_COMMENTS, comment);
+        PutOutside(outside, BIB_BEFORE_COMMENT, comment);
         Put(out, "@COMMENT{");
         Put(out, comment->text);
         Put(out, "}\n");
     }
     if (any)
         Put(out, "\n");
-    PutRest(outside, BIB_COMMENTS);
+    PutRest(outside, BIB_BEFORE_COMMENT);
 }
 
 // Starts another item where text stands between two pieces: inside of one it would be lost.
 static void JoinPieces(OutsideWriter *outside, int piece)
 {
     Output *out = outside->out;
-    int isNew = IsNext(outside, BIB_PIECES, nullptr, piece);
+    int isNew = IsNext(outside, BIB_BEFORE_PIECE, nullptr, piece);
     if (piece > 0)
         Put(out, isNew ? " }\n\n" : "\n\t# ");
-    while (IsNext(outside, BIB_PIECES, nullptr, piece))
+    while (IsNext(outside, BIB_BEFORE_PIECE, nullptr, piece))
         PutNext(outside);
     if (piece == 0 || isNew)
         Put(out, "@PREAMBLE{");
@@ -260,7 +260,7 @@ static void PutPreamble(OutsideWriter *outside, const char *preamble)
     }
     if (piece > 0)
         Put(out, " }\n\n");
-    PutRest(outside, BIB_PIECES);
+    PutRest(outside, BIB_BEFORE_PIECE);
 }
 
 static void PutStrings(OutsideWriter *outside, const BibString *string)
@@ -268,7 +268,7 @@ static void PutStrings(OutsideWriter *outside, const BibString *string)
     Output *out = outside->out;
     int any = string != nullptr;
     for (; string; string = string->next) {
-        PutOutside(outside, BIB_STRINGS, string);
+        PutOutside(outside, BIB_BEFORE_STRING, string);
         Put(out, "@STRING{");
         Put(out, string->name);
         Put(out, " = ");
@@ -277,7 +277,7 @@ static void PutStrings(OutsideWriter *outside, const BibString *string)
     }
     if (any)
         Put(out, "\n");
-    PutRest(outside, BIB_STRINGS);
+    PutRest(outside, BIB_BEFORE_STRING);
 }
 
 // A key without the comma after it is a syntax error to the parser: the file would be read-only
@@ -300,17 +300,17 @@ static void PutEntry(Output *out, const BibEntry *entry)
 static void WriteContents(const BibFile *file, FILE *stream)
 {
     Output *out = StartOutput(stream, file->form & BIB_FORM_CRLF);
-    OutsideWriter outside = {out, file->origin ? file->origin->outside : nullptr};
+    OutsideWriter outside = {out, Outside_First(file)};
     if (file->form & BIB_FORM_MARK)
         Put(out, BIB_BYTE_ORDER_MARK);
     PutComments(&outside, file->comments);
     PutPreamble(&outside, file->preamble);
     PutStrings(&outside, file->strings);
     for (const BibEntry *entry = file->entries; entry; entry = entry->next) {
-        PutOutside(&outside, BIB_ENTRIES, entry);
+        PutOutside(&outside, BIB_BEFORE_ENTRY, entry);
         PutEntry(out, entry);
     }
-    PutRest(&outside, BIB_END);
+    PutRest(&outside, BIB_AT_END);
     Flush(out);
 }
 

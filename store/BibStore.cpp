@@ -173,31 +173,6 @@ BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName, con
     return entry;
 }
 
-static int IsUtf8(const char *text)
-{
-    return Enc_IsUtf8(text, strlen(text));
-}
-
-static int IsEntryUtf8(const BibEntry *entry)
-{
-    int isUtf8 = IsUtf8(entry->key) && IsUtf8(BibTypeTable[entry->type]);
-    for (int i = 0; isUtf8 && i < entry->fieldCount; ++i)
-        isUtf8 = IsUtf8(BibFieldTable[entry->fields[i].name]) && IsUtf8(entry->fields[i].value);
-    return isUtf8;
-}
-
-// The rest of a file can't be edited.
-void Bib_UpdateForm(BibFile *file)
-{
-    int isUtf8 = IsUtf8(file->preamble);
-    for (const BibString *string = file->strings; isUtf8 && string; string = string->next)
-        isUtf8 = IsUtf8(string->name) && IsUtf8(string->value);
-    for (const BibEntry *entry = file->entries; isUtf8 && entry; entry = entry->next)
-        isUtf8 = IsEntryUtf8(entry);
-    if (!isUtf8)
-        file->form |= BIB_FORM_CODE_PAGE;
-}
-
 void Bib_FreeEntry(BibEntry *entry)
 {
     for (int i = 0; i < entry->fieldCount; ++i)
@@ -249,4 +224,45 @@ int Bib_EntryContains(const BibEntry *entry, const char *text)
         if (ValueContains(entry->fields[i].value, text, length, text[0], OtherCase(text[0])))
             return 1;
     return 0;
+}
+
+// --- Files ---
+
+const EncodingRecord *Bib_Encoding(const BibFile *file)
+{
+    return Enc_For(!(file->form & BIB_FORM_CODE_PAGE));
+}
+
+BibOrigin *Bib_Origin(BibFile *file)
+{
+    if (file->origin)
+        return file->origin;
+    file->origin = static_cast<BibOrigin *>(Bib_Alloc(sizeof(BibOrigin)));
+    if (file->origin)
+        *file->origin = {};
+    return file->origin;
+}
+
+static int IsUtf8(const char *text)
+{
+    return Enc_IsUtf8(text, strlen(text));
+}
+
+static int IsEntryUtf8(const BibEntry *entry)
+{
+    int isUtf8 = IsUtf8(entry->key) && IsUtf8(BibTypeTable[entry->type]);
+    for (int i = 0; isUtf8 && i < entry->fieldCount; ++i)
+        isUtf8 = IsUtf8(BibFieldTable[entry->fields[i].name]) && IsUtf8(entry->fields[i].value);
+    return isUtf8;
+}
+
+void Bib_UpdateForm(BibFile *file)
+{
+    int isUtf8 = IsUtf8(file->preamble);
+    for (const BibString *string = file->strings; isUtf8 && string; string = string->next)
+        isUtf8 = IsUtf8(string->name) && IsUtf8(string->value);
+    for (const BibEntry *entry = file->entries; isUtf8 && entry; entry = entry->next)
+        isUtf8 = IsEntryUtf8(entry);
+    if (!isUtf8)
+        file->form |= BIB_FORM_CODE_PAGE;
 }

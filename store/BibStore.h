@@ -2,7 +2,7 @@
 //
 // A BibFile owns its lists, every record in them and every string they point to;
 // records are malloc'd and freed one by one. All text is 8-bit, NUL-terminated, in
-// the encoding of its file (Enc_OfFile in encoding/Encoding.h).
+// the encoding of its file (Bib_Encoding in encoding/Encoding.h).
 //
 // A value is the concatenation of the pieces of a BibTeX value: a quoted or braced
 // string stands as its inner text, a number as its digits, and an abbreviation as
@@ -16,7 +16,8 @@
 #include <cstdint>
 #include <cstdio>
 
-struct _ast; // one parsed item of the parser library
+struct EncodingRecord; // encoding/Encoding.h
+struct _ast;           // one parsed item of the parser library
 
 enum {
     BIB_TYPE_LIMIT = 128,      // slots of BibTypeTable
@@ -87,22 +88,32 @@ struct BibFile {
     struct BibOrigin *origin;         // heap; null when nothing is known
 };
 
-enum BibKind { BIB_COMMENTS, BIB_PIECES, BIB_STRINGS, BIB_ENTRIES, BIB_END, BIB_KINDS };
+// Where a text between the items stands, in the order in which a save writes them.
+enum BibPlace {
+    BIB_BEFORE_COMMENT,
+    BIB_BEFORE_PIECE, // of the preamble
+    BIB_BEFORE_STRING,
+    BIB_BEFORE_ENTRY,
+    BIB_AT_END,
+    BIB_PLACES,
+    BIB_NO_PLACE = BIB_PLACES // the item that follows is not loaded yet
+};
 
 // Text that stood between the items of a file: comment lines, and whatever else is no item. It
-// belongs to the item that followed it, the text at the end of the file to none (BIB_END).
+// belongs to the item that followed it.
 struct BibOutside {
     BibOutside *next;
-    BibKind kind;     // of the item
+    BibPlace place;
     const void *item; // the BibComment, BibString or BibEntry; else null
     int piece;        // index of the piece of the preamble; else 0
     char *text;       // heap: lines, the last one without its end
 };
 
-// What a save needs to know of the file on the disk, besides its records.
+// What a save needs to know of the file on the disk, besides its records. A block of its own, as
+// other code relies on the size of BibFile.
 struct BibOrigin {
     uint64_t stamp;      // Sys_FileStamp of what was loaded or saved last
-    BibOutside *outside; // in the order in which a save writes the items
+    BibOutside *outside; // see BibOutside.h
 };
 
 // Process-wide name tables: shared by all files, they only grow.
@@ -141,7 +152,8 @@ BibEntry *Bib_AllocEntry(int fieldCount);
 BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName, const char *fieldSpecs,
                        int allFields);
 
-// Frees the field values, the key and the block. Unlink the entry first.
+// Frees the field values, the key and the block. Unlink the entry first, and before that say so in
+// BibOutside.h: text may belong to it.
 void Bib_FreeEntry(BibEntry *entry);
 
 // The slot of the entry's first field of this name, ignoring case; -1 for none.
@@ -165,8 +177,17 @@ char *Bib_CopyText(const char *text, size_t length); // adds the NUL
 // the path cannot be opened or is no regular file. Takes no lock.
 BibFile *Bib_LoadFile(const char *path);
 
-// Looks at the texts of a file once more: edited in a code page, they may be no UTF-8 any more.
+// The encoding of a file's texts: the selected one; while that is UTF-8, what the file was found to
+// be.
+const EncodingRecord *Bib_Encoding(const BibFile *file);
+
+// Looks at the texts once more that can be edited: in a code page, the file may have got some that
+// are no UTF-8. Never takes a file for UTF-8 that was not: comments and text between the items are
+// not looked at.
 void Bib_UpdateForm(BibFile *file);
+
+// The file's origin, which is made when there is none. Null when memory is out.
+BibOrigin *Bib_Origin(BibFile *file);
 
 // Frees the record with all it owns. Close `stream` and release `lockHandle` first.
 void Bib_FreeFile(BibFile *file);

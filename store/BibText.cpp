@@ -3,7 +3,9 @@
 #include "store/BibText.h"
 
 #include <algorithm>
+#include <cctype>
 #include <cstring>
+#include <string>
 
 #include "encoding/Encoding.h"
 #include "store/BibStore.h"
@@ -76,83 +78,131 @@ size_t BibText_Normalise(char *text, size_t length)
 
 // --- Lines ---
 
+static const char Blanks[] = " \t\n\v\f";
+
 static int IsBlank(char c)
 {
-    return memchr(" \t\n\v\f", c, 5) != nullptr;
+    return memchr(Blanks, c, sizeof Blanks - 1) != nullptr;
 }
 
-int BibText_LineAt(const char *text, size_t at)
+int BibText_CountLines(const char *text, BibSpan span)
 {
-    return 1 + static_cast<int>(std::count(text, text + at, '\n'));
+    return static_cast<int>(std::count(text + span.start, text + span.end, '\n'));
+}
+
+// Behind blanks and byte order marks: those stand in the middle of files that were put together.
+static size_t SkipStart(const char *text, BibSpan span)
+{
+    size_t at = span.start;
+    for (size_t before = span.end; at != before;) {
+        before = at;
+        while (at < span.end && IsBlank(text[at]))
+            ++at;
+        if (HasMark(text + at, span.end - at))
+            at += MARK_SIZE;
+    }
+    return at;
 }
 
 BibSpan BibText_TrimLines(const char *text, BibSpan span)
 {
-    size_t first = span.start, last = span.end;
-    while (first < span.end && IsBlank(text[first]))
-        ++first;
+    size_t first = SkipStart(text, span), last = span.end;
     while (last > first && IsBlank(text[last - 1]))
         --last;
     if (first == last)
         return {first, first};
-    while (first > span.start && text[first - 1] != '\n')
+    while (first > span.start && IsBlank(text[first - 1]) && text[first - 1] != '\n')
         --first;
     while (last < span.end && text[last] != '\n')
         ++last;
     return {first, last};
 }
 
-// --- Comments and lost fields ---
+// --- Comments ---
 
-// The parser takes a % for the start of a comment only where a word could start.
-static int StartsComment(const char *text, BibSpan span, size_t at)
+// The end of the comment line that starts here; `at` when none does. The parser takes a % for the
+// start of one only where a word could start.
+static size_t CommentEnd(const char *text, BibSpan span, size_t at)
 {
-    return text[at] == '%' && (at == span.start || memchr(" \t\n", text[at - 1], 3));
+    bool starts = text[at] == '%' && (at == span.start || memchr(" \t\n", text[at - 1], 3));
+    return starts ? std::find(text + at, text + span.end, '\n') - text : at;
 }
 
 int BibText_HasNoItem(const char *text, size_t length)
 {
-    int inComment = 0;
     for (size_t at = 0; at < length; ++at) {
-        inComment = text[at] != '\n' && (inComment || StartsComment(text, {0, length}, at));
-        if (!inComment && !IsBlank(text[at]))
+        at = CommentEnd(text, {0, length}, at);
+        if (at < length && text[at] == '@')
             return 0;
     }
     return 1;
 }
 
-static int FollowsName(const char *text, BibSpan span, size_t at)
+size_t BibText_FindWords(const char *text, BibSpan span)
 {
-    while (at > span.start && IsBlank(text[at - 1]))
-        --at;
-    if (at == span.start)
-        return 0;
-    const char last[] = {text[at - 1], 0};
-    return Bib_IsKey(last);
-}
-
-// With either braces or brackets. What is commented out counts for them, but nothing else: it may
-// be the first line of an entry.
-static size_t FindFieldsBefore(char close, char open, const char *text, BibSpan span)
-{
-    size_t found = span.end;
-    int depth = 0, inComment = 0;
     for (size_t at = span.start; at < span.end; ++at) {
-        inComment = text[at] != '\n' && (inComment || StartsComment(text, span, at));
-        if (text[at] == open)
-            ++depth;
-        else if (text[at] == close && depth > 0)
-            --depth;
-        else if (text[at] == close && !inComment && found < span.end)
-            return found;
-        else if (text[at] == '=' && depth == 0 && !inComment && FollowsName(text, span, at))
-            found = std::min(found, at);
+        at = CommentEnd(text, span, at);
+        if (at < span.end && !IsBlank(text[at]))
+            return at;
     }
     return span.end;
 }
 
+// --- Lost fields ---
+
+// With blanks for comments. One with an @ leaves its braces: most likely it is the first or the
+// last line of an item that is commented out.
+static std::string WithoutComments(const char *text, BibSpan span)
+{
+    std::string plain(text + span.start, text + span.end);
+    for (size_t at = span.start; at < span.end; ++at) {
+        size_t end = CommentEnd(text, span, at);
+        bool isItem = std::find(text + at, text + end, '@') != text + end;
+        for (; at < end; ++at)
+            if (!isItem || !strchr("{}()", text[at]))
+                plain[at - span.start] = ' ';
+    }
+    return plain;
+}
+
+static bool IsNameCharacter(char c)
+{
+    return isalnum(static_cast<unsigned char>(c)) || c == '-' || c == '_';
+}
+
+// Whether a field begins at `at`, or behind blanks there.
+static bool IsField(const std::string &text, size_t at)
+{
+    auto skip = [&](auto belongs) {
+        size_t start = at;
+        while (at < text.size() && belongs(text[at]))
+            ++at;
+        return at > start;
+    };
+    skip(IsBlank);
+    bool hasName = skip(IsNameCharacter);
+    skip(IsBlank);
+    return hasName && at < text.size() && text[at] == '=';
+}
+
+// A field begins behind the brace that came too early, or behind a comma. There was one when a
+// comma follows that brace, or when a brace comes that was to end the entry.
 size_t BibText_FindLostFields(const char *text, BibSpan span, int inBrackets)
 {
-    size_t found = FindFieldsBefore('}', '{', text, span);
-    return inBrackets ? std::min(found, FindFieldsBefore(')', '(', text, span)) : found;
+    const std::string plain = WithoutComments(text, span);
+    const size_t begin = std::min(plain.find_first_not_of(std::string(Blanks) + "}"), plain.size());
+    size_t found = plain.size();
+    bool isLost = plain[begin] == ',';
+    int braces = 0, brackets = 0;
+    for (size_t at = begin; at < plain.size() && !(isLost && found < plain.size()); ++at) {
+        char c = plain[at];
+        bool mayBegin = at == begin || plain[at - 1] == ',';
+        if (mayBegin && braces == 0 && found == plain.size() && IsField(plain, at))
+            found = plain.find_first_not_of(Blanks, at);
+        bool isEnd = (c == '}' && braces == 0) || (c == ')' && brackets == 0 && inBrackets);
+        isLost = isLost || (isEnd && found < plain.size());
+        braces += (c == '{') - (c == '}' && braces > 0);
+        brackets += (c == '(') - (c == ')' && brackets > 0);
+    }
+    return isLost ? span.start + found : span.end;
 }

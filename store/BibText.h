@@ -17,16 +17,18 @@ size_t BibText_Normalise(char *text, size_t length);
 
 // --- Of normalised text ---
 
-int BibText_LineAt(const char *text, size_t at); // from 1 on
+int BibText_CountLines(const char *text, BibSpan span); // line ends
 
-// The lines from the first to the last that holds more than blanks; the last one without its end.
-// Empty when none does.
+// The lines from the first to the last that holds more than blanks, without a byte order mark
+// before them; the last one without its end. Empty when none does.
 BibSpan BibText_TrimLines(const char *text, BibSpan span);
 
-// Blanks and comment lines are all there is: the parser would miss an item.
+// There is no @ outside of comment lines: the parser would miss an item.
 int BibText_HasNoItem(const char *text, size_t length);
 
-// Where the fields begin that an entry lost to a closing brace too many, in the text behind its
-// end: they stand before the brace that was to end it. The end of the span for none. With
-// `inBrackets` that may be a bracket, as in @article(...).
+// Text outside the items that is no comment; the end of the span for none.
+size_t BibText_FindWords(const char *text, BibSpan span);
+
+// Where the fields stand that an entry lost to a closing brace too many, in the text behind it; the
+// end of the span for none. With `inBrackets` it was to end with a bracket, as @article(...) does.
 size_t BibText_FindLostFields(const char *text, BibSpan span, int inBrackets);

@@ -64,10 +64,11 @@ TEST(BibTextNormalise, MakesPlainLines)
     EXPECT_EQ("\n", Normalised("\xEF\xBB\xBF\n"));
 }
 
-TEST(BibTextLineAt, CountsFromOne)
+TEST(BibTextCountLines, CountsTheirEnds)
 {
-    EXPECT_EQ(1, BibText_LineAt("a\nb", 1));
-    EXPECT_EQ(2, BibText_LineAt("a\nb", 2));
+    EXPECT_EQ(0, BibText_CountLines("a\nb\n", {0, 1}));
+    EXPECT_EQ(1, BibText_CountLines("a\nb\n", {0, 2}));
+    EXPECT_EQ(1, BibText_CountLines("a\nb\n", {2, 4}));
 }
 
 TEST(BibTextTrimLines, LeavesTheLinesThatHoldMoreThanBlanks)
@@ -80,30 +81,56 @@ TEST(BibTextTrimLines, LeavesTheLinesThatHoldMoreThanBlanks)
     EXPECT_EQ(" b \n\n c", Trimmed(" \n b \n\n c\n"));
 }
 
-TEST(BibTextHasNoItem, IsTrueForBlanksAndCommentLines)
+TEST(BibTextTrimLines, DropsMarksAtTheStart)
 {
-    for (const std::string text : {"", "\n \t\n", "% a\n", "  % a @b{\n\n\t%%\n"})
+    EXPECT_EQ("", Trimmed("\xEF\xBB\xBF"));
+    EXPECT_EQ(" b \xEF\xBB\xBF", Trimmed("\n\xEF\xBB\xBF\n\xEF\xBB\xBF b \xEF\xBB\xBF\n"));
+}
+
+TEST(BibTextHasNoItem, LooksForTheSignOutsideComments)
+{
+    for (const std::string text : {"", "\n \t\n", "% a\n", "a %\n", "  % a @b{\n\n\t%%\n"})
         EXPECT_TRUE(BibText_HasNoItem(text.data(), text.size())) << text;
-    for (const std::string text : {"a", "% a\n@\n", "\f% a\nb", "a %\n"})
+    for (const std::string text : {"@", "% a\n@\n", "a%@\n", "a% @\n", "% a\nb@"})
         EXPECT_FALSE(BibText_HasNoItem(text.data(), text.size())) << text;
 }
 
-TEST(BibTextFindLostFields, FindsFieldsBeforeAClosingBrace)
+TEST(BibTextFindWords, SkipsCommentsAndBlanks)
 {
-    EXPECT_EQ("= 1 }", LostFields(", year = 1 }"));
-    EXPECT_EQ("={1}}", LostFields("\nyear={1}}"));
-    EXPECT_EQ("= 1 % }\n}", LostFields("} year\n= 1 % }\n}"));
-    EXPECT_EQ("= 1, b = 2}", LostFields("a = 1, b = 2}"));
-    EXPECT_EQ("= 1)", LostFields("year = 1)", true));
-    EXPECT_EQ("= (1))", LostFields("year = (1))", true));
-    EXPECT_EQ("= 1 (}", LostFields("year = 1 (}", true));
+    auto words = [](const std::string &text) {
+        return text.substr(BibText_FindWords(text.data(), {0, text.size()}));
+    };
+    EXPECT_EQ("", words(" \n% a\n\t%b"));
+    EXPECT_EQ("c % d", words("% a\n c % d"));
+    EXPECT_EQ("a%b", words("\na%b"));
+}
+
+TEST(BibTextFindLostFields, FindsFieldsBeforeTheBraceThatWasToEndTheEntry)
+{
+    EXPECT_EQ("year = 1 }", LostFields(" year = 1 }"));
+    EXPECT_EQ("year={1}}", LostFields("}\nyear={1}}"));
+    EXPECT_EQ("a = 1, b = 2}", LostFields("a = 1, b = 2}"));
+    EXPECT_EQ("b = 2 }", LostFields("a, b = 2 }"));
+    EXPECT_EQ("year = 1)", LostFields("year = 1)", true));
+    EXPECT_EQ("year = (1))", LostFields("year = (1))", true));
+    EXPECT_EQ("year = 1 (}", LostFields("year = 1 (}", true));
+}
+
+TEST(BibTextFindLostFields, FindsFieldsBehindACommaThatFollowsTheEntry)
+{
+    EXPECT_EQ("year = 1", LostFields(",\nyear = 1"));
+    EXPECT_EQ("year\n= 1", LostFields("}\n, % a = b\nyear\n= 1"));
+    EXPECT_EQ("year = { }", LostFields(", {a, b = 1}, year = { }"));
+    EXPECT_EQ("year = \"}\"", LostFields("}}, year = \"}\""));
 }
 
 TEST(BibTextFindLostFields, FindsNoneElsewhere)
 {
-    for (const char *text : {"", "}", "} year = 1", "year = 1", "= }", "{a = 1}", "% a = 1\n}",
-                             "% {\na = 1\n}", "a = 1 % }", "a = 1)", "\n =}"})
+    for (const char *text :
+         {"", "}", "} year = 1", "year = 1", "= }", "{a = 1}", "% a = 1\n}", "% @b{\na = 1\n}",
+          "a = 1 % }", "a = 1)", "\n =}", ",", "},\n", ", year", ", and year = 1",
+          "http://a.b/c?d=e\n}", "=Part A=\n}", "Part A = B\n}", "misc{l, x = {y}}"})
         EXPECT_EQ("", LostFields(text)) << text;
-    for (const char *text : {"(year = 1)", ")", ") year = 1", "% (\na = 1\n)"})
+    for (const char *text : {"(year = 1)", ")", ") year = 1", "% @b(\na = 1\n)"})
         EXPECT_EQ("", LostFields(text, true)) << text;
 }

@@ -839,8 +839,9 @@ TEST_F(CommandProcess, SelectsTheEncodingOfOptionE)
     EXPECT_STREQ("CP1251", Enc_Current()->name);
     EXPECT_EQ(1, Run("-eUTF-8").errors);
     EXPECT_STREQ("CP1251", Enc_Current()->name);
-    EXPECT_EQ("ERROR: There is no code page 'UTF-8', CP1251 stays selected (CP65001 is UTF-8)\n",
-              LoadErrors());
+    EXPECT_EQ(
+        "ERROR: There is no code page 'UTF-8' (UTF-8 is called CP65001), CP1251 stays selected\n",
+        LoadErrors());
     EXPECT_EQ(1, Logged("Cartulo: ERROR: Can't select unknown encoding: UTF-8"));
 }
 
@@ -849,10 +850,10 @@ TEST_F(CommandProcess, SelectsUtf8ForTheFilesThatAreUtf8)
     Write("a.bib", "@misc{a, x = {\xC3\xBC}}\n");
     Write("b.bib", "@misc{b, x = {\xFC}}\n");
     EXPECT_EQ(0, Run("-eCP65001 a b").errors);
-    EXPECT_EQ(&EncodingUtf8, Enc_OfFile(set.files[0]));
-    EXPECT_STREQ("CP1252", Enc_OfFile(set.files[1])->name);
+    EXPECT_EQ(&EncodingUtf8, Bib_Encoding(set.files[0]));
+    EXPECT_STREQ("CP1252", Bib_Encoding(set.files[1])->name);
     Run("-eCP1251 a b");
-    EXPECT_STREQ("CP1251", Enc_OfFile(set.files[0])->name);
+    EXPECT_STREQ("CP1251", Bib_Encoding(set.files[0])->name);
 }
 
 // Else it would be read as bytes that are no UTF-8, and written like that.
@@ -865,8 +866,8 @@ TEST_F(CommandProcess, TakesAFileForUtf8NoMoreWhenItWasEditedInACodePage)
     value[0] = '\xFC';
     value[1] = 0;
     Run("-eCP65001 a b");
-    EXPECT_STREQ("CP1252", Enc_OfFile(set.files[0])->name);
-    EXPECT_EQ(&EncodingUtf8, Enc_OfFile(set.files[1]));
+    EXPECT_STREQ("CP1252", Bib_Encoding(set.files[0])->name);
+    EXPECT_EQ(&EncodingUtf8, Bib_Encoding(set.files[1]));
 }
 
 TEST_F(CommandProcess, TakesFilesOffTheListAtOptionIWithoutClosingThem)

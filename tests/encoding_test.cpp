@@ -528,11 +528,11 @@ TEST_F(EncUtf8, IsTheEncodingOfEachFileThatWasFoundSo)
 {
     BibFile utf8 = {}, other = {};
     other.form = BIB_FORM_CODE_PAGE | BIB_FORM_CRLF;
-    EXPECT_EQ(&EncodingUtf8, Enc_OfFile(&utf8));
-    EXPECT_EQ(Row("CP1252"), Enc_OfFile(&other));
+    EXPECT_EQ(&EncodingUtf8, Bib_Encoding(&utf8));
+    EXPECT_EQ(Row("CP1252"), Bib_Encoding(&other));
     Enc_Select("CP1251");
-    EXPECT_EQ(Row("CP1251"), Enc_OfFile(&utf8));
-    EXPECT_EQ(Row("CP1251"), Enc_OfFile(&other));
+    EXPECT_EQ(Row("CP1251"), Bib_Encoding(&utf8));
+    EXPECT_EQ(Row("CP1251"), Bib_Encoding(&other));
 }
 
 TEST_F(EncUtf8, IsTheEncodingOfATextThatIsValid)

@@ -405,7 +405,7 @@ TEST_F(EntryKeys, AreComparedAcrossEncodings)
     BibFile *utf8 = Open("a.bib", "@misc{M\xC3\xBCller,}\n");
     BibFile *other = Open("b.bib", "@misc{\xD6sterreich,}\n");
     auto check = [this](const wchar_t *key, const BibFile *target) {
-        return Entry_CheckNewKey(&set, target, Key_Read(key, Enc_OfFile(target)));
+        return Entry_CheckNewKey(&set, target, Key_Read(key, Bib_Encoding(target)));
     };
     EXPECT_EQ(KEY_TAKEN_ELSEWHERE, check(L"m\u00FCller", other));
     EXPECT_EQ(KEY_TAKEN, check(L"m\u00FCller", utf8));
@@ -415,19 +415,66 @@ TEST_F(EntryKeys, AreComparedAcrossEncodings)
     EXPECT_EQ(KEY_OK, check(L"Muller", other));
 }
 
+TEST_F(EntryKeys, AreComparedWithoutTheLettersThatAnEncodingLacks)
+{
+    Enc_Select("CP65001");
+    BibFile *utf8 = Open("a.bib", "@misc{a,}\n");
+    Open("b.bib", "@misc{\xFF,}\n");
+    EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, utf8, Key_Read(L"\u0416", &EncodingUtf8)));
+    EXPECT_EQ(KEY_TAKEN_ELSEWHERE,
+              Entry_CheckNewKey(&set, utf8, Key_Read(L"\u00FF", &EncodingUtf8)));
+}
+
 TEST_F(NewEntry, HasNamesInTheEncodingOfItsFile)
 {
     Enc_Select("CP65001");
     BibFile *utf8 = Open("a.bib", "@misc{a,}\n");
     BibFile *other = Open("b.bib", "@misc{b, x = {\xFC}}\n");
+    const char name[] = "B\xC3\xBC"
+                        "cher";
+    const char specs[] = "t\xC3\xADtulo=*\0year=*\0";
+    EntryType type = Entry_TypeFor(utf8, name, specs);
+    EXPECT_EQ(name, type.name);
+    EXPECT_EQ(std::string(specs, sizeof specs), type.specs);
+    type = Entry_TypeFor(other, name, specs);
+    EXPECT_EQ("B\xFC"
+              "cher",
+              type.name);
+    EXPECT_EQ(std::string("t\xEDtulo=*\0year=*\0\0", 17), type.specs);
+    EXPECT_EQ("", type.reason);
+}
+
+TEST_F(NewEntry, IsRefusedForNamesThatItsFileCannotHave)
+{
+    Enc_Select("CP65001");
+    BibFile *utf8 = Open("a.bib", "@misc{a,}\n");
+    BibFile *other = Open("b.bib", "@misc{b, x = {\xFC}}\n");
+    for (auto [name, specs] : {std::pair("\xD0\x96", "\0"), std::pair("misc", "\xD0\x96=*\0")}) {
+        EXPECT_EQ("", Entry_TypeFor(utf8, name, specs).reason) << name;
+        EXPECT_EQ("The type or one of its fields has letters that can't be stored in CP1252.",
+                  Entry_TypeFor(other, name, specs).reason)
+            << name;
+    }
+    EXPECT_EQ("There is no type for the entry: the list of entry types can't be found.",
+              Entry_TypeFor(utf8, "", "").reason);
+}
+
+TEST_F(EntryKeys, ShareTypesThatTheirFilesCanHave)
+{
+    Enc_Select("CP65001");
+    BibFile *utf8 = Open("a.bib", "@misc{a,}\n");
+    BibFile *other = Open("b.bib", "@gr\xF6\xDF{b, x = {\xFC}}\n");
     int type = Bib_TypeIndex("B\xC3\xBC"
                              "cher");
-    EXPECT_EQ(type, Entry_TypeFor(utf8, type));
+    EXPECT_EQ(type, Entry_TypeIn(utf8, type));
     EXPECT_STREQ("B\xFC"
                  "cher",
-                 BibTypeTable[Entry_TypeFor(other, type)]);
-    EXPECT_EQ(type, Entry_TypeFor(utf8, Entry_TypeFor(other, type)));
-    const char specs[] = "t\xC3\xADtulo=*\0year=*\0";
-    EXPECT_EQ(std::string(specs, sizeof specs), Entry_SpecsFor(utf8, specs));
-    EXPECT_EQ(std::string("t\xEDtulo=*\0year=*\0\0", 17), Entry_SpecsFor(other, specs));
+                 BibTypeTable[Entry_TypeIn(other, type)]);
+    EXPECT_EQ(type, Entry_TypeIn(utf8, Entry_TypeIn(other, type)));
+    EXPECT_EQ(-1, Entry_TypeIn(other, Bib_TypeIndex("\xD0\x96")));
+    while (BibTypeCount < BIB_TYPE_LIMIT)
+        Bib_TypeIndex(("T" + std::to_string(BibTypeCount)).c_str());
+    int foreign = other->entries->type;
+    EXPECT_EQ(foreign, Entry_TypeIn(other, foreign));
+    EXPECT_EQ(-1, Entry_TypeIn(utf8, foreign));
 }

@@ -73,10 +73,11 @@ TEST_F(SchemaFile, TellsOfAnEncodingThatIsNotKnown)
     std::string ini = folder.Write("a.ini", "[Preamble]\nEncoding=UTF-8\n");
     EXPECT_EQ(0, Schema_SelectEncoding(ini.c_str(), &set));
     EXPECT_STREQ("CP1252", Enc_Current()->name);
-    EXPECT_EQ("ERROR: The file '" + ini +
-                  "' names the encoding 'UTF-8', which is not known; CP1252 stays selected "
-                  "(CP65001 is UTF-8)\n",
-              std::string(set.loadErrors));
+    EXPECT_EQ(
+        "ERROR: The file '" + ini +
+            "' names the encoding 'UTF-8', which is not known (UTF-8 is called CP65001); CP1252 "
+            "stays selected\n",
+        std::string(set.loadErrors));
     FileSet_Free(&set);
 }
 

@@ -440,7 +440,7 @@ void Cartulo::OpenFile(const std::string &path)
 
 const EncodingRecord *Cartulo::Encoding() const
 {
-    return Enc_OfFile(m_set.files[m_file]);
+    return Bib_Encoding(m_set.files[m_file]);
 }
 
 wxString Cartulo::EncodingText() const
@@ -601,7 +601,8 @@ void Cartulo::OnSearch(wxCommandEvent &event)
     }
     m_searchText = field->GetValue().ToStdWstring();
     m_search = Value_Read(m_searchText, Enc_Current());
-    TNSMessage("INFO: Cartulo::OnSearch ", field->GetValue().utf8_str(), TNS_ACTION);
+    wxString text = StoreText(m_search.c_str(), Enc_Current());
+    TNSMessage("INFO: Cartulo::OnSearch ", text.utf8_str(), TNS_ACTION);
     m_list->Update_Index(m_entry, m_search.c_str());
     bool found = m_list->GetItemCount() > 0 || m_search.empty();
     ShowStatus(this, found ? "" : "No entry holds this text.");

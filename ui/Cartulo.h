@@ -124,7 +124,7 @@ private:
     void CommitEntry();
     bool Commit();
     int Ask(const wxString &text, int buttons);
-    int ChosenType() const;
+    bool TakeType(int *type);
     bool AcceptLosses();
     bool CheckRows();
     bool ReplaceEntry(int type);

@@ -401,32 +401,36 @@ bool Cartulo::FinishEditing()
     return !m_editMode;
 }
 
-int Cartulo::ChosenType() const
-{
-    int type = TypeChoice_Type(m_type);
-    if (type < 0 || type == m_entry->type)
-        return m_entry->type;
-    return Entry_TypeFor(m_set.files[m_file], type);
-}
-
 // Takes the edits over or drops them, as the user says. False when the editing goes on.
 bool Cartulo::Commit()
 {
     if (!m_entry || !m_editMode || m_set.files[m_file]->readOnly)
         return true;
     ReadRows();
-    int type = ChosenType();
+    int chosen = TypeChoice_Type(m_type), type = chosen >= 0 ? chosen : m_entry->type;
     GridChanges changes = Grid_Compare(&m_grid, type);
     if (!Grid_HasChanges(&changes))
         return true;
     int answer = Ask(Grid_Question(&changes), wxYES_NO | wxCANCEL);
     if (answer != wxYES)
         return answer == wxNO;
+    if (changes.type && !TakeType(&type))
+        return false;
     if (!Grid_ChangesOnlyType(&changes))
         return AcceptLosses() && CheckRows() && ReplaceEntry(type);
     m_entry->type = type;
     SetModified(m_file);
     return true;
+}
+
+// The type as the file has it. False when it can't have one of that name, and the editing goes on.
+bool Cartulo::TakeType(int *type)
+{
+    *type = Entry_TypeIn(m_set.files[m_file], *type);
+    if (*type < 0)
+        ShowWarning(CommitTitle, "An entry of this type can't be stored in " + EncodingText() +
+                                     ".\n\nChoose another type.");
+    return *type >= 0;
 }
 
 // A question about the commit. wxYES, wxNO or wxCANCEL.

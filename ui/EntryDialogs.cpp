@@ -56,7 +56,7 @@ int EntryDialog::CurrentChoice() const
 TypedKey EntryDialog::Key(const BibFile *file) const
 {
     return Key_Read(m_key->GetValue().ToStdWstring().c_str(),
-                    file ? Enc_OfFile(file) : Enc_Current());
+                    file ? Bib_Encoding(file) : Enc_Current());
 }
 
 void EntryDialog::Refuse(const wxString &text)
@@ -133,7 +133,7 @@ Cartulo_NewEntry::Cartulo_NewEntry(wxWindow *parent, const EntryPlace &current,
     m_child->Enable(Entry_MayBeParent(file, current.entry));
     if (m_child->IsEnabled())
         m_child->SetToolTip("The new entry refers to `" +
-                            StoreText(current.entry->key, Enc_OfFile(file)) + "'.");
+                            StoreText(current.entry->key, Bib_Encoding(file)) + "'.");
     Dialog_AddRow(m_rows, this, "Create 'crossref':", m_child);
     Dialog_Finish(this, m_rows, m_key);
 }
@@ -173,20 +173,17 @@ bool Cartulo_NewEntry::Create(int file, const std::string &key)
 {
     BibFile *target = m_current.set->files[file];
     int index = TypeChoice_Type(m_type);
-    const char *chosen = index < 0 ? "" : BibTypeTable[index];
+    const char *typeName = index < 0 ? "" : BibTypeTable[index];
     const bool child = m_child->GetValue();
     char section[SCHEMA_SECTION_SIZE];
-    Schema_FieldSpecs(m_ini.c_str(), chosen, section, sizeof section);
-    std::string recoded = Entry_SpecsFor(target, section);
-    const char *specs = child ? Entry_ChildSpecs : recoded.c_str();
-    const char *type = index < 0 ? "" : BibTypeTable[Entry_TypeFor(target, index)];
-    std::string reason = Entry_CheckType(type, specs);
-    if (!reason.empty()) {
-        Refuse(OwnText(reason.c_str()));
+    Schema_FieldSpecs(m_ini.c_str(), typeName, section, sizeof section);
+    EntryType type = Entry_TypeFor(target, typeName, child ? Entry_ChildSpecs : section);
+    if (!type.reason.empty()) {
+        Refuse(StoreText(type.reason.c_str(), Bib_Encoding(target)));
         return false;
     }
-    BibEntry *entry =
-        Entry_Create(target, key.c_str(), type, specs, child ? m_current.entry : nullptr);
+    BibEntry *entry = Entry_Create(target, key.c_str(), type.name.c_str(), type.specs.c_str(),
+                                   child ? m_current.entry : nullptr);
     if (!entry) {
         Refuse("There is not enough memory for a new entry.");
         return false;
@@ -214,7 +211,7 @@ Cartulo_RenameEntry::Cartulo_RenameEntry(wxWindow *parent, const EntryPlace &cur
     m_type->Disable();
     if (current.entry)
         m_key->ChangeValue(
-            StoreText(current.entry->key, Enc_OfFile(current.set->files[current.file])));
+            StoreText(current.entry->key, Bib_Encoding(current.set->files[current.file])));
     Dialog_Finish(this, m_rows, m_key);
 }
 

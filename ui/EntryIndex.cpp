@@ -136,26 +136,46 @@ static bool Continues(const TypeAhead *state, uint32_t key, bool modified, int32
 static const EncodingRecord *EncodingOf(const IndexItem *item, BibFile *const *files, int fileCount)
 {
     bool hasFile = files != nullptr && item->file >= 0 && item->file < fileCount;
-    return hasFile ? Enc_OfFile(files[item->file]) : Enc_Current();
+    return hasFile ? Bib_Encoding(files[item->file]) : Enc_Current();
 }
 
-static bool Holds(const wchar_t *text, const EncodingRecord *encoding)
+// The typed text in one encoding.
+struct Prefix {
+    const EncodingRecord *encoding;
+    bool isForeign; // the encoding lacks a character
+    std::string bytes;
+    std::u32string folded; // of UTF-8
+};
+
+static Prefix PrefixIn(const wchar_t *text, const EncodingRecord *encoding)
 {
-    return std::all_of(text, text + wcslen(text),
-                       [encoding](wchar_t c) { return Enc_Holds(c, encoding) != 0; });
+    Prefix prefix = {encoding, false, Enc_Encode(text, encoding), {}};
+    for (; *text; ++text)
+        prefix.isForeign |= !Enc_Holds(*text, encoding);
+    if (encoding == &EncodingUtf8)
+        prefix.folded = Enc_FoldUtf8(prefix.bytes.c_str());
+    return prefix;
+}
+
+static bool RowBeginsWith(const IndexItem *item, BibFile *const *files, int fileCount,
+                          const Prefix &prefix)
+{
+    if (prefix.isForeign)
+        return false;
+    if (prefix.folded.size() == prefix.bytes.size() || prefix.folded.empty())
+        return RowBeginsWith(item, files, fileCount, prefix.bytes.c_str());
+    return Enc_Utf8BeginsWith(EntryIndex_RowText(item, files, fileCount).c_str(), prefix.folded);
 }
 
 static int FindByPrefix(const wchar_t *prefix, const IndexItem *index, int count,
                         BibFile *const *files, int fileCount)
 {
-    const EncodingRecord *last = nullptr; // what `bytes` is in
-    std::string bytes;                    // "" when the encoding lacks a character
+    Prefix known = {};
     for (int row = 0; row < count; ++row) {
         const EncodingRecord *encoding = EncodingOf(&index[row], files, fileCount);
-        if (encoding != last)
-            bytes = Holds(prefix, encoding) ? Enc_Encode(prefix, encoding) : "";
-        last = encoding;
-        if (!bytes.empty() && RowBeginsWith(&index[row], files, fileCount, bytes.c_str()))
+        if (encoding != known.encoding)
+            known = PrefixIn(prefix, encoding);
+        if (RowBeginsWith(&index[row], files, fileCount, known))
             return row;
     }
     return -1;

@@ -81,7 +81,7 @@ static KeyVerdict CheckForm(const TypedKey &key)
 // `key` is text of `file`.
 static bool HasKeyOf(const BibFile *other, const char *key, const BibFile *file)
 {
-    const EncodingRecord *from = Enc_OfFile(file), *to = Enc_OfFile(other);
+    const EncodingRecord *from = Bib_Encoding(file), *to = Bib_Encoding(other);
     std::string recoded = Enc_Recode(key, from, to);
     return HasKey(other, recoded.c_str()) && Enc_Recode(recoded.c_str(), to, from) == key;
 }
@@ -118,28 +118,24 @@ KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const B
 
 // --- Types ---
 
-static std::string RecodeName(const char *name, const BibFile *file)
+// A name that files share, as text of one file. False when its encoding lacks a letter.
+static bool Recode(const BibFile *file, const char *name, std::string *recoded)
 {
-    return Enc_Recode(name, Enc_OfText(name), Enc_OfFile(file));
+    const EncodingRecord *from = Enc_OfText(name), *to = Bib_Encoding(file);
+    *recoded = Enc_Recode(name, from, to);
+    return Enc_Recode(recoded->c_str(), to, from) == name;
 }
 
-int Entry_TypeFor(const BibFile *file, int type)
+int Entry_TypeIn(const BibFile *file, int type)
 {
-    std::string name = RecodeName(BibTypeTable[type], file);
-    return Bib_HasTypeRoom(name.c_str()) ? Bib_TypeIndex(name.c_str()) : type;
+    std::string name;
+    bool fits = Recode(file, BibTypeTable[type], &name) && Bib_HasTypeRoom(name.c_str());
+    return fits ? Bib_TypeIndex(name.c_str()) : -1;
 }
 
 // --- New entries ---
 
 const char Entry_ChildSpecs[] = "crossref=*\0";
-
-std::string Entry_SpecsFor(const BibFile *file, const char *specs)
-{
-    std::string recoded;
-    for (const char *item = specs; *item; item += strlen(item) + 1)
-        recoded += RecodeName(item, file) + '\0';
-    return recoded + '\0';
-}
 
 static std::vector<std::string> MandatoryFields(const char *specs)
 {
@@ -170,6 +166,24 @@ std::string Entry_CheckType(const char *typeName, const char *specs)
         return "There are too many different names of fields in all open files.\n\n"
                "Close some of the files, or choose another type.";
     return "";
+}
+
+EntryType Entry_TypeFor(const BibFile *file, const char *typeName, const char *specs)
+{
+    EntryType type;
+    bool fits = Recode(file, typeName, &type.name);
+    for (const char *item = specs; *item; item += strlen(item) + 1) {
+        std::string recoded;
+        fits = Recode(file, item, &recoded) && fits;
+        type.specs += recoded + '\0';
+    }
+    type.specs += '\0';
+    type.reason = Entry_CheckType(type.name.c_str(), type.specs.c_str());
+    if (!fits)
+        type.reason = std::string("The type or one of its fields has letters that can't be stored "
+                                  "in ") +
+                      Enc_Label(Bib_Encoding(file)) + ".";
+    return type;
 }
 
 BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, const char *specs,

@@ -42,13 +42,11 @@ KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const B
 
 // --- Types ---
 
-// The type of this name in the encoding of the file; the same one when the table of types is full.
-int Entry_TypeFor(const BibFile *file, int type);
+// The type of this name in the encoding of the file; -1 when that lacks a letter, or when there is
+// no room for another type.
+int Entry_TypeIn(const BibFile *file, int type);
 
 // --- New entries ---
-
-// The lines of a type's section (Schema_FieldSpecs) in the encoding of the file.
-std::string Entry_SpecsFor(const BibFile *file, const char *specs);
 
 // The fields of an entry that refers to another one, as Bib_NewEntry wants them.
 extern const char Entry_ChildSpecs[];
@@ -56,6 +54,13 @@ extern const char Entry_ChildSpecs[];
 // Why a new entry can't be of this type ("" for none) with the mandatory fields of `specs`; "" when
 // it can. Without this check, Entry_Create may end the process.
 std::string Entry_CheckType(const char *typeName, const char *specs);
+
+// A type and the lines of its section (Schema_FieldSpecs) as text of one file.
+struct EntryType {
+    std::string name, specs;
+    std::string reason; // why an entry of it can't be made there, text of the file; "" when it can
+};
+EntryType Entry_TypeFor(const BibFile *file, const char *typeName, const char *specs);
 
 // A new entry at the head of the file. When its first field is `crossref`, that names `parent`
 // (null: none). Null when memory is out.

@@ -67,7 +67,7 @@ std::wstring Messages_Text(const BibFileSet *set, std::wstring (*pathText)(const
         const BibFile *file = set->files[i];
         text += L"The file: '" + pathText(file->path) + L"'" + CountsText(file) + L":\n";
         if (file->messages)
-            text += Value_Show(file->messages, Enc_OfFile(file));
+            text += Value_Show(file->messages, Bib_Encoding(file));
         text += L"\n";
     }
     return text;

@@ -72,7 +72,7 @@ void Cartulo_Preamble::UpdatePreamble()
     const BibFile *file = set->files[CurrentPreamble];
     m_file->SetSelection(CurrentPreamble);
     m_file->SetToolTip(FileTip(file));
-    m_filled = StoreText(file->preamble, Enc_OfFile(file));
+    m_filled = StoreText(file->preamble, Bib_Encoding(file));
     m_text->ChangeValue(m_filled);
     m_text->SetInsertionPoint(0);
     bool isWhole = m_text->GetValue() == m_filled;
@@ -89,7 +89,7 @@ void Cartulo_Preamble::ShowEditable(bool editable)
 
 const EncodingRecord *Cartulo_Preamble::Encoding() const
 {
-    return Enc_OfFile(m_panel->Files()->files[CurrentPreamble]);
+    return Bib_Encoding(m_panel->Files()->files[CurrentPreamble]);
 }
 
 // The file that is shown; null when its preamble can't be changed.
@@ -101,7 +101,7 @@ BibFile *Cartulo_Preamble::WritableFile() const
 
 PreambleEdit Cartulo_Preamble::ReadEdit(const BibFile *file) const
 {
-    return Preamble_Read(m_text->GetValue().ToStdWstring(), file->preamble, Enc_OfFile(file));
+    return Preamble_Read(m_text->GetValue().ToStdWstring(), file->preamble, Bib_Encoding(file));
 }
 
 bool Cartulo_Preamble::IsChanged(const BibFile *file, const PreambleEdit &edit) const

@@ -82,7 +82,7 @@ wxString QListBox::GetItemText(size_t n) const
         return OwnText(EntryIndex_RowText(item, nullptr, 0).c_str());
     // The two halves come in different encodings: a key from a file, a name from the system.
     const BibFile *file = Files()[item->file];
-    return StoreText(item->entry->key, Enc_OfFile(file)) + " (" + PathText(file->baseName) + ")";
+    return StoreText(item->entry->key, Bib_Encoding(file)) + " (" + PathText(file->baseName) + ")";
 }
 
 void QListBox::OnDrawItem(wxDC &dc, const wxRect &rect, size_t n) const
@@ -91,7 +91,8 @@ void QListBox::OnDrawItem(wxDC &dc, const wxRect &rect, size_t n) const
         return;
     dc.SetTextForeground(wxSystemSettings::GetColour(
         IsSelected(n) ? wxSYS_COLOUR_LISTBOXHIGHLIGHTTEXT : wxSYS_COLOUR_LISTBOXTEXT));
-    dc.DrawText(GetItemText(n), rect.GetTopLeft());
+    // All rows run from left to right, also those of a key in Hebrew or Arabic letters.
+    dc.DrawText(L"\x200E" + GetItemText(n), rect.GetTopLeft());
 }
 
 wxCoord QListBox::OnMeasureItem(size_t) const

@@ -61,13 +61,12 @@ int Schema_SelectEncoding(const char *ini, BibFileSet *set)
     Profile_GetString("Preamble", "Encoding", "", name, sizeof name, ini);
     if (!*name)
         return 1;
-    Enc_Select(name);
-    if (Ascii_Compare(Enc_Current()->name, name) == 0)
+    if (Enc_Select(name))
         return 1;
     FileSet_AppendError(set,
-                        "ERROR: The file '%s' names the encoding '%s', which is not known; %s "
-                        "stays selected (CP65001 is UTF-8)\n",
-                        ini, name, Enc_Current()->name);
+                        "ERROR: The file '%s' names the encoding '%s', which is not known (UTF-8 "
+                        "is called CP65001); %s stays selected\n",
+                        ini, name, Enc_Label(Enc_Current()));
     return 0;
 }
 
@@ -120,11 +119,23 @@ Colour Schema_FieldColour(FieldClass fieldClass)
     return {0, 0, 255};
 }
 
+// A text that is, or may have been, cut off to fit: not in the middle of a character.
+static std::string CutTo(size_t size, std::string text)
+{
+    if (text.size() < size)
+        return text;
+    text.resize(size);
+    size_t valid = Enc_Utf8Length(text.data(), size);
+    if (size - valid < ENC_LONGEST)
+        text.resize(valid);
+    return text;
+}
+
 std::string Schema_Description(const char *ini, const char *type)
 {
     char description[HELP_SIZE];
     Profile_GetString(type, "*", "Custom Entry Type", description, sizeof description, ini);
-    return description;
+    return CutTo(HELP_SIZE - 1, description);
 }
 
 void Schema_FieldSpecs(const char *ini, const char *type, char *buffer, size_t size)
@@ -256,5 +267,5 @@ std::string Schema_HelpText(const char *ini, const char *type, bool editMode)
         return ListHelp;
     std::string text = EditHelp;
     text.append("`").append(type).append("' entry is for ").append(Schema_Description(ini, type));
-    return text.substr(0, HELP_SIZE - 1);
+    return CutTo(HELP_SIZE - 1, text);
 }

@@ -15,13 +15,15 @@ SearchText Search_For(const char *text, const BibFile *file)
     search.isEmpty = !text || !*text;
     if (search.isEmpty)
         return search;
-    const EncodingRecord *from = Enc_Current(), *to = Enc_OfFile(file);
+    const EncodingRecord *from = Enc_Current(), *to = Bib_Encoding(file);
     search.bytes = Enc_Recode(text, from, to);
     search.isForeign = Enc_Recode(search.bytes.c_str(), to, from) != text;
     if (to != &EncodingUtf8)
         return search;
     std::u32string folded = Enc_FoldUtf8(search.bytes.c_str());
-    if (!std::all_of(folded.begin(), folded.end(), IsAscii))
+    if (std::all_of(folded.begin(), folded.end(), IsAscii))
+        search.bytes.assign(folded.begin(), folded.end());
+    else
         search.folded = folded;
     return search;
 }

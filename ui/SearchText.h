@@ -15,6 +15,7 @@ struct SearchText {
 // `text` is in the selected encoding (Enc_Current); null counts as "".
 SearchText Search_For(const char *text, const BibFile *file);
 
-// True when a value of the entry contains the text, ignoring case: of all letters in UTF-8, else of
-// the ASCII letters.
+// True when a value of the entry contains the text, ignoring case: of all letters in UTF-8 (an
+// ASCII text finds ASCII letters only), else of the ASCII letters. In UTF-8, guillemets in the text
+// find marks of abbreviations and such that are text.
 bool Search_Finds(const SearchText *search, const BibEntry *entry);

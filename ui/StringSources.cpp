@@ -77,7 +77,7 @@ static std::vector<StringLine> ListLines(const std::string &list, const char *in
 static void AppendLines(std::vector<StringLine> *lines, const BibFile *file)
 {
     for (const BibString *string = file->strings; string; string = string->next)
-        lines->push_back({Line(string->name, string->value), Enc_OfFile(file)});
+        lines->push_back({Line(string->name, string->value), Bib_Encoding(file)});
 }
 
 std::vector<StringLine> Strings_Lines(const StringSources *sources, int source)

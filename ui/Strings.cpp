@@ -323,7 +323,7 @@ Cartulo_Strings_Edit::Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxStr
                                            BibString *string)
     : wxDialog(strings, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
-      m_file(strings->WritableFile()), m_encoding(Enc_OfFile(m_file)), m_string(string)
+      m_file(strings->WritableFile()), m_encoding(Bib_Encoding(m_file)), m_string(string)
 {
     SetFont(wxFontInfo(10));
     m_key = new wxTextCtrl(this, ID_STRING_KEY);

@@ -71,8 +71,8 @@ static std::string DescribeOutside(const BibFile *file)
     std::string text = file->form & BIB_FORM_MARK ? "mark\n" : "";
     const BibOutside *last = nullptr;
     for (const BibOutside *at = file->origin ? file->origin->outside : nullptr; at; at = at->next) {
-        if (!last || last->item != at->item || last->piece != at->piece || last->kind != at->kind)
-            text += "outside " + std::to_string(at->kind) + " " + std::to_string(at->piece) + "\n";
+        if (!last || last->item != at->item || last->piece != at->piece || last->place != at->place)
+            text += "outside " + std::to_string(at->place) + " " + std::to_string(at->piece) + "\n";
         text += std::string(at->text) + "\n";
         last = at;
     }

@@ -120,7 +120,7 @@ TEST_F(Encodings, AreAnErrorWhenTheIniFileNamesNone)
         },
         ExpectMessages("There are errors in loading BIB files", &text));
     EXPECT_TRUE(text.StartsWith("ERROR: The file '" + folder.Path("Cartulo/cartulo.ini") +
-                                "' names the encoding 'UTF-8', which is not known; CP1252"));
+                                "' names the encoding 'UTF-8', which is not known (UTF-8"));
     EXPECT_EQ("CP1252", EncodingField());
 }
 
