@@ -54,6 +54,9 @@ TEST(BibItemSize, IsThatOfAWholeItem)
     EXPECT_LT(0, Size(Item(BIB_ITEM_STRINGS, 2, Text("a") + Text("x") + Text("b") + Text("y"))));
     EXPECT_LT(0, Size(Item(BIB_ITEM_PREAMBLE, 1, Text("preamble") + Text("x"))));
     EXPECT_LT(0, Size(Item(BIB_ITEM_COMMENT, 0, "")));
+    EXPECT_LT(0, Size(Item(BIB_ITEM_OUTSIDE, 0, Text("text"))));
+    EXPECT_LT(0, Size(Item(BIB_ITEM_DROPPED, 0, "")));
+    EXPECT_LT(0, Size(Item(BIB_ITEM_FORM, BIB_FORM_ALL, "")));
     EXPECT_LT(0, Size(Item(BIB_ITEM_STRANGE, 0, "")));
     EXPECT_LT(0, Size(Item(BIB_ITEM_END, BIB_END_EARLY, "")));
 }
@@ -130,9 +133,9 @@ TEST(BibItemStore, RefusesAnEntryThatDoesNotFitInMemory)
     Bib_Initialize();
     std::string value(256 * 1024 * 1024, 'v');
     std::string texts = Text("misc") + Text("key") + Text("a") + Text(value);
-    std::string items[] = {Item(BIB_ITEM_ENTRY, 1, texts),
-                           Item(BIB_ITEM_STRINGS, 1, Text("a") + Text(value)),
-                           Item(BIB_ITEM_COMMENT, 1, Text(value))};
+    std::string items[] = {
+        Item(BIB_ITEM_ENTRY, 1, texts), Item(BIB_ITEM_STRINGS, 1, Text("a") + Text(value)),
+        Item(BIB_ITEM_COMMENT, 1, Text(value)), Item(BIB_ITEM_OUTSIDE, 0, Text(value))};
     BibFile *file = LoadText("");
     struct rlimit limit;
     getrlimit(RLIMIT_AS, &limit);

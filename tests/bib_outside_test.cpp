@@ -8,6 +8,8 @@
 #include <cstring>
 #include <string>
 
+#include <btparse.h>
+
 #include "encoding/Encoding.h"
 #include "store/BibFileSet.h"
 #include "tests/support/LoadText.h"
@@ -315,18 +317,52 @@ TEST_F(BibOutsideTest, FollowsThePiecesOfAPreambleThatMove)
     EXPECT_EQ("% two\n% one\n% end\n", Saved());
 }
 
+TEST_F(BibOutsideTest, FollowsThePiecesThatGoToWhateverComesNext)
+{
+    const char piece[] = "% p\n@PREAMBLE{{a} }\n\n";
+    for (const char *rest : {"% s\n@STRING{s = {S}}\n\n@misc{k,\n}\n% end\n",
+                             "% k\n@misc{k,\n}\n% end\n", "% end\n"}) {
+        Load(piece + std::string(rest));
+        EditPreamble(L"");
+        EXPECT_EQ("% p\n" + std::string(rest), Saved());
+    }
+}
+
 TEST_F(BibOutsideTest, IsWrittenEvenWhenItsItemIsTakenAwayWithoutAWord)
 {
     Load(AllKinds);
-    for (const char *key : {"a", "b"}) {
-        BibEntry **link = Bib_FindLink(file, Entry(key));
-        BibEntry *entry = *link;
-        *link = entry->next;
-        Bib_FreeEntry(entry);
-    }
-    std::string saved = Saved();
-    for (const char *line : {"% entry a\n", "% entry b\n", "% entry c\n", "% end\n"})
-        EXPECT_THAT(saved, HasSubstr(line));
+    BibComment *comments = file->comments;
+    BibString *strings = file->strings;
+    BibEntry *entries = file->entries;
+    file->comments = nullptr;
+    file->strings = nullptr;
+    file->entries = nullptr;
+    file->preamble[0] = 0;
+    EXPECT_EQ("% comment one\n% comment two\n% piece one\n% piece two\n% string s\n% string t\n"
+              "% entry a\n% entry b\n% entry c\n% end\n",
+              Saved());
+    file->comments = comments->next;
+    file->strings = strings->next;
+    file->entries = entries->next;
+    EXPECT_EQ("@COMMENT{two}\n\n% comment one\n% comment two\n% piece one\n% piece two\n"
+              "@STRING{t = {T}}\n\n% string s\n% string t\n@misc{b,\n\tx = {1 b}\n}\n"
+              "@misc{c,\n\tx = {1 c}\n}\n% entry a\n% entry b\n% entry c\n% end\n",
+              Saved());
+    file->comments = comments;
+    file->strings = strings;
+    file->entries = entries;
+}
+
+TEST_F(BibOutsideTest, IsNotTakenFromTheEndByAnItemThatIsParsedLater)
+{
+    Load("@misc{a,\n}\n% end\n");
+    FILE *stream = fopen(folder.Write("c.bib", "@misc{c,}\n").c_str(), "r");
+    boolean status;
+    AST *ast = bt_parse_entry(stream, const_cast<char *>("c.bib"), BTO_NOSTORE, &status);
+    EXPECT_EQ(1, Bib_AddEntryFromAst(file, ast));
+    bt_free_ast(ast);
+    fclose(stream);
+    EXPECT_EQ("@misc{c,\n}\n@misc{a,\n}\n% end\n", Saved());
 }
 
 // --- Messages ---

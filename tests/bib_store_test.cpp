@@ -192,3 +192,32 @@ TEST_F(BibStore, FindsTextBehindAFalseStart)
     EXPECT_EQ(0, Bib_EntryContains(file->entries, "\xE4\xC4"));
     Bib_FreeFile(file);
 }
+
+// --- The form of a file ---
+
+TEST(BibUpdateForm, SeesEveryTextThatCanBeEdited)
+{
+    Bib_Initialize();
+    for (const char *text : {"@preamble{{\xFC}}", "@string{a\xFC = {b}}", "@string{a = {\xFC}}",
+                             "@misc{a\xFC,}", "@misc\xFC{a,}", "@misc{a, b\xFC = {c}}",
+                             "@misc{a, b = {\xFC}}", "@misc{a,}@misc{b, c = {d}, e = {\xFC}}"}) {
+        BibFile *file = LoadText(text);
+        EXPECT_EQ(BIB_FORM_CODE_PAGE, file->form) << text;
+        file->form = BIB_FORM_CRLF; // as if it had been edited
+        Bib_UpdateForm(file);
+        EXPECT_EQ(BIB_FORM_CODE_PAGE | BIB_FORM_CRLF, file->form) << text;
+        Bib_FreeFile(file);
+    }
+}
+
+TEST(BibUpdateForm, NeverTakesAFileForUtf8ThatWasNot)
+{
+    Bib_Initialize();
+    BibFile *file = LoadText("% \xFC\n@misc{a, b = {c}}\n");
+    Bib_UpdateForm(file);
+    EXPECT_EQ(BIB_FORM_CODE_PAGE, file->form);
+    file->form = 0;
+    Bib_UpdateForm(file);
+    EXPECT_EQ(0, file->form);
+    Bib_FreeFile(file);
+}

@@ -870,6 +870,21 @@ TEST_F(CommandProcess, TakesAFileForUtf8NoMoreWhenItWasEditedInACodePage)
     EXPECT_EQ(&EncodingUtf8, Bib_Encoding(set.files[1]));
 }
 
+TEST_F(CommandProcess, LooksAtAllOpenFilesWhenItSelectsUtf8)
+{
+    Write("a.bib", "@misc{a, x = {\xFC}}\n");
+    Write("b.bib", "@misc{b, x = {\xFC}}\n");
+    Run("a b");
+    BibFile *a = set.files[0], *b = set.files[1];
+    a->form = b->form = 0;       // as if they had been edited
+    Run("a b -i -eCP65001 b a"); // a and b are put aside before
+    EXPECT_EQ(BIB_FORM_CODE_PAGE, a->form);
+    EXPECT_EQ(BIB_FORM_CODE_PAGE, b->form);
+    a->form = 0;
+    Run("a -eCP65001 b");
+    EXPECT_EQ(BIB_FORM_CODE_PAGE, a->form); // listed already
+}
+
 TEST_F(CommandProcess, TakesFilesOffTheListAtOptionIWithoutClosingThem)
 {
     std::string path = WriteBib("a.bib");

@@ -508,3 +508,21 @@ TEST_F(TypeAheadKey, ComparesTypedLettersInTheEncodingOfEachFile)
               "ber",
               Selected());
 }
+
+TEST_F(TypeAheadKey, IgnoresTheCaseOfAllLettersInUtf8)
+{
+    Enc_Select("CP65001");
+    int other = AddFile("other");
+    files[other]->form = BIB_FORM_CODE_PAGE;
+    Add(0, "\xD0\x98"
+           "van2001");
+    Add(other, "\xD6"
+               "rtel");
+    Build();
+    EXPECT_EQ(TYPE_AHEAD_ROW, Press(0x0438)); // in small letters
+    EXPECT_EQ(TYPE_AHEAD_ROW, Type("VAN2001 (refs)"));
+    EXPECT_EQ(TYPE_AHEAD_NO_ROW, Type("x"));
+    state = {};
+    EXPECT_EQ(TYPE_AHEAD_NO_ROW, Press(0xF6)); // the other file is in a code page
+    EXPECT_EQ(TYPE_AHEAD_ROW, Press(0xD6));
+}

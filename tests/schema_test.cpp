@@ -81,6 +81,23 @@ TEST_F(SchemaFile, TellsOfAnEncodingThatIsNotKnown)
     FileSet_Free(&set);
 }
 
+TEST_F(SchemaFile, CutsNoLetterInTwo)
+{
+    Enc_Select("CP65001");
+    std::string letters;
+    for (int i = 0; i < 700; ++i)
+        letters += "\xC3\xBC";
+    for (std::string start : {"", "x"}) {
+        std::string ini = folder.Write("a.ini", "[misc]\n* = " + start + letters + "\n");
+        std::string text = Schema_Description(ini.c_str(), "misc");
+        EXPECT_TRUE(Enc_IsUtf8(text.data(), text.size()));
+        EXPECT_EQ(1022u + start.size(), text.size());
+        text = Schema_HelpText(ini.c_str(), "misc", true);
+        EXPECT_TRUE(Enc_IsUtf8(text.data(), text.size()));
+        EXPECT_LE(1022u, text.size());
+    }
+}
+
 TEST_F(SchemaFile, RegistersItsEntryTypes)
 {
     std::string ini = folder.Write("a.ini", "[Preamble]\nAppName = x\n[Article]\nauthor = *\n"

@@ -6,6 +6,7 @@
 
 #include "encoding/Encoding.h"
 #include "tests/support/LoadText.h"
+#include "ui/Values.h"
 
 namespace
 {
@@ -54,7 +55,21 @@ TEST_F(SearchTextTest, IgnoresTheCaseOfAllLettersInUtf8)
     EXPECT_TRUE(Finds("m\xC3\x9Cll", "M\xC3\xBCLLER"));
     EXPECT_TRUE(Finds("MUL", "muller"));
     EXPECT_FALSE(Finds("m\xC3\xBC", "Muller"));
+    EXPECT_TRUE(Finds("\xE2\x84\xAA" // the sign for kelvin
+                      "1",
+                      "k1"));
     EXPECT_TRUE(Finds("\x02JAN\x05 \xC3\x9C", "a} # jan # { \xC3\xBC"));
+}
+
+TEST_F(SearchTextTest, FindsGuillemetsThatAreText)
+{
+    Enc_Select("CP65001");
+    const std::string typed = Value_Read(L"\u00ABm", Enc_Current());
+    EXPECT_TRUE(Finds(typed, "x \xC2\xABM\xC2\xBB"));
+    EXPECT_TRUE(Finds(typed, "x} # may # {"));
+    EXPECT_FALSE(Finds(typed, "may"));
+    Enc_Select("CP1252");
+    EXPECT_FALSE(Finds(typed, "x \xABM\xBB"));
 }
 
 TEST_F(SearchTextTest, SearchesEachFileInItsOwnEncoding)
