@@ -2,8 +2,9 @@
 //
 // The parser library ends or breaks its process on input that people really have, so it runs in a
 // child of the editor. Here are the functions of the library that this program replaces: they are
-// called through the dynamic symbol table, so they must be exported from the executable. They
-// stand in this object because every user of the loader links it.
+// called through the dynamic symbol table, so they must be exported from the executable, and no
+// other library may use their names. They stand in this object because every user of the loader
+// links it.
 
 #include <algorithm>
 #include <climits>
@@ -14,6 +15,7 @@
 
 #include <btparse.h>
 
+#include "encoding/Encoding.h"
 #include "store/BibItem.h"
 #include "store/BibStore.h"
 #include "store/BibText.h"
@@ -384,6 +386,20 @@ static BibEnd ParseAll(FILE *stream, const char *path)
     return feof(stream) ? BIB_END_OF_FILE : BIB_END_EARLY;
 }
 
+// A text that only begins as UTF-8 would be hard to read without a word on why.
+static void SendForm(const char *text, size_t length)
+{
+    int form = BibText_Form(text, length);
+    BeginItem(Sending, BIB_ITEM_FORM, 0, form);
+    EndItem(Sending);
+    if (!(form & BIB_FORM_CODE_PAGE) || Enc_Current() != &EncodingUtf8)
+        return;
+    size_t bad = BibText_FindBadByte(text, length);
+    if (bad < length)
+        PackMessage(Sending, BTERR_LEXWARN, 1 + BibText_CountLines(text, {0, bad}),
+                    "this is no UTF-8 any more, so the whole file is taken for CP1252");
+}
+
 void BibChild_Parse(void *argument)
 {
     static BibItems items;
@@ -397,8 +413,7 @@ void BibChild_Parse(void *argument)
                            : Sys_ReadAll(job->stream, &length);
     if (!text || length >= INT_MAX) // the lexer counts with int
         Leave(BIB_END_UNREADABLE);
-    BeginItem(Sending, BIB_ITEM_FORM, 0, BibText_Form(text, length));
-    EndItem(Sending);
+    SendForm(text, length);
     length = BibText_Normalise(text, length);
     Source.text = text;
     Source.length = length;

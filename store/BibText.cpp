@@ -44,6 +44,13 @@ int BibText_Form(const char *text, size_t length)
     return form;
 }
 
+size_t BibText_FindBadByte(const char *text, size_t length)
+{
+    size_t valid = Enc_Utf8Length(text, length);
+    bool isAscii = std::all_of(text, text + valid, [](char c) { return (c & 0x80) == 0; });
+    return isAscii ? length : valid;
+}
+
 // --- Plain lines ---
 
 static size_t RemoveMark(char *text, size_t length)

@@ -11,6 +11,10 @@ struct BibSpan {
 // How the file was written, as BIB_FORM_ bits. Of the text as it is in the file.
 int BibText_Form(const char *text, size_t length);
 
+// Where the text stops being UTF-8 although it has letters of that before; `length` for a text of
+// any other kind.
+size_t BibText_FindBadByte(const char *text, size_t length);
+
 // Prepares the text for the parser, in place: no byte order mark, LF for CR LF and lone CR, blanks
 // for NUL, and an end on the last line, too. `text` has a spare byte behind it. Returns the length.
 size_t BibText_Normalise(char *text, size_t length);

@@ -481,3 +481,15 @@ TEST_F(BibOutsideTest, IsCountedForTheFormOfTheFile)
     Load("% M\xC3\xBCller\n@misc{k,\n}\n");
     EXPECT_EQ(0, file->form);
 }
+
+TEST_F(BibOutsideTest, TellsOfAFileThatOnlyBeginsAsUtf8)
+{
+    const std::string text = "% M\xC3\xBCller\n@misc{k,\n\tx = {M\xFCller}\n}\n";
+    EXPECT_EQ("", MessagesOf(text));
+    Enc_Select("CP65001");
+    EXPECT_EQ(
+        "WARNING: line 3: this is no UTF-8 any more, so the whole file is taken for CP1252\r\n",
+        MessagesOf(text));
+    EXPECT_EQ(text, Saved());
+    EXPECT_EQ("", MessagesOf("% M\xFCller\n@misc{k,\n}\n"));
+}

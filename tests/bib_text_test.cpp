@@ -54,6 +54,18 @@ TEST(BibTextForm, TellsOfTheEncodingAndTheMark)
     EXPECT_EQ(BIB_FORM_CODE_PAGE, Form("\xEF\xBB"));
 }
 
+TEST(BibTextFindBadByte, NeedsUtf8Before)
+{
+    auto badByte = [](const std::string &text) {
+        return text.substr(BibText_FindBadByte(text.data(), text.size()));
+    };
+    EXPECT_EQ("\xFC y", badByte("\xC3\xBC x \xFC y"));
+    EXPECT_EQ("\xFC", badByte("\xEF\xBB\xBF a \xFC"));
+    EXPECT_EQ("", badByte("\xC3\xBC"));
+    EXPECT_EQ("", badByte("a"));
+    EXPECT_EQ("", badByte("a \xFC \xC3\xBC"));
+}
+
 TEST(BibTextNormalise, MakesPlainLines)
 {
     EXPECT_EQ("", Normalised(""));

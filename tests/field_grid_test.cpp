@@ -16,6 +16,8 @@
 #include "encoding/Encoding.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/TempFolder.h"
+#include "ui/StringSources.h"
+#include "tests/support/TempFolder.h"
 
 using testing::ElementsAre;
 using testing::IsEmpty;
@@ -105,7 +107,7 @@ protected:
     }
 
     void Type(int row, const std::string &text) { grid.rows[row].text = Wide(text); }
-    std::string Losses() { return Utf8(Grid_Losses(&grid)); }
+    std::string Losses() { return Utf8(Grid_Losses(&grid, nullptr)); }
 };
 
 std::string Fields(int count) // "f1 = 1, f2 = 2, ..."
@@ -518,6 +520,24 @@ TEST_F(Grid, BuildsNothingWithoutMemory)
     EXPECT_EQ(3, file->entries->fieldCount);
 }
 #endif
+
+TEST_F(Grid, TellsOfAbbreviationsThatNobodyKnows)
+{
+    Show("@misc{k, title = {Old} # known, note = {n}}", "k");
+    BibFileSet set = {};
+    set.files = &file;
+    set.count = 1;
+    TempFolder folder;
+    StringSources sources = Strings_Sources(&set, folder.Path("none.ini"));
+    Type(0, "Old «known» «jan»");
+    Type(1, "n");
+    EXPECT_EQ(L"", Grid_Losses(&grid, &sources));
+    Type(1, "«Welt» «Leute»");
+    EXPECT_EQ(L"`note': no abbreviation \u00ABWelt\u00BB, \u00ABLeute\u00BB is known. As text, "
+              L"quotation marks are typed in another way, like << and >>.\n"
+              L"\nDo you want to accept these changes anyway ?",
+              Grid_Losses(&grid, &sources));
+}
 
 // --- The table of commits ---
 

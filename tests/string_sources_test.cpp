@@ -152,6 +152,26 @@ TEST_F(StringsSources, CanBeChangedWhenTheyAreAWritableFile)
         EXPECT_EQ(nullptr, Strings_WritableFile(&sources, source)) << source;
 }
 
+TEST_F(StringsSources, KnowTheNamesInAText)
+{
+    Enc_Select("CP65001");
+    Load("@string{\xC3\xBC" // in UTF-8
+         "x = {A}}\n");
+    Load("@string{\xF6 = {B}}\n@string{Acm = {C}}\n");
+    StringSources sources = Read("[String]\nOther = *Other\n[*Other]\njcp = J\n");
+    auto unknown = [&](const wchar_t *text, const wchar_t *before) {
+        return Strings_UnknownIn(&sources, text, before);
+    };
+    EXPECT_EQ(L"", unknown(L"", L""));
+    EXPECT_EQ(L"",
+              unknown(L"\u00AB\u00FCX\u00BB \u00AB\u00F6\u00BB \u00ABACM\u00BB \u00ABjcp\u00BB "
+                      L"\u00ABDec\u00BB",
+                      L""));
+    EXPECT_EQ(L"\u00ABa\u00BB, \u00ABb c\u00BB",
+              unknown(L"\u00ABa\u00BB\u00ABb c\u00BB \u00ABA\u00BB \u00ABd", L""));
+    EXPECT_EQ(L"\u00ABb\u00BB", unknown(L"\u00ABa\u00BB\u00ABb\u00BB", L"x\u00ABa\u00BB"));
+}
+
 static std::vector<StringLine> WithEncoding(const Lines &texts)
 {
     std::vector<StringLine> lines;

@@ -25,6 +25,7 @@
 #include "ui/EntryRules.h"
 #include "ui/QListBox.h"
 #include "ui/Schema.h"
+#include "ui/StringSources.h"
 #include "ui/Theme.h"
 #include "ui/TypeChoice.h"
 
@@ -445,7 +446,8 @@ int Cartulo::Ask(const wxString &text, int buttons)
 
 bool Cartulo::AcceptLosses()
 {
-    std::wstring losses = Grid_Losses(&m_grid);
+    StringSources sources = Strings_Sources(&m_set, m_ini);
+    std::wstring losses = Grid_Losses(&m_grid, &sources);
     return losses.empty() || Ask(wxString(losses), wxYES_NO | wxNO_DEFAULT) == wxYES;
 }
 

@@ -9,6 +9,7 @@
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
 #include "store/BibOutside.h"
+#include "ui/StringSources.h"
 #include "ui/Values.h"
 
 static bool SameName(const char *a, const char *b)
@@ -355,14 +356,26 @@ static std::wstring RowLosses(const FieldGrid *grid, const GridRow *row, bool te
                         textGuillemets, grid->encoding);
 }
 
-std::wstring Grid_Losses(const FieldGrid *grid)
+static std::wstring RowUnknown(const FieldGrid *grid, const GridRow *row,
+                               const StringSources *sources)
+{
+    std::wstring names =
+        sources ? Strings_UnknownIn(sources, row->text, row->filled) : std::wstring();
+    if (names.empty())
+        return names;
+    return L"`" + Enc_Decode(row->key.c_str(), grid->encoding) + L"': no abbreviation " + names +
+           L" is known. As text, quotation marks are typed in another way, like << and >>.\n";
+}
+
+std::wstring Grid_Losses(const FieldGrid *grid, const StringSources *sources)
 {
     bool textGuillemets = HoldsGuillemets(grid->entry, grid->encoding) ||
                           (grid->parent && HoldsGuillemets(grid->parent, grid->encoding));
     std::wstring text;
     for (int i = 0; i < grid->count; ++i)
         if (IsChanged(&grid->rows[i]))
-            text += RowLosses(grid, &grid->rows[i], textGuillemets);
+            text += RowLosses(grid, &grid->rows[i], textGuillemets) +
+                    RowUnknown(grid, &grid->rows[i], sources);
     return text.empty() ? text : text + Value_LossesQuestion;
 }
 

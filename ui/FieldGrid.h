@@ -14,6 +14,7 @@
 #include "store/BibStore.h"
 
 struct EncodingRecord;
+struct StringSources;
 
 enum { GRID_ROWS = 16, GRID_NO_FIELD = -1 };
 
@@ -98,13 +99,15 @@ bool Grid_ChangesOnlyType(const GridChanges *changes);
 
 std::string Grid_Question(const GridChanges *changes); // "There are changes in this entry: ..."
 
-// The question before a commit that would lose something; "" when it would not. It names each
+// The question before a commit that may lose something; "" when it can't. It names each
 // changed row with
 // - characters that the encoding would not bring back;
 // - guillemets, when some stored value of the entry or its parent has some that are text: those
 //   would become the marks of abbreviations, and which of them the user typed cannot be told.
-//   Without any there, guillemets are what the user types for an abbreviation.
-std::wstring Grid_Losses(const FieldGrid *grid);
+//   Without any there, guillemets are what the user types for an abbreviation;
+// - abbreviations that the user typed and `sources` (null: all are known) do not have: text in
+//   guillemets, perhaps.
+std::wstring Grid_Losses(const FieldGrid *grid, const StringSources *sources);
 
 // Why a row's value cannot be written as BibTeX, or not be read back (static text); null when all
 // is well. Also null for an inherited row.

@@ -4,6 +4,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <iterator>
+#include <set>
 
 #include "encoding/Encoding.h"
 #include "store/Ascii.h"
@@ -111,6 +112,60 @@ std::string Strings_KeyOf(const StringLine &line)
 {
     return line.text.substr(0, line.text.find(' '));
 }
+
+// --- Names in texts ---
+
+using Names = std::set<std::wstring>;
+
+static std::wstring Lower(std::wstring name)
+{
+    for (wchar_t &c : name)
+        if (c < 128)
+            c = Ascii_Lower(static_cast<unsigned char>(c));
+    return name;
+}
+
+// With the guillemets around each.
+static std::vector<std::wstring> NamesIn(const std::wstring &text)
+{
+    std::vector<std::wstring> names;
+    for (size_t open = text.find(L'\xAB'); open != text.npos; open = text.find(L'\xAB', open + 1)) {
+        size_t close = text.find(L'\xBB', open);
+        if (close != text.npos)
+            names.push_back(text.substr(open, close + 1 - open));
+    }
+    return names;
+}
+
+static Names KnownNames(const StringSources *sources)
+{
+    Names known;
+    for (const wchar_t *month : {L"jan", L"feb", L"mar", L"apr", L"may", L"jun", L"jul", L"aug",
+                                 L"sep", L"oct", L"nov", L"dec"})
+        known.insert(month);
+    for (int source = -Strings_FirstFile(sources); source <= STRINGS_OF_ALL_FILES; ++source)
+        for (const StringLine &line : Strings_Lines(sources, source))
+            known.insert(Lower(Enc_Decode(Strings_KeyOf(line).c_str(), line.encoding)));
+    return known;
+}
+
+std::wstring Strings_UnknownIn(const StringSources *sources, const std::wstring &text,
+                               const std::wstring &before)
+{
+    Names known;
+    std::wstring unknown;
+    for (const std::wstring &name : NamesIn(text)) {
+        if (before.find(name) != before.npos)
+            continue;
+        if (known.empty())
+            known = KnownNames(sources);
+        if (known.insert(Lower(name.substr(1, name.size() - 2))).second)
+            unknown += (unknown.empty() ? L"" : L", ") + name;
+    }
+    return unknown;
+}
+
+// --- Files ---
 
 BibFile *Strings_WritableFile(const StringSources *sources, int source)
 {
