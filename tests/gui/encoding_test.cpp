@@ -196,13 +196,30 @@ TEST_F(Encodings, AskBeforeGuillemetsOfAUtf8FileBecomeMarks)
     OpenBoth();
     SelectRow(1);
     StartEditing();
-    SetValue("note", L"\u00ABa\u00BB");
+    SetValue("note", L"\u00ABz\u00FCrich\u00BB");
     wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
                   ExpectBox(CommitTitle,
                             L"`note': \u00AB and \u00BB will mark an abbreviation, not stand as "
                             L"text.\n\nDo you want to accept these changes anyway ?",
                             wxID_NO));
     EXPECT_TRUE(Panel()->InEditMode());
+}
+
+TEST_F(Encodings, AskBeforeQuotedWordsBecomeAbbreviations)
+{
+    OpenBoth();
+    StartEditing();
+    SetValue("author", L"Le \u00ABMonde\u00BB");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
+                  ExpectBox(CommitTitle,
+                            L"`author': no abbreviation \u00ABMonde\u00BB is known. As text, "
+                            L"quotation marks are typed in another way, like << and >>.\n\n"
+                            L"Do you want to accept these changes anyway ?",
+                            wxID_NO, wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION));
+    EXPECT_TRUE(Panel()->InEditMode());
+    SetValue("author", L"\u00ABz\u00FCrich\u00BB \u00ABjan\u00BB"); // of the other file; a month
+    Commit();
+    EXPECT_EQ(Replaced(Latin, "{J\xFCrgen}", "z\xFCrich # { } # jan"), SavedFile("b.bib"));
 }
 
 // --- Windows ---
