@@ -295,7 +295,7 @@ static int IsInBrackets(size_t at)
 {
     const char *end = Source.text + Source.length;
     const char *open =
-        std::find_if(Source.text + at, end, [](char c) { return c == '{' || c == '('; });
+        std::find_if(Source.text + at + 1, end, [](char c) { return strchr("{(@", c); });
     return open < end && *open == '(';
 }
 

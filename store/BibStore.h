@@ -2,7 +2,7 @@
 //
 // A BibFile owns its lists, every record in them and every string they point to;
 // records are malloc'd and freed one by one. All text is 8-bit, NUL-terminated, in
-// the encoding of its file (Bib_Encoding in encoding/Encoding.h).
+// the encoding of its file (Bib_Encoding); the name tables hold names of all files.
 //
 // A value is the concatenation of the pieces of a BibTeX value: a quoted or braced
 // string stands as its inner text, a number as its digits, and an abbreviation as
@@ -152,8 +152,8 @@ BibEntry *Bib_AllocEntry(int fieldCount);
 BibEntry *Bib_NewEntry(BibFile *file, const char *key, const char *typeName, const char *fieldSpecs,
                        int allFields);
 
-// Frees the field values, the key and the block. Unlink the entry first, and before that say so in
-// BibOutside.h: text may belong to it.
+// Frees the field values, the key and the block. Unlink the entry first. Before that, text that
+// belongs to it has to be handed on or moved (BibOutside.h).
 void Bib_FreeEntry(BibEntry *entry);
 
 // The slot of the entry's first field of this name, ignoring case; -1 for none.
