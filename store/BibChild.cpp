@@ -326,10 +326,9 @@ static void PackOutside(BibItems *items, size_t offset)
     Source.kept.erase(Source.kept.begin(), next);
 }
 
-// The parser would miss an item in such a file.
-static void KeepAll()
+// The parser would miss an item in such a file. `words` is where anything but comments stands.
+static void KeepAll(size_t words)
 {
-    size_t words = BibText_FindWords(Source.text, {0, Source.length});
     if (words < Source.length)
         PackMessage(Sending, BTERR_LEXWARN, LineAt(words),
                     "there is text in the file, but no item");
@@ -386,17 +385,20 @@ static BibEnd ParseAll(FILE *stream, const char *path)
     return feof(stream) ? BIB_END_OF_FILE : BIB_END_EARLY;
 }
 
-// A text that only begins as UTF-8 would be hard to read without a word on why.
-static void SendForm(const char *text, size_t length)
+static void SendForm(int form)
 {
-    int form = BibText_Form(text, length);
     BeginItem(Sending, BIB_ITEM_FORM, 0, form);
     EndItem(Sending);
+}
+
+// A file that only begins as UTF-8 would be hard to read without a word on why.
+static void ReportBadByte(const char *text, size_t length, int form)
+{
     if (!(form & BIB_FORM_CODE_PAGE) || Enc_Current() != &EncodingUtf8)
         return;
-    size_t bad = BibText_FindBadByte(text, length);
-    if (bad < length)
-        PackMessage(Sending, BTERR_LEXWARN, 1 + BibText_CountLines(text, {0, bad}),
+    size_t valid = Enc_Utf8Length(text, length);
+    if (form & BIB_FORM_MARK || !BibText_IsAscii(text, valid))
+        PackMessage(Sending, BTERR_LEXWARN, 1 + BibText_CountLines(text, {0, valid}),
                     "this is no UTF-8 any more, so the whole file is taken for CP1252");
 }
 
@@ -413,12 +415,16 @@ void BibChild_Parse(void *argument)
                            : Sys_ReadAll(job->stream, &length);
     if (!text || length >= INT_MAX) // the lexer counts with int
         Leave(BIB_END_UNREADABLE);
-    SendForm(text, length);
+    const int form = BibText_Form(text, length);
+    const bool isBinary = memchr(text, 0, length) != nullptr;
+    SendForm(form);
     length = BibText_Normalise(text, length);
+    ReportBadByte(text, length, form);
     Source.text = text;
     Source.length = length;
-    if (BibText_HasNoItem(text, length)) {
-        KeepAll();
+    const size_t words = BibText_FindWords(text, {0, length});
+    if (BibText_HasNoItem(text, length) && (!isBinary || words == length)) {
+        KeepAll(words);
         Leave(BIB_END_OF_FILE);
     }
     FILE *stream = Sys_OpenText(text, length);

@@ -6,6 +6,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <initializer_list>
+#include <string>
 
 #include <btparse.h>
 
@@ -16,7 +17,7 @@
 
 int BibLoadSeconds = 10;
 
-enum { DROPPED_LISTED = 50 }; // warnings of a file up to which comments inside items are listed
+enum { DROPPED_LISTED = 50 }; // comment lines inside items, of a file
 
 // --- Items to records ---
 
@@ -273,14 +274,23 @@ static BibStored StoreComments(BibFile *file, ItemReader reader)
     return BIB_STORED;
 }
 
-// All are counted, but only the first ones are listed: what follows may be more important.
+// All are counted, but only the first ones are listed: there has to be room for other messages.
 static void ReportDropped(BibFile *file, int line)
 {
-    if (file->warningCount >= DROPPED_LISTED)
+    if (!Bib_Origin(file) || ++file->origin->dropped > DROPPED_LISTED)
         ++file->warningCount;
     else
         Bib_ReportMessage(nullptr, BTERR_CONTENT, file->path, line, nullptr, -1,
                           "a comment inside an entry is not kept when the file is saved");
+}
+
+static void ReportMoreDropped(BibFile *file, int line)
+{
+    int more = file->origin ? file->origin->dropped - DROPPED_LISTED : 0;
+    if (more <= 0)
+        return;
+    std::string message = std::to_string(more) + " more comments inside entries are not kept";
+    Bib_ReportMessage(nullptr, BTERR_NOTIFY, file->path, line, nullptr, -1, message.c_str());
 }
 
 static BibStored StoreOutside(BibFile *file, ItemReader reader)
@@ -482,6 +492,8 @@ static void LoadItems(BibFile *file)
     load.end = -1;
     int answered = ReceiveItems(&load, &child, 2 * seconds + 30);
     SysChildEnd end = Sys_EndChild(&child);
+    BibCurrentFile = file;
+    ReportMoreDropped(file, load.line);
     const char *reason = ReasonOfEnd(&load, end, answered);
     if (reason)
         Report(file, load.line, reason);

@@ -114,6 +114,7 @@ struct BibOutside {
 struct BibOrigin {
     uint64_t stamp;      // Sys_FileStamp of what was loaded or saved last
     BibOutside *outside; // see BibOutside.h
+    int32_t dropped;     // comment lines inside items, which are not kept
 };
 
 // Process-wide name tables: shared by all files, they only grow.

@@ -3,7 +3,6 @@
 #include "store/BibText.h"
 
 #include <algorithm>
-#include <cctype>
 #include <cstring>
 #include <string>
 
@@ -42,13 +41,6 @@ int BibText_Form(const char *text, size_t length)
     if (HasMark(text, length))
         form |= BIB_FORM_MARK;
     return form;
-}
-
-size_t BibText_FindBadByte(const char *text, size_t length)
-{
-    size_t valid = Enc_Utf8Length(text, length);
-    bool isAscii = std::all_of(text, text + valid, [](char c) { return (c & 0x80) == 0; });
-    return isAscii ? length : valid;
 }
 
 // --- Plain lines ---
@@ -95,6 +87,11 @@ static int IsBlank(char c)
 int BibText_CountLines(const char *text, BibSpan span)
 {
     return static_cast<int>(std::count(text + span.start, text + span.end, '\n'));
+}
+
+int BibText_IsAscii(const char *text, size_t length)
+{
+    return std::all_of(text, text + length, [](char c) { return (c & 0x80) == 0; });
 }
 
 // Behind blanks and byte order marks: those stand in the middle of files that were put together.
@@ -172,44 +169,71 @@ static std::string WithoutComments(const char *text, BibSpan span)
     return plain;
 }
 
+// Of the name of a field. Those of addresses in the web are none.
 static bool IsNameCharacter(char c)
 {
-    return isalnum(static_cast<unsigned char>(c)) || c == '-' || c == '_';
+    return static_cast<unsigned char>(c) > ' ' && !strchr("\"#%'(),={}/?", c);
 }
 
-// Whether a field begins at `at`, or behind blanks there.
+static size_t Skip(const std::string &text, size_t at, const char *characters)
+{
+    return std::min(text.find_first_not_of(characters, at), text.size());
+}
+
+// Whether the name of a field and its = stand here.
 static bool IsField(const std::string &text, size_t at)
 {
-    auto skip = [&](auto belongs) {
-        size_t start = at;
-        while (at < text.size() && belongs(text[at]))
-            ++at;
-        return at > start;
-    };
-    skip(IsBlank);
-    bool hasName = skip(IsNameCharacter);
-    skip(IsBlank);
-    return hasName && at < text.size() && text[at] == '=';
+    size_t end = at;
+    while (end < text.size() && IsNameCharacter(text[end]))
+        ++end;
+    size_t equals = Skip(text, end, Blanks);
+    return end > at && equals < text.size() && text[equals] == '=';
 }
 
-// A field begins behind the brace that came too early, or behind a comma. There was one when a
-// comma follows that brace, or when a brace comes that was to end the entry.
+// Where the text goes on behind a brace or bracket that nothing has opened, from `at` on; its size
+// when there is none.
+static size_t FindEnd(const std::string &text, size_t at, int inBrackets)
+{
+    int braces = 0, brackets = 0;
+    for (; at < text.size(); ++at) {
+        size_t next = Skip(text, at + 1, " \t");
+        bool endsLine = next == text.size() || text[next] == '\n'; // else it is a list: 1) a 2) b
+        if ((text[at] == '}' && braces == 0) ||
+            (text[at] == ')' && brackets == 0 && inBrackets && endsLine))
+            break;
+        braces += (text[at] == '{') - (text[at] == '}');
+        brackets += (text[at] == '(') - (text[at] == ')' && brackets > 0);
+    }
+    return at;
+}
+
+// The first field that stands at `at` or behind a comma, outside of braces; the size for none.
+static size_t FindField(const std::string &text, size_t at)
+{
+    int braces = 0;
+    for (at = Skip(text, at, Blanks); at < text.size() && !IsField(text, at);) {
+        do {
+            braces += (text[at] == '{') - (text[at] == '}' && braces > 0);
+            ++at;
+        } while (at < text.size() && (text[at - 1] != ',' || braces > 0));
+        at = Skip(text, at, Blanks);
+    }
+    return at;
+}
+
+// A comma behind the end of the entry, and a field right behind that, tell; or else the brace that
+// was to end the entry, behind a field.
 size_t BibText_FindLostFields(const char *text, BibSpan span, int inBrackets)
 {
     const std::string plain = WithoutComments(text, span);
-    const size_t begin = std::min(plain.find_first_not_of(std::string(Blanks) + "}"), plain.size());
-    size_t found = plain.size();
-    bool isLost = plain[begin] == ',';
-    int braces = 0, brackets = 0;
-    for (size_t at = begin; at < plain.size() && !(isLost && found < plain.size()); ++at) {
-        char c = plain[at];
-        bool mayBegin = at == begin || plain[at - 1] == ',';
-        if (mayBegin && braces == 0 && found == plain.size() && IsField(plain, at))
-            found = plain.find_first_not_of(Blanks, at);
-        bool isEnd = (c == '}' && braces == 0) || (c == ')' && brackets == 0 && inBrackets);
-        isLost = isLost || (isEnd && found < plain.size());
-        braces += (c == '{') - (c == '}' && braces > 0);
-        brackets += (c == '(') - (c == ')' && brackets > 0);
+    const std::string blanks = Blanks;
+    size_t begin = Skip(plain, 0, (blanks + "}").c_str());
+    size_t field = Skip(plain, begin, (blanks + ",").c_str());
+    bool isBehindComma = begin < plain.size() && plain[begin] == ',' && IsField(plain, field);
+    if (!isBehindComma) {
+        field = FindField(plain, begin);
+        if (FindEnd(plain, field, inBrackets) == plain.size())
+            return span.end;
     }
-    return isLost ? span.start + found : span.end;
+    return span.start + field;
 }

@@ -197,6 +197,13 @@ TEST_F(BibOutsideTest, IsAWarningWhenItIsAllThereIsAndNoComment)
     ExpectKept(Saved());
 }
 
+// Such as notes in UTF-16.
+TEST_F(BibOutsideTest, IsAnErrorInAFileThatIsNoText)
+{
+    Load(std::string("\xFE\xFF\0n\0o", 6));
+    EXPECT_EQ(1, file->errorCount);
+}
+
 TEST_F(BibOutsideTest, GoesToTheNextItemWhenItsOwnIsDropped)
 {
     EXPECT_EQ("% a\n% b\n@STRING{s = {S}}\n\n", SavedFrom("% a\n@string{}\n% b\n@string{s = {S}}"));

@@ -54,16 +54,10 @@ TEST(BibTextForm, TellsOfTheEncodingAndTheMark)
     EXPECT_EQ(BIB_FORM_CODE_PAGE, Form("\xEF\xBB"));
 }
 
-TEST(BibTextFindBadByte, NeedsUtf8Before)
+TEST(BibTextIsAscii, LooksAtEveryByte)
 {
-    auto badByte = [](const std::string &text) {
-        return text.substr(BibText_FindBadByte(text.data(), text.size()));
-    };
-    EXPECT_EQ("\xFC y", badByte("\xC3\xBC x \xFC y"));
-    EXPECT_EQ("\xFC", badByte("\xEF\xBB\xBF a \xFC"));
-    EXPECT_EQ("", badByte("\xC3\xBC"));
-    EXPECT_EQ("", badByte("a"));
-    EXPECT_EQ("", badByte("a \xFC \xC3\xBC"));
+    EXPECT_TRUE(BibText_IsAscii("a\x7F\xFC", 2));
+    EXPECT_FALSE(BibText_IsAscii("a\x7F\xFC", 3));
 }
 
 TEST(BibTextNormalise, MakesPlainLines)
@@ -123,7 +117,14 @@ TEST(BibTextFindLostFields, FindsFieldsBeforeTheBraceThatWasToEndTheEntry)
     EXPECT_EQ("year={1}}", LostFields("}\nyear={1}}"));
     EXPECT_EQ("a = 1, b = 2}", LostFields("a = 1, b = 2}"));
     EXPECT_EQ("b = 2 }", LostFields("a, b = 2 }"));
+    EXPECT_EQ("author+an.x:y! = {1}}", LostFields("author+an.x:y! = {1}}"));
+    EXPECT_EQ("ann\xC3\xA9"
+              "e = 1}",
+              LostFields("ann\xC3\xA9"
+                         "e = 1}"));
+    EXPECT_EQ("a = {b}, {c}, d = e }", LostFields("x, a = {b}, {c}, d = e }"));
     EXPECT_EQ("year = 1)", LostFields("year = 1)", true));
+    EXPECT_EQ("year = 1 )  \nx", LostFields("year = 1 )  \nx", true));
     EXPECT_EQ("year = (1))", LostFields("year = (1))", true));
     EXPECT_EQ("year = 1 (}", LostFields("year = 1 (}", true));
 }
@@ -132,17 +133,35 @@ TEST(BibTextFindLostFields, FindsFieldsBehindACommaThatFollowsTheEntry)
 {
     EXPECT_EQ("year = 1", LostFields(",\nyear = 1"));
     EXPECT_EQ("year\n= 1", LostFields("}\n, % a = b\nyear\n= 1"));
-    EXPECT_EQ("year = { }", LostFields(", {a, b = 1}, year = { }"));
+    EXPECT_EQ("a = {b}, {c = d}", LostFields(",, a = {b}, {c = d}"));
     EXPECT_EQ("year = \"}\"", LostFields("}}, year = \"}\""));
 }
 
 TEST(BibTextFindLostFields, FindsNoneElsewhere)
 {
-    for (const char *text :
-         {"", "}", "} year = 1", "year = 1", "= }", "{a = 1}", "% a = 1\n}", "% @b{\na = 1\n}",
-          "a = 1 % }", "a = 1)", "\n =}", ",", "},\n", ", year", ", and year = 1",
-          "http://a.b/c?d=e\n}", "=Part A=\n}", "Part A = B\n}", "misc{l, x = {y}}"})
+    for (const char *text : {"",
+                             "}",
+                             "} year = 1",
+                             ", vim: set ts=4, sw=4 :",
+                             ", {a, b = 1}, year = { }",
+                             "year = 1",
+                             "= }",
+                             "{a = 1}",
+                             "% a = 1\n}",
+                             "% @b{\na = 1\n}",
+                             "a = 1 % }",
+                             "a = 1)",
+                             "\n =}",
+                             ",",
+                             "},\n",
+                             ", year",
+                             ", and year = 1",
+                             "http://a.b/c?d=e\n}",
+                             "=Part A=\n}",
+                             "Part A = B\n}",
+                             "misc{l, x = {y}}"})
         EXPECT_EQ("", LostFields(text)) << text;
-    for (const char *text : {"(year = 1)", ")", ") year = 1", "% @b(\na = 1\n)"})
+    for (const char *text : {"1) a = {b}, c = d\n2) foo", "a = 1) b", "(year = 1)", ")",
+                             ") year = 1", "% @b(\na = 1\n)"})
         EXPECT_EQ("", LostFields(text, true)) << text;
 }

@@ -45,7 +45,7 @@ TEST(KeyRead, FitsInUtf8WhateverItIs)
     EXPECT_TRUE(key.fits);
     EXPECT_EQ(&EncodingUtf8, key.encoding);
     EXPECT_FALSE(Key_Read(L"a\u00AB", &EncodingUtf8).fits);
-    EXPECT_EQ("The key includes characters that can't be stored in UTF-8.", Key_MisfitText(key));
+    EXPECT_EQ("The key includes guillemets, which mark abbreviations.", Key_MisfitText(key));
 }
 
 TEST(KeyRead, TellsOfGuillemets)

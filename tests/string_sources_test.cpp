@@ -160,16 +160,26 @@ TEST_F(StringsSources, KnowTheNamesInAText)
     Load("@string{\xF6 = {B}}\n@string{Acm = {C}}\n");
     StringSources sources = Read("[String]\nOther = *Other\n[*Other]\njcp = J\n");
     auto unknown = [&](const wchar_t *text, const wchar_t *before) {
-        return Strings_UnknownIn(&sources, text, before);
+        std::wstring line = Strings_UnknownIn(&sources, L"a", text, before);
+        size_t start = line.find(L'\xAB');
+        return start == line.npos ? line : line.substr(start, line.find(L" is known") - start);
     };
     EXPECT_EQ(L"", unknown(L"", L""));
     EXPECT_EQ(L"",
               unknown(L"\u00AB\u00FCX\u00BB \u00AB\u00F6\u00BB \u00ABACM\u00BB \u00ABjcp\u00BB "
                       L"\u00ABDec\u00BB",
                       L""));
-    EXPECT_EQ(L"\u00ABa\u00BB, \u00ABb c\u00BB",
-              unknown(L"\u00ABa\u00BB\u00ABb c\u00BB \u00ABA\u00BB \u00ABd", L""));
+    EXPECT_EQ(L"\u00ABa\u00BB, \u00AB\u0416\u00BB",
+              unknown(L"\u00ABa\u00BB\u00AB\u0416\u00BB \u00ABA\u00BB \u00ABd", L""));
+    EXPECT_EQ(
+        L"", unknown(L"\u00ABb c\u00BB \u00AB\u00BB \u00AB1\u00BB \u00AB\\\u00BB", L"")); // refused
     EXPECT_EQ(L"\u00ABb\u00BB", unknown(L"\u00ABa\u00BB\u00ABb\u00BB", L"x\u00ABa\u00BB"));
+    EXPECT_EQ(L"\u00ABb\u00BB", unknown(L"\u00ABa \u00ABb\u00BB c\u00BB", L""));
+    std::wstring many;
+    for (wchar_t c = L'a'; c <= L'z'; ++c)
+        many += L'\xAB' + std::wstring(100, c) + L'\xBB';
+    EXPECT_LT(unknown(many.c_str(), L"").size(), 250u);
+    EXPECT_EQ(L"", unknown(std::wstring(100000, L'\xAB').c_str(), L""));
 }
 
 static std::vector<StringLine> WithEncoding(const Lines &texts)

@@ -415,10 +415,12 @@ bool Cartulo::Commit()
     int answer = Ask(Grid_Question(&changes), wxYES_NO | wxCANCEL);
     if (answer != wxYES)
         return answer == wxNO;
+    if (!Grid_ChangesOnlyType(&changes) && !(AcceptLosses() && CheckRows()))
+        return false;
     if (changes.type && !TakeType(&type))
         return false;
     if (!Grid_ChangesOnlyType(&changes))
-        return AcceptLosses() && CheckRows() && ReplaceEntry(type);
+        return ReplaceEntry(type);
     m_entry->type = type;
     SetModified(m_file);
     return true;
@@ -429,8 +431,9 @@ bool Cartulo::TakeType(int *type)
 {
     *type = Entry_TypeIn(m_set.files[m_file], *type);
     if (*type < 0)
-        ShowWarning(CommitTitle, "An entry of this type can't be stored in " + EncodingText() +
-                                     ".\n\nChoose another type.");
+        ShowWarning(CommitTitle, "An entry of this type can't be stored in this file: its encoding "
+                                 "lacks a letter of the name, or there are too many types.\n\n"
+                                 "Choose another type.");
     return *type >= 0;
 }
 

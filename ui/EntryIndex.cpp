@@ -144,7 +144,7 @@ struct Prefix {
     const EncodingRecord *encoding;
     bool isForeign; // the encoding lacks a character
     std::string bytes;
-    std::u32string folded; // of UTF-8
+    std::u32string folded; // of UTF-8, where bytes will not do
 };
 
 static Prefix PrefixIn(const wchar_t *text, const EncodingRecord *encoding)
@@ -152,8 +152,9 @@ static Prefix PrefixIn(const wchar_t *text, const EncodingRecord *encoding)
     Prefix prefix = {encoding, false, Enc_Encode(text, encoding), {}};
     for (; *text; ++text)
         prefix.isForeign |= !Enc_Holds(*text, encoding);
-    if (encoding == &EncodingUtf8)
-        prefix.folded = Enc_FoldUtf8(prefix.bytes.c_str());
+    std::u32string folded = Enc_FoldUtf8(prefix.bytes.c_str());
+    if (encoding == &EncodingUtf8 && folded.size() < prefix.bytes.size())
+        prefix.folded = folded;
     return prefix;
 }
 
@@ -162,7 +163,7 @@ static bool RowBeginsWith(const IndexItem *item, BibFile *const *files, int file
 {
     if (prefix.isForeign)
         return false;
-    if (prefix.folded.size() == prefix.bytes.size() || prefix.folded.empty())
+    if (prefix.folded.empty())
         return RowBeginsWith(item, files, fileCount, prefix.bytes.c_str());
     return Enc_Utf8BeginsWith(EntryIndex_RowText(item, files, fileCount).c_str(), prefix.folded);
 }

@@ -51,9 +51,9 @@ enum TypeAheadVerdict {
 // milliseconds, which may wrap around, `selection` the row that is selected now.
 //
 // Row texts are compared as store text, each in the encoding of its file. A character that this
-// lacks matches nothing. Case is ignored: of all letters in UTF-8, else of the ASCII letters. The
-// whole row text is searched: unlike the order of the rows, the search does not skip a leading
-// backslash or brace.
+// lacks matches nothing. Case is ignored: of all letters in UTF-8 (ASCII text finds ASCII letters
+// only), else of the ASCII letters. The whole row text is searched: unlike the order of the rows,
+// the search does not skip a leading backslash or brace.
 TypeAheadVerdict TypeAhead_Key(TypeAhead *state, uint32_t key, bool modified, int32_t now,
                                int selection, const IndexItem *index, int count,
                                BibFile *const *files, int fileCount);

@@ -350,21 +350,12 @@ static bool HoldsGuillemets(const BibEntry *entry, const EncodingRecord *encodin
         [encoding](const BibField &field) { return Value_HoldsGuillemets(field.value, encoding); });
 }
 
-static std::wstring RowLosses(const FieldGrid *grid, const GridRow *row, bool textGuillemets)
+static std::wstring RowLosses(const FieldGrid *grid, const GridRow *row, bool textGuillemets,
+                              const StringSources *sources)
 {
-    return Value_Losses(Enc_Decode(row->key.c_str(), grid->encoding), row->text, row->stored,
-                        textGuillemets, grid->encoding);
-}
-
-static std::wstring RowUnknown(const FieldGrid *grid, const GridRow *row,
-                               const StringSources *sources)
-{
-    std::wstring names =
-        sources ? Strings_UnknownIn(sources, row->text, row->filled) : std::wstring();
-    if (names.empty())
-        return names;
-    return L"`" + Enc_Decode(row->key.c_str(), grid->encoding) + L"': no abbreviation " + names +
-           L" is known. As text, quotation marks are typed in another way, like << and >>.\n";
+    std::wstring key = Enc_Decode(row->key.c_str(), grid->encoding);
+    std::wstring losses = Value_Losses(key, row->text, row->stored, textGuillemets, grid->encoding);
+    return sources ? losses + Strings_UnknownIn(sources, key, row->text, row->filled) : losses;
 }
 
 std::wstring Grid_Losses(const FieldGrid *grid, const StringSources *sources)
@@ -374,8 +365,7 @@ std::wstring Grid_Losses(const FieldGrid *grid, const StringSources *sources)
     std::wstring text;
     for (int i = 0; i < grid->count; ++i)
         if (IsChanged(&grid->rows[i]))
-            text += RowLosses(grid, &grid->rows[i], textGuillemets) +
-                    RowUnknown(grid, &grid->rows[i], sources);
+            text += RowLosses(grid, &grid->rows[i], textGuillemets, sources);
     return text.empty() ? text : text + Value_LossesQuestion;
 }
 

@@ -25,6 +25,8 @@ TypedKey Key_Read(const wchar_t *typed, const EncodingRecord *encoding)
 
 std::string Key_MisfitText(const TypedKey &key)
 {
+    if (key.encoding == &EncodingUtf8)
+        return "The key includes guillemets, which mark abbreviations.";
     return std::string("The key includes characters that can't be stored in ") +
            Enc_Label(key.encoding) + ".";
 }

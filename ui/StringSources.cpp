@@ -125,14 +125,24 @@ static std::wstring Lower(std::wstring name)
     return name;
 }
 
-// With the guillemets around each.
+static bool IsName(const std::wstring &name)
+{
+    return Bib_IsName(Enc_Encode(name.c_str(), &EncodingUtf8).c_str()) != 0;
+}
+
+// With the guillemets around each. What can't be a name is refused anyway.
 static std::vector<std::wstring> NamesIn(const std::wstring &text)
 {
     std::vector<std::wstring> names;
-    for (size_t open = text.find(L'\xAB'); open != text.npos; open = text.find(L'\xAB', open + 1)) {
-        size_t close = text.find(L'\xBB', open);
-        if (close != text.npos)
-            names.push_back(text.substr(open, close + 1 - open));
+    size_t open = text.npos; // of the last one that may begin a name
+    for (size_t at = 0; at < text.size(); ++at) {
+        if (text[at] == L'\xAB')
+            open = at;
+        if (text[at] != L'\xBB')
+            continue;
+        if (open != text.npos && IsName(text.substr(open + 1, at - open - 1)))
+            names.push_back(text.substr(open, at + 1 - open));
+        open = text.npos;
     }
     return names;
 }
@@ -149,20 +159,41 @@ static Names KnownNames(const StringSources *sources)
     return known;
 }
 
-std::wstring Strings_UnknownIn(const StringSources *sources, const std::wstring &text,
-                               const std::wstring &before)
+static std::vector<std::wstring> UnknownNames(const StringSources *sources,
+                                              const std::wstring &text, const std::wstring &before)
 {
     Names known;
-    std::wstring unknown;
+    std::vector<std::wstring> unknown;
     for (const std::wstring &name : NamesIn(text)) {
         if (before.find(name) != before.npos)
             continue;
         if (known.empty())
             known = KnownNames(sources);
         if (known.insert(Lower(name.substr(1, name.size() - 2))).second)
-            unknown += (unknown.empty() ? L"" : L", ") + name;
+            unknown.push_back(name);
     }
     return unknown;
+}
+
+// The first ones, and no more of each than fits in a box.
+static std::wstring ListNames(const std::vector<std::wstring> &names)
+{
+    const size_t most = 5, longest = 40;
+    std::wstring list;
+    for (size_t i = 0; i < names.size() && i < most; ++i)
+        list += (i > 0 ? L", " : L"") +
+                (names[i].size() > longest ? names[i].substr(0, longest) + L"..." : names[i]);
+    return names.size() > most ? list + L", ..." : list;
+}
+
+std::wstring Strings_UnknownIn(const StringSources *sources, const std::wstring &name,
+                               const std::wstring &text, const std::wstring &before)
+{
+    std::vector<std::wstring> unknown = UnknownNames(sources, text, before);
+    if (unknown.empty())
+        return L"";
+    return L"`" + name + L"': no abbreviation " + ListNames(unknown) +
+           L" is known. As text, quotation marks are typed in another way, like << and >>.\n";
 }
 
 // --- Files ---

@@ -56,10 +56,11 @@ LineChange Strings_Compare(const std::vector<StringLine> &before,
 
 std::string Strings_KeyOf(const StringLine &line); // its text up to the first blank
 
-// The abbreviations in a text of a control, like "«a», «b»", that are not in the text `before`, and
-// of which nobody knows: no open file, no list, and not BibTeX's styles, which define the months.
-std::wstring Strings_UnknownIn(const StringSources *sources, const std::wstring &text,
-                               const std::wstring &before);
+// A line for a question (Value_LossesQuestion) about the abbreviations that were typed for `name`:
+// those in the text that were not in the text `before`, and of which nobody knows: no open file, no
+// list, and not BibTeX's styles, which define the months. "" for none.
+std::wstring Strings_UnknownIn(const StringSources *sources, const std::wstring &name,
+                               const std::wstring &text, const std::wstring &before);
 
 // The file whose abbreviations may be changed now; null when the source is no file or read-only.
 BibFile *Strings_WritableFile(const StringSources *sources, int source);

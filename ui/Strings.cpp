@@ -323,7 +323,8 @@ Cartulo_Strings_Edit::Cartulo_Strings_Edit(Cartulo_Strings *strings, const wxStr
                                            BibString *string)
     : wxDialog(strings, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
-      m_file(strings->WritableFile()), m_encoding(Bib_Encoding(m_file)), m_string(string)
+      m_sources(strings->Sources()), m_file(strings->WritableFile()),
+      m_encoding(Bib_Encoding(m_file)), m_string(string)
 {
     SetFont(wxFontInfo(10));
     m_key = new wxTextCtrl(this, ID_STRING_KEY);
@@ -404,9 +405,10 @@ bool Cartulo_Strings_Edit::AcceptValue(const std::string &value)
 bool Cartulo_Strings_Edit::AcceptLosses()
 {
     const char *stored = m_string ? m_string->value : "";
+    std::wstring key = m_key->GetValue().ToStdWstring(), text = m_value->GetValue().ToStdWstring();
     std::wstring losses =
-        Value_Losses(m_key->GetValue().ToStdWstring(), m_value->GetValue().ToStdWstring(), stored,
-                     Value_HoldsGuillemets(stored, m_encoding), m_encoding);
+        Value_Losses(key, text, stored, Value_HoldsGuillemets(stored, m_encoding), m_encoding) +
+        Strings_UnknownIn(m_sources, key, text, m_filled.ToStdWstring());
     if (losses.empty() || Box_Ask(this, Caption, losses + Value_LossesQuestion, wxNO_DEFAULT))
         return true;
     Text_Focus(m_value);

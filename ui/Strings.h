@@ -20,7 +20,11 @@ public:
     // to insert into. Both outlive the dialog.
     Cartulo_Strings(Cartulo *panel, wxTextCtrl *target);
 
-    BibFile *WritableFile() const; // of the list, where that can be changed; null for none
+    BibFile *WritableFile() const;
+    const StringSources *Sources() const
+    {
+        return &m_sources;
+    } // of the list, where that can be changed; null for none
 
 private:
     wxSizer *CreateSourceRow();
@@ -73,7 +77,8 @@ private:
     bool Edit();
     void OnOK(wxCommandEvent &event);
 
-    BibFile *m_file;                  // outlives the dialog, as m_string does
+    const StringSources *m_sources; // these outlive the dialog
+    BibFile *m_file;
     const EncodingRecord *m_encoding; // of the file
     BibString *m_string;              // null for a new one
     wxTextCtrl *m_key;                // child windows
