@@ -413,6 +413,7 @@ void Cartulo::ShowOpenFiles()
     Update_Tools();
     ClearEntry();
     ShowRow("OnIndexChanged");
+    ShowEncoding(this, EncodingText()); // once: each change is drawn at once, which takes its time
     ShowStatus(this, CountText());
 }
 
@@ -626,6 +627,7 @@ void Cartulo::ShowSelection()
         ShowEntry(item->entry, item->file);
     else
         ClearEntry();
+    ShowEncoding(this, EncodingText());
 }
 
 // Shows the selected row. `handler` names the caller in the log.

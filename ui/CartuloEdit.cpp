@@ -264,7 +264,6 @@ void Cartulo::ClearEntry()
     m_entry = nullptr;
     m_file = -1;
     m_typeName.clear();
-    ShowEncoding(this, EncodingText());
     m_fileName->SetLabelText("");
     m_fileName->UnsetToolTip();
     m_type->SetSelection(wxNOT_FOUND);
