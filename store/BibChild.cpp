@@ -32,7 +32,7 @@ void report_error(bt_errclass errclass, char *filename, int line, char *item_des
                   char *fmt, va_list arglist);
 void zzerrstd(const char *text);
 char *strlwr(char *text);
-void zzmode(int mode);
+void zzmode(int mode) noexcept;
 void comment();
 
 void dump_ast(char *heading, AST *ast); // prints to standard output
@@ -283,7 +283,7 @@ static void ReportLostFields(BibSpan span)
 // The lexer has come to the end of the text between two items.
 static void EndOutside(size_t end)
 {
-    BibSpan span = BibText_TrimLines(Source.text, {Source.start, end});
+    BibSpan span = BibText_TrimLines(Source.text, {Source.start, std::max(Source.start, end)});
     if (span.start == span.end)
         return;
     ReportLostFields(span);
@@ -301,9 +301,10 @@ static int IsInBrackets(size_t at)
 
 static void FollowMode(int mode)
 {
-    // It counts the end of the file as well.
+    // It counts the end of the file as well. At the start it still has the count of another text,
+    // when this process has parsed one.
     size_t read = std::min(static_cast<size_t>(zzendcol), Source.length);
-    if (mode == LEXER_TOP && Source.mode != LEXER_TOP)
+    if (mode == LEXER_TOP && Source.mode > LEXER_TOP)
         Source.start = read;
     if (mode != LEXER_TOP && Source.mode == LEXER_TOP) { // an @ was read
         EndOutside(read - 1);
@@ -402,7 +403,7 @@ static void ReportBadByte(const char *text, size_t length, int form)
                     "this is no UTF-8 any more, so the whole file is taken for CP1252");
 }
 
-void BibChild_Parse(void *argument)
+void BibChild_Parse(void *argument) noexcept
 {
     static BibItems items;
     const BibParseJob *job = static_cast<const BibParseJob *>(argument);
@@ -507,7 +508,7 @@ static void (*const OriginalMode)(int) = Replaced<void(int)>("zzmode");
 static void (*const OriginalComment)() = Replaced<void()>("comment");
 
 // The lexer enters an item, a string in it, or leaves it.
-REPLACES_LIBRARY void zzmode(int mode)
+REPLACES_LIBRARY void zzmode(int mode) noexcept
 {
     if (Sending)
         FollowMode(mode);

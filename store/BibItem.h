@@ -58,7 +58,7 @@ struct BibParseJob {
     const char *text;
     const char *path; // for the parser's own use
 };
-void BibChild_Parse(void *job);
+void BibChild_Parse(void *job) noexcept; // lack of memory ends the child
 
 // --- BibLoad.cpp ---
 

@@ -360,6 +360,18 @@ TEST_F(BibOutsideTest, IsWrittenEvenWhenItsItemIsTakenAwayWithoutAWord)
     file->entries = entries;
 }
 
+TEST_F(BibOutsideTest, IsFoundAfterThisProcessHasParsedAnotherText)
+{
+    std::string path = folder.Write("c.bib", std::string(AllKinds) + AllKinds);
+    FILE *stream = fopen(path.c_str(), "r");
+    boolean status;
+    while (AST *ast = bt_parse_entry(stream, path.data(), BTO_NOSTORE, &status))
+        bt_free_ast(ast);
+    fclose(stream);
+    ExpectKept(AllKinds);
+    ExpectKept("% head\n@misc{k,\n}\n");
+}
+
 TEST_F(BibOutsideTest, IsNotTakenFromTheEndByAnItemThatIsParsedLater)
 {
     Load("@misc{a,\n}\n% end\n");
