@@ -421,6 +421,7 @@ void BibChild_Parse(void *argument) noexcept
     SendForm(form);
     length = BibText_Normalise(text, length);
     ReportBadByte(text, length, form);
+    ReportMarks(text, length);
     Source.text = text;
     Source.length = length;
     const size_t words = BibText_FindWords(text, {0, length});
@@ -431,7 +432,6 @@ void BibChild_Parse(void *argument) noexcept
     FILE *stream = Sys_OpenText(text, length);
     if (!stream)
         Leave(BIB_END_UNREADABLE);
-    ReportMarks(text, length);
     Sys_UsePlainLocale();
     bt_set_stringopts(BTE_MACRODEF, BibStringOptions);
     bt_set_stringopts(BTE_REGULAR, BibStringOptions);

@@ -197,6 +197,13 @@ TEST_F(BibOutsideTest, IsAWarningWhenItIsAllThereIsAndNoComment)
     ExpectKept(Saved());
 }
 
+// As everywhere in a file: it would be one as soon as there is an entry.
+TEST_F(BibOutsideTest, IsAnErrorWithMarksOfAbbreviations)
+{
+    Load("% a\2b\n");
+    EXPECT_EQ(1, file->errorCount);
+}
+
 // Such as notes in UTF-16.
 TEST_F(BibOutsideTest, IsAnErrorInAFileThatIsNoText)
 {
