@@ -351,8 +351,10 @@ TEST_F(Place, IsTheUsersOnceTheWindowIsOpen)
     ExpectAt({50, 50, 800, 600});
     ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
     frame->SetSize(wxRect(300, 200, 810, 610));
+    // A window manager may answer in two steps, so the window may be elsewhere for a moment; but
+    // never where the last run left it.
+    EXPECT_FALSE(WaitFor([this] { return frame->GetRect() == wxRect(50, 50, 800, 600); }, 200));
     ExpectAt({300, 200, 810, 610});
-    ASSERT_FALSE(WaitFor([&] { return frame->GetRect() != wxRect(300, 200, 810, 610); }, 200));
 }
 
 TEST_F(Place, IsLoggedAtTheEnd)
