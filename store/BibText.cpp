@@ -190,16 +190,22 @@ static bool IsField(const std::string &text, size_t at)
     return end > at && equals < text.size() && text[equals] == '=';
 }
 
-// Where the text goes on behind a brace or bracket that nothing has opened, from `at` on; its size
-// when there is none.
+// Nothing but blanks follows on the line.
+static bool EndsLine(const std::string &text, size_t at)
+{
+    size_t next = Skip(text, at + 1, " \t");
+    return next == text.size() || text[next] == '\n';
+}
+
+// Where the first brace stands that nothing has opened, from `at` on, or such a bracket at the end
+// of a line (else it is a list: 1) a 2) b); the size when there is none.
 static size_t FindEnd(const std::string &text, size_t at, int inBrackets)
 {
     int braces = 0, brackets = 0;
     for (; at < text.size(); ++at) {
-        size_t next = Skip(text, at + 1, " \t");
-        bool endsLine = next == text.size() || text[next] == '\n'; // else it is a list: 1) a 2) b
-        if ((text[at] == '}' && braces == 0) ||
-            (text[at] == ')' && brackets == 0 && inBrackets && endsLine))
+        bool isBrace = text[at] == '}' && braces == 0;
+        bool isBracket = text[at] == ')' && brackets == 0 && inBrackets;
+        if (isBrace || (isBracket && EndsLine(text, at)))
             break;
         braces += (text[at] == '{') - (text[at] == '}');
         brackets += (text[at] == '(') - (text[at] == ')' && brackets > 0);

@@ -216,6 +216,15 @@ TEST_F(BibOutsideTest, GoesToTheNextItemWhenItsOwnIsDropped)
     EXPECT_EQ("% a\n% b\n@STRING{s = {S}}\n\n", SavedFrom("% a\n@string{}\n% b\n@string{s = {S}}"));
 }
 
+// Each line was once searched again from every one of its characters.
+TEST_F(BibOutsideTest, MayBeAVeryLongLine)
+{
+    const std::string text =
+        "@misc{a,\n\tx = 1\n}\nnote, x = y\n% " + std::string(300000, ' ') + "z\n@misc{b,\n}\n";
+    EXPECT_EQ(text, SavedFrom(text));
+    EXPECT_EQ(0, file->errorCount) << Messages(file);
+}
+
 TEST_F(BibOutsideTest, StandsBeforeTheFirstOfSeveralAbbreviations)
 {
     EXPECT_EQ("% a\n@STRING{s = {S}}\n@STRING{t = {T}}\n% b\n@STRING{u = {U}}\n\n",
