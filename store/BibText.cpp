@@ -92,6 +92,12 @@ int BibText_CountLines(const char *text, BibSpan span)
 int BibText_IsAscii(const char *text, size_t length)
 {
     return std::all_of(text, text + length, [](char c) { return (c & 0x80) == 0; });
+// What empty lines hold. A form feed may stand for a new page, so its line is none.
+static int IsEmpty(char c)
+{
+    return c == ' ' || c == '\t' || c == '\n';
+}
+
 }
 
 // Behind blanks and byte order marks: those stand in the middle of files that were put together.
@@ -100,7 +106,7 @@ static size_t SkipStart(const char *text, BibSpan span)
     size_t at = span.start;
     for (size_t before = span.end; at != before;) {
         before = at;
-        while (at < span.end && IsBlank(text[at]))
+        while (at < span.end && IsEmpty(text[at]))
             ++at;
         if (HasMark(text + at, span.end - at))
             at += MARK_SIZE;
@@ -111,11 +117,11 @@ static size_t SkipStart(const char *text, BibSpan span)
 BibSpan BibText_TrimLines(const char *text, BibSpan span)
 {
     size_t first = SkipStart(text, span), last = span.end;
-    while (last > first && IsBlank(text[last - 1]))
+    while (last > first && IsEmpty(text[last - 1]))
         --last;
     if (first == last)
         return {first, first};
-    while (first > span.start && IsBlank(text[first - 1]) && text[first - 1] != '\n')
+    while (first > span.start && IsEmpty(text[first - 1]) && text[first - 1] != '\n')
         --first;
     while (last < span.end && text[last] != '\n')
         ++last;

@@ -225,6 +225,12 @@ TEST_F(BibOutsideTest, MayBeAVeryLongLine)
     EXPECT_EQ(0, file->errorCount) << Messages(file);
 }
 
+TEST_F(BibOutsideTest, KeepsFormFeeds)
+{
+    const std::string text = "@misc{a,\n}\n\f\n@misc{b,\n}\n";
+    EXPECT_EQ(text, SavedFrom(text));
+}
+
 TEST_F(BibOutsideTest, StandsBeforeTheFirstOfSeveralAbbreviations)
 {
     EXPECT_EQ("% a\n@STRING{s = {S}}\n@STRING{t = {T}}\n% b\n@STRING{u = {U}}\n\n",

@@ -96,6 +96,7 @@ TEST(BibTextTrimLines, DropsMarksAtTheStart)
 TEST(BibTextHasNoItem, LooksForTheSignOutsideComments)
 {
     for (const std::string text : {"", "\n \t\n", "% a\n", "a %\n", "  % a @b{\n\n\t%%\n"})
+    EXPECT_EQ("\f\n\v", Trimmed("\n\f\n\v\n")); // new pages
         EXPECT_TRUE(BibText_HasNoItem(text.data(), text.size())) << text;
     for (const std::string text : {"@", "% a\n@\n", "a%@\n", "a% @\n", "% a\nb@"})
         EXPECT_FALSE(BibText_HasNoItem(text.data(), text.size())) << text;
