@@ -288,6 +288,18 @@ size_t Enc_Utf8Length(const char *text, size_t length)
 
 int Enc_IsUtf8(const char *text, size_t length)
 {
+// Neither other letters nor marks: most values are like that.
+static bool IsPlain(const char *text)
+{
+    size_t length = strlen(text);
+    return AsciiLength(text, length) == length && !strpbrk(text, "\2\5");
+}
+
+int Enc_NeedsFolding(const char *text, const EncodingRecord *encoding)
+{
+    return encoding == &EncodingUtf8 && !IsPlain(text);
+}
+
     return Enc_Utf8Length(text, length) == length;
 }
 
@@ -315,13 +327,6 @@ int Enc_Utf8BeginsWith(const char *text, const std::u32string &folded)
         if (!*text || FoldCase(NextCharacter(&text)) != c)
             return 0;
     return 1;
-}
-
-// Neither other letters nor marks: most values are like that.
-static bool IsPlain(const char *text)
-{
-    size_t length = strlen(text);
-    return AsciiLength(text, length) == length && !strpbrk(text, "\2\5");
 }
 
 int Enc_Utf8Contains(const char *text, const std::u32string &folded)

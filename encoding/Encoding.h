@@ -84,6 +84,10 @@ size_t Enc_PutUtf8(char *out, uint32_t character);
 // The characters of a UTF-8 text for a search: without differences of case, and with guillemets for
 // marks.
 std::u32string Enc_FoldUtf8(const char *text);
+// 0 when a search for the text may compare bytes: in a code page, or when it is ASCII. Then it
+// finds ASCII letters only.
+int Enc_NeedsFolding(const char *text, const EncodingRecord *encoding);
+
 
 // 1 when the folded UTF-8 text contains the folded characters, or begins with them.
 int Enc_Utf8Contains(const char *text, const std::u32string &folded);

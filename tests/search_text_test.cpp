@@ -58,6 +58,9 @@ TEST_F(SearchTextTest, IgnoresTheCaseOfAllLettersInUtf8)
     EXPECT_TRUE(Finds("\xE2\x84\xAA" // the sign for kelvin
                       "1",
                       "k1"));
+    EXPECT_TRUE(Finds("Ge\xC5\xBF", "Die Ge\xC5\xBF" // long s, which folds to a letter of ASCII
+                                    "chichte"));
+    EXPECT_FALSE(Finds("Ges", "Ge\xC5\xBF"));
     EXPECT_TRUE(Finds("\x02JAN\x05 \xC3\x9C", "a} # jan # { \xC3\xBC"));
 }
 

@@ -152,11 +152,8 @@ static Prefix PrefixIn(const wchar_t *text, const EncodingRecord *encoding)
     Prefix prefix = {encoding, false, Enc_Encode(text, encoding), {}};
     for (; *text; ++text)
         prefix.isForeign |= !Enc_Holds(*text, encoding);
-    if (encoding != &EncodingUtf8)
-        return prefix;
-    std::u32string folded = Enc_FoldUtf8(prefix.bytes.c_str());
-    if (folded.size() < prefix.bytes.size()) // there are letters outside ASCII
-        prefix.folded = folded;
+    if (Enc_NeedsFolding(prefix.bytes.c_str(), encoding))
+        prefix.folded = Enc_FoldUtf8(prefix.bytes.c_str());
     return prefix;
 }
 

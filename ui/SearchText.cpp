@@ -4,11 +4,6 @@
 
 #include "encoding/Encoding.h"
 
-static bool IsAscii(char32_t c)
-{
-    return c < 0x80;
-}
-
 SearchText Search_For(const char *text, const BibFile *file)
 {
     SearchText search = {};
@@ -18,13 +13,8 @@ SearchText Search_For(const char *text, const BibFile *file)
     const EncodingRecord *from = Enc_Current(), *to = Bib_Encoding(file);
     search.bytes = Enc_Recode(text, from, to);
     search.isForeign = Enc_Recode(search.bytes.c_str(), to, from) != text;
-    if (to != &EncodingUtf8)
-        return search;
-    std::u32string folded = Enc_FoldUtf8(search.bytes.c_str());
-    if (std::all_of(folded.begin(), folded.end(), IsAscii))
-        search.bytes.assign(folded.begin(), folded.end());
-    else
-        search.folded = folded;
+    if (Enc_NeedsFolding(search.bytes.c_str(), to))
+        search.folded = Enc_FoldUtf8(search.bytes.c_str());
     return search;
 }
 
