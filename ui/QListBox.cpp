@@ -151,7 +151,7 @@ static void LogKey(uint32_t key, int32_t now, int32_t last)
 
 void QListBox::OnChar(wxKeyEvent &event)
 {
-    uint32_t key = uint16_t(event.GetUnicodeKey());
+    uint32_t key = uint32_t(event.GetUnicodeKey());
     int32_t now = int32_t(event.GetTimestamp());
     LogKey(key, now, m_typeAhead.lastKeyTime);
     switch (TypeAhead_Key(&m_typeAhead, key, event.GetModifiers() != 0, now, GetSelection(),

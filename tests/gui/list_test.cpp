@@ -210,7 +210,11 @@ TEST_F(ListInWindow, LogsEachKeyInAWholeLine)
     const struct {
         wxChar key;
         const char *character;
-    } keys[] = {{0, "0( )"}, {8, "8( )"}, {'q', "113(q)"}, {0xFC, "252(\xC3\xBC)"}};
+    } keys[] = {{0, "0( )"},
+                {8, "8( )"},
+                {'q', "113(q)"},
+                {0xFC, "252(\xC3\xBC)"},
+                {0x1D4B3, "119987(\xF0\x9D\x92\xB3)"}};
     for (const auto &row : keys) {
         ForgetLog();
         TypeIntoList(row.key, 2000);
