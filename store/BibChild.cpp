@@ -367,11 +367,21 @@ static void PrintTree(AST *ast)
     fflush(stdout);
 }
 
+// A lone @ in front of an entry hides in the name of its type.
+static void ReportSignInType(AST *ast)
+{
+    const char *type = bt_entry_type(ast);
+    if (type && *type == '@')
+        PackMessage(Sending, BTERR_LEXWARN, ast->line,
+                    "an @ stands before that of this entry, it becomes a part of the type");
+}
+
 static BibEnd ParseAll(FILE *stream, const char *path)
 {
     boolean status;
     while (AST *ast = bt_parse_entry(stream, const_cast<char *>(path), BTO_NOSTORE, &status)) {
         PackOutside(Sending, static_cast<size_t>(ast->offset));
+        ReportSignInType(ast);
         size_t pieces = BibItems_PackAst(Sending, ast);
         bt_metatype metatype = bt_entry_metatype(ast);
         if (metatype < BTE_REGULAR || metatype > BTE_MACRODEF)
@@ -403,6 +413,14 @@ static void ReportBadByte(const char *text, size_t length, int form)
                     "this is no UTF-8 any more, so the whole file is taken for CP1252");
 }
 
+static void ReportNul(const char *text, size_t length)
+{
+    if (const void *nul = memchr(text, 0, length))
+        PackMessage(Sending, BTERR_LEXWARN,
+                    BibText_LineAt(text, static_cast<const char *>(nul) - text),
+                    "a NUL character is not kept, a blank takes its place (more may follow)");
+}
+
 void BibChild_Parse(void *argument) noexcept
 {
     static BibItems items;
@@ -419,6 +437,7 @@ void BibChild_Parse(void *argument) noexcept
     const int form = BibText_Form(text, length);
     const bool isBinary = memchr(text, 0, length) != nullptr;
     SendForm(form);
+    ReportNul(text, length);
     length = BibText_Normalise(text, length);
     ReportBadByte(text, length, form);
     ReportMarks(text, length);

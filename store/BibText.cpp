@@ -75,6 +75,14 @@ size_t BibText_Normalise(char *text, size_t length)
     return length;
 }
 
+int BibText_LineAt(const char *text, size_t at)
+{
+    int line = 1;
+    for (size_t i = 0; i < at; ++i)
+        line += text[i] == '\n' || (text[i] == '\r' && text[i + 1] != '\n');
+    return line;
+}
+
 // --- Lines ---
 
 static const char Blanks[] = " \t\n\v\f";

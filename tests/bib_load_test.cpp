@@ -278,6 +278,10 @@ TEST_F(BibLoad, ReadsNulAsABlank)
     Load(std::string("@misc{k, title = {a\0b}}", 23));
     EXPECT_EQ("title=a b", Fields());
     EXPECT_EQ(0, file->errorCount);
+    Load(std::string("\r\n@misc{k,\r\n\ttitle = {a\0b\0}}\r\n", 30));
+    EXPECT_EQ("WARNING: line 3: a NUL character is not kept, a blank takes its place (more may "
+              "follow)\r\n",
+              Messages(file));
 }
 
 TEST_F(BibLoad, TakesOffAByteOrderMark)
@@ -292,6 +296,16 @@ TEST_F(BibLoad, ReadsALastCommentLineWithoutALineEnd)
     Load("@misc{k, title = {x}}\n% the end");
     EXPECT_EQ("k ", Keys());
     EXPECT_EQ(0, file->errorCount);
+}
+
+TEST_F(BibLoad, TellsOfASignThatHidesInAType)
+{
+    Load("@misc{k, a = 1}\n@\n@misc{l, b = 2}\n");
+    EXPECT_EQ("k l ", Keys());
+    EXPECT_STREQ("@misc", BibTypeTable[file->entries->next->type]);
+    EXPECT_EQ("WARNING: line 3: an @ stands before that of this entry, it becomes a part of the "
+              "type\r\n",
+              Messages(file));
 }
 
 TEST_F(BibLoad, CountsATokenThatTheParserDrops)

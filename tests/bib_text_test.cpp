@@ -70,6 +70,17 @@ TEST(BibTextNormalise, MakesPlainLines)
     EXPECT_EQ("\n", Normalised("\xEF\xBB\xBF\n"));
 }
 
+TEST(BibTextLineAt, CountsTheEndsOfAllKinds)
+{
+    const char text[] = "a\nb\r\nc\rd\n\re";
+    auto line = [&](char c) { return BibText_LineAt(text, strchr(text, c) - text); };
+    EXPECT_EQ(1, line('a'));
+    EXPECT_EQ(2, line('b'));
+    EXPECT_EQ(3, line('c'));
+    EXPECT_EQ(4, line('d'));
+    EXPECT_EQ(6, line('e'));
+}
+
 TEST(BibTextCountLines, CountsTheirEnds)
 {
     EXPECT_EQ(0, BibText_CountLines("a\nb\n", {0, 1}));
