@@ -297,8 +297,8 @@ static void SelectEncoding(Command *command, const char *name)
     const BibFileSet *previous = &command->previous, *set = command->set;
     if (Enc_Select(name)) {
         UpdateForms(previous->files, previous->count);
+        // One that could not be saved is in the new list alone.
         UpdateForms(set->files, set->count);
-        UpdateForms(set->aside, set->asideCount);
         return;
     }
     FileSet_AppendError(command->set,

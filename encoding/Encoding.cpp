@@ -12,9 +12,6 @@
 #include "store/Ascii.h"
 #include "store/BibStore.h" // the marks
 
-static const wchar_t SHOWN_OPEN = 0xAB;  // of BIB_OPEN_ABBREVIATION
-static const wchar_t SHOWN_CLOSE = 0xBB; // of BIB_CLOSE_ABBREVIATION
-
 static const uint32_t CODE_POINTS = 0x10000; // no code page reaches beyond
 static const unsigned char NO_BYTE = 255;
 static const uint32_t REPLACEMENT = 0xFFFD;
@@ -105,9 +102,9 @@ static wchar_t ToCharacter(const uint32_t *map, unsigned char byte)
 {
     switch (byte) {
     case BIB_OPEN_ABBREVIATION:
-        return SHOWN_OPEN;
+        return ENC_SHOWN_OPEN;
     case BIB_CLOSE_ABBREVIATION:
-        return SHOWN_CLOSE;
+        return ENC_SHOWN_CLOSE;
     default:
         return static_cast<wchar_t>(map[byte]);
     }
@@ -135,8 +132,8 @@ static void DecodeUtf8(std::wstring *out, const char *text)
     out->reserve(strlen(text));
     while (*text) {
         uint32_t c = NextCharacter(&text);
-        *out += c == BIB_OPEN_ABBREVIATION    ? SHOWN_OPEN
-                : c == BIB_CLOSE_ABBREVIATION ? SHOWN_CLOSE
+        *out += c == BIB_OPEN_ABBREVIATION    ? ENC_SHOWN_OPEN
+                : c == BIB_CLOSE_ABBREVIATION ? ENC_SHOWN_CLOSE
                                               : static_cast<wchar_t>(c);
     }
 }
@@ -169,9 +166,9 @@ static unsigned char FindByte(const uint32_t *map, uint32_t c)
 static unsigned char ToByte(wchar_t character, const EncodingRecord *encoding)
 {
     switch (character) {
-    case SHOWN_OPEN:
+    case ENC_SHOWN_OPEN:
         return BIB_OPEN_ABBREVIATION;
-    case SHOWN_CLOSE:
+    case ENC_SHOWN_CLOSE:
         return BIB_CLOSE_ABBREVIATION;
     }
     uint32_t c = static_cast<uint32_t>(character);
@@ -219,7 +216,7 @@ char *Enc_FromUnicode(char *buffer, const wchar_t *text)
 
 static size_t PutCharacter(char *out, wchar_t c, const EncodingRecord *encoding)
 {
-    if (!encoding->map && c != SHOWN_OPEN && c != SHOWN_CLOSE)
+    if (!encoding->map && c != ENC_SHOWN_OPEN && c != ENC_SHOWN_CLOSE)
         return Enc_PutUtf8(out, static_cast<uint32_t>(c));
     *out = static_cast<char>(ToByte(c, encoding));
     return 1;
@@ -288,6 +285,9 @@ size_t Enc_Utf8Length(const char *text, size_t length)
 
 int Enc_IsUtf8(const char *text, size_t length)
 {
+    return Enc_Utf8Length(text, length) == length;
+}
+
 // Neither other letters nor marks: most values are like that.
 static bool IsPlain(const char *text)
 {
@@ -300,14 +300,11 @@ int Enc_NeedsFolding(const char *text, const EncodingRecord *encoding)
     return encoding == &EncodingUtf8 && !IsPlain(text);
 }
 
-    return Enc_Utf8Length(text, length) == length;
-}
-
 // Marks are found like the guillemets that they are shown as.
 static char32_t FoldCase(uint32_t c)
 {
     if (c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION)
-        return c == BIB_OPEN_ABBREVIATION ? SHOWN_OPEN : SHOWN_CLOSE;
+        return c == BIB_OPEN_ABBREVIATION ? ENC_SHOWN_OPEN : ENC_SHOWN_CLOSE;
     if (c < 0x80)
         return Ascii_Lower(static_cast<unsigned char>(c));
     return static_cast<char32_t>(u_foldCase(static_cast<UChar32>(c), U_FOLD_CASE_DEFAULT));

@@ -4,8 +4,8 @@
 // UTF-8. While UTF-8 is selected, a text is in UTF-8 or in CP1252, as it was found to be; that of a
 // file's texts is decided for the whole file (Bib_Encoding in store/BibStore.h).
 //
-// The abbreviation marks of the store, bytes 0x02 and 0x05, are shown as U+00AB and U+00BB,
-// whatever the encoding.
+// The abbreviation marks of the store, bytes 0x02 and 0x05, are shown as guillemets, whatever the
+// encoding.
 #pragma once
 
 #include <cstddef>
@@ -13,6 +13,9 @@
 #include <string>
 
 enum { ENC_LONGEST = 4 }; // bytes of a character in any encoding
+
+// What the marks are shown as.
+const wchar_t ENC_SHOWN_OPEN = 0xAB, ENC_SHOWN_CLOSE = 0xBB;
 
 struct EncodingRecord {
     const char *name;        // "CP1252": what Enc_Select matches
@@ -81,13 +84,13 @@ int Enc_IsUtf8(const char *text, size_t length); // 1 when all of it is
 // One character as UTF-8; what is none becomes U+FFFD. Returns the count of bytes.
 size_t Enc_PutUtf8(char *out, uint32_t character);
 
-// The characters of a UTF-8 text for a search: without differences of case, and with guillemets for
-// marks.
-std::u32string Enc_FoldUtf8(const char *text);
 // 0 when a search for the text may compare bytes: in a code page, or when it is ASCII. Then it
 // finds ASCII letters only.
 int Enc_NeedsFolding(const char *text, const EncodingRecord *encoding);
 
+// The characters of a UTF-8 text for a search: without differences of case, and with guillemets for
+// marks.
+std::u32string Enc_FoldUtf8(const char *text);
 
 // 1 when the folded UTF-8 text contains the folded characters, or begins with them.
 int Enc_Utf8Contains(const char *text, const std::u32string &folded);

@@ -9,7 +9,7 @@
 
 static bool Fits(wchar_t c, const EncodingRecord *encoding)
 {
-    bool isMark = c == L'\xAB' || c == L'\xBB';
+    bool isMark = c == ENC_SHOWN_OPEN || c == ENC_SHOWN_CLOSE;
     return c <= 32 || (Enc_Holds(c, encoding) && !isMark);
 }
 

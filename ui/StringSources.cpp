@@ -136,9 +136,9 @@ static std::vector<std::wstring> NamesIn(const std::wstring &text)
     std::vector<std::wstring> names;
     size_t open = text.npos; // of the last one that may begin a name
     for (size_t at = 0; at < text.size(); ++at) {
-        if (text[at] == L'\xAB')
+        if (text[at] == ENC_SHOWN_OPEN)
             open = at;
-        if (text[at] != L'\xBB')
+        if (text[at] != ENC_SHOWN_CLOSE)
             continue;
         if (open != text.npos && IsName(text.substr(open + 1, at - open - 1)))
             names.push_back(text.substr(open, at + 1 - open));

@@ -264,7 +264,7 @@ void Cartulo_Strings::OnOK(wxCommandEvent &event)
     AppLog("Cartulo_Strings::OnOK, Insert ");
     if (m_list->GetSelection() != wxNOT_FOUND) {
         const EncodingRecord *encoding = m_lines[m_list->GetSelection()].encoding;
-        Insert(L"\xAB" + StoreText(SelectedKey().c_str(), encoding) + L"\xBB");
+        Insert(ENC_SHOWN_OPEN + StoreText(SelectedKey().c_str(), encoding) + ENC_SHOWN_CLOSE);
         return;
     }
     TNSMessage("WARNING: ", "Cartulo_Strings::OnOK has no selection.", TNS_WARNING);

@@ -20,11 +20,8 @@ public:
     // to insert into. Both outlive the dialog.
     Cartulo_Strings(Cartulo *panel, wxTextCtrl *target);
 
-    BibFile *WritableFile() const;
-    const StringSources *Sources() const
-    {
-        return &m_sources;
-    } // of the list, where that can be changed; null for none
+    BibFile *WritableFile() const; // of the list, where that can be changed; null for none
+    const StringSources *Sources() const { return &m_sources; }
 
 private:
     wxSizer *CreateSourceRow();

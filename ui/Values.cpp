@@ -60,15 +60,14 @@ static bool IsMark(char c)
     return c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION;
 }
 
-static bool IsGuillemet(uint32_t c)
+static bool IsGuillemet(wchar_t c)
 {
-    return c == 0xAB || c == 0xBB;
+    return c == ENC_SHOWN_OPEN || c == ENC_SHOWN_CLOSE;
 }
 
 static bool HoldsGuillemets(const std::wstring &text)
 {
-    return std::any_of(text.begin(), text.end(),
-                       [](wchar_t c) { return IsGuillemet(static_cast<uint32_t>(c)); });
+    return std::any_of(text.begin(), text.end(), IsGuillemet);
 }
 
 // A mark is not in the encoding, only shown as one.
@@ -128,8 +127,8 @@ static std::wstring ReplacedCharacters(const std::wstring &text, const std::stri
     std::string back = Enc_Encode(shown.c_str(), encoding);
     for (size_t i = 0; i < stored.size() && i < back.size(); ++i) {
         wchar_t c = shown[i];
-        if (back[i] != stored[i] && !IsGuillemet(static_cast<uint32_t>(c)) &&
-            text.find(c) != text.npos && replaced.find(c) == replaced.npos)
+        if (back[i] != stored[i] && !IsGuillemet(c) && text.find(c) != text.npos &&
+            replaced.find(c) == replaced.npos)
             replaced += c;
     }
     return replaced;
