@@ -92,6 +92,12 @@ static int IsBlank(char c)
     return memchr(Blanks, c, sizeof Blanks - 1) != nullptr;
 }
 
+// What empty lines hold. A form feed may stand for a new page, so its line is none.
+static int IsEmpty(char c)
+{
+    return c == ' ' || c == '\t' || c == '\n';
+}
+
 int BibText_CountLines(const char *text, BibSpan span)
 {
     return static_cast<int>(std::count(text + span.start, text + span.end, '\n'));
@@ -100,12 +106,6 @@ int BibText_CountLines(const char *text, BibSpan span)
 int BibText_IsAscii(const char *text, size_t length)
 {
     return std::all_of(text, text + length, [](char c) { return (c & 0x80) == 0; });
-// What empty lines hold. A form feed may stand for a new page, so its line is none.
-static int IsEmpty(char c)
-{
-    return c == ' ' || c == '\t' || c == '\n';
-}
-
 }
 
 // Behind blanks and byte order marks: those stand in the middle of files that were put together.

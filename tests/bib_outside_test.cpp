@@ -533,4 +533,7 @@ TEST_F(BibOutsideTest, TellsOfAFileThatOnlyBeginsAsUtf8)
         MessagesOf(text));
     EXPECT_EQ(text, Saved());
     EXPECT_EQ("", MessagesOf("% M\xFCller\n@misc{k,\n}\n"));
+    EXPECT_EQ(
+        "WARNING: line 2: this is no UTF-8 any more, so the whole file is taken for CP1252\r\n",
+        MessagesOf("\xEF\xBB\xBF@misc{k,\n\tx = {M\xFCller}\n}\n"));
 }

@@ -96,6 +96,7 @@ TEST(BibTextTrimLines, LeavesTheLinesThatHoldMoreThanBlanks)
     EXPECT_EQ(" b ", Trimmed(" b "));
     EXPECT_EQ("\tb", Trimmed("\n\n\tb\n \n"));
     EXPECT_EQ(" b \n\n c", Trimmed(" \n b \n\n c\n"));
+    EXPECT_EQ("\f\n\v", Trimmed("\n\f\n\v\n")); // new pages
 }
 
 TEST(BibTextTrimLines, DropsMarksAtTheStart)
@@ -107,7 +108,6 @@ TEST(BibTextTrimLines, DropsMarksAtTheStart)
 TEST(BibTextHasNoItem, LooksForTheSignOutsideComments)
 {
     for (const std::string text : {"", "\n \t\n", "% a\n", "a %\n", "  % a @b{\n\n\t%%\n"})
-    EXPECT_EQ("\f\n\v", Trimmed("\n\f\n\v\n")); // new pages
         EXPECT_TRUE(BibText_HasNoItem(text.data(), text.size())) << text;
     for (const std::string text : {"@", "% a\n@\n", "a%@\n", "a% @\n", "% a\nb@"})
         EXPECT_FALSE(BibText_HasNoItem(text.data(), text.size())) << text;
@@ -139,6 +139,7 @@ TEST(BibTextFindLostFields, FindsFieldsBeforeTheBraceThatWasToEndTheEntry)
     EXPECT_EQ("year = 1 )  \nx", LostFields("year = 1 )  \nx", true));
     EXPECT_EQ("year = (1))", LostFields("year = (1))", true));
     EXPECT_EQ("year = 1 (}", LostFields("year = 1 (}", true));
+    EXPECT_EQ("year = 1) b\n)", LostFields("year = 1) b\n)", true));
 }
 
 TEST(BibTextFindLostFields, FindsFieldsBehindACommaThatFollowsTheEntry)
@@ -168,7 +169,8 @@ TEST(BibTextFindLostFields, FindsNoneElsewhere)
                              "},\n",
                              ", year",
                              ", and year = 1",
-                             "http://a.b/c?d=e\n}",
+                             "a } {b, c = d}",
+                             "http://a.b/c?d=e,f?g=h\n}",
                              "=Part A=\n}",
                              "Part A = B\n}",
                              "misc{l, x = {y}}"})

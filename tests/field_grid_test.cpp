@@ -539,6 +539,19 @@ TEST_F(Grid, TellsOfAbbreviationsThatNobodyKnows)
               Grid_Losses(&grid, &sources));
 }
 
+TEST_F(Grid, KnowsTheLettersOfItsFile)
+{
+    Enc_Select("CP65001");
+    Show("@misc{k, \xFC = {\xE4}}", "k");
+    Grid_Fill(&grid, file->entries, Bib_Encoding(file));
+    EXPECT_THAT(Rows(grid), ElementsAre("\xFC=ä"));
+    EXPECT_FALSE(Grid_MayRename(&grid, "\xE4")); // the name and a value are the same
+    Type(0, "Ж");
+    EXPECT_EQ("`ü': Ж can't be stored in CP1252 and would become ÿ.\n"
+              "\nDo you want to accept these changes anyway ?",
+              Losses());
+}
+
 // --- The table of commits ---
 
 namespace

@@ -167,6 +167,7 @@ TEST(PreambleRead, TellsWhereOldPiecesAreNow)
         {L"A\r\nB\r\nC\r\n", {0, 1, 2}},
         {L"a\r\nx\r\nc\r\n", {0, 1, 2}},
         {L"a\r\nx\r\nb\r\nc\r\n", {0, 2, 3}},
+        {L"x\r\na\r\nB\r\nc\r\n", {1, 2, 3}},
         {L"c\r\nb\r\na\r\n", {2, 1, 0}},
         {L"b\r\nb\r\n", {-1, 0, -1}},
         {L"c\r\n", {-1, -1, 0}},

@@ -98,6 +98,12 @@ TEST_F(SchemaFile, CutsNoLetterInTwo)
     }
 }
 
+TEST_F(SchemaFile, KeepsTheLettersOfACutTextInACodePage)
+{
+    std::string ini = folder.Write("a.ini", "[misc]\n* = \xFC" + std::string(2000, 'x') + "\n");
+    EXPECT_EQ("\xFC" + std::string(1022, 'x'), Schema_Description(ini.c_str(), "misc"));
+}
+
 TEST_F(SchemaFile, RegistersItsEntryTypes)
 {
     std::string ini = folder.Write("a.ini", "[Preamble]\nAppName = x\n[Article]\nauthor = *\n"

@@ -209,6 +209,15 @@ TEST(StringsCompare, FindsTheRowsThatChanged)
     EXPECT_EQ("2 -0 +0", Compare({"a", "b"}, {"a", "b"}));
 }
 
+TEST(StringsCompare, TakesOtherLettersForAChange)
+{
+    LineChange change =
+        Strings_Compare({{"\xC3\xBC", Enc_Current()}}, {{"\xC3\xBC", &EncodingUtf8}});
+    EXPECT_EQ(0u, change.first);
+    EXPECT_EQ(1u, change.removed);
+    EXPECT_EQ(1u, change.added);
+}
+
 TEST(StringsKeyOf, EndsAtTheFirstBlank)
 {
     EXPECT_EQ("jan", Strings_KeyOf({"jan = January", Enc_Current()}));

@@ -88,6 +88,7 @@ TEST(ValueInUtf8, TellsTextFromMarks)
 
 TEST(ValueInUtf8, LosesOnlyWhatIsNoCharacter)
 {
+    EXPECT_EQ(L"", Value_Losses(L"a", L"xyz", "\xC2\xABxy", false, &EncodingUtf8));
     EXPECT_EQ(L"", Value_Losses(L"a", L"\u0142\u0416\U0001F600 \u0301", "M\xC3\xBCller \xC2\xAB",
                                 false, &EncodingUtf8));
     EXPECT_EQ(L"`a': U+0002 can't be stored in UTF-8 and would become \u00AB.\n",
