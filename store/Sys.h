@@ -109,7 +109,8 @@ char *Sys_FindFile(const char *folder, const char *name, int deep);
 // A socket is a number above 2; it never waits, and started programs do not inherit it.
 
 // Listens at `path` (mode 0600). A socket file that nobody serves is replaced; any other file is
-// left alone. 0 on failure, with the reason in Sys_LastErrorText().
+// left alone. Some 250 peers may wait to be accepted; further ones try again until their deadline.
+// 0 on failure, with the reason in Sys_LastErrorText().
 int Sys_ListenLocal(const char *path);
 
 // The next peer that waits; 0 for none. A peer of another user is turned away.

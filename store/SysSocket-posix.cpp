@@ -29,6 +29,7 @@ struct Listener {
 
 const int LOCK_TIME = 500; // milliseconds
 const int PAUSE = 5;       // milliseconds between two tries
+const int QUEUE = 256;     // clients that a listener lets wait
 
 std::vector<Listener> Listeners;
 
@@ -125,13 +126,14 @@ static int ClearPath(const sockaddr_un *address)
     return unlink(address->sun_path) == 0;
 }
 
-// The mode of the socket becomes that of its file.
+// The mode of the socket becomes that of its file. Those that have given up meanwhile stay in the
+// queue, and have to be heard before all others: so it is not as long as it might be.
 static int Bind(int socket, const sockaddr_un *address)
 {
     struct stat status;
     if (fchmod(socket, 0600) != 0 || bind(socket, Plain(address), sizeof *address) != 0)
         return 0;
-    if (listen(socket, SOMAXCONN) != 0 || lstat(address->sun_path, &status) != 0) {
+    if (listen(socket, QUEUE) != 0 || lstat(address->sun_path, &status) != 0) {
         int reason = errno;
         unlink(address->sun_path);
         return Sys_FailWith(reason);

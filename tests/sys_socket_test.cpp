@@ -242,6 +242,23 @@ TEST(SysListenLocal, NeverReplacesASocketWithAFullQueue)
     Sys_CloseListener(listener, path.c_str());
 }
 
+// Else thousands that are gone would have to be heard before the next that is there.
+TEST(SysListenLocal, LetsNotTooManyWait)
+{
+    TempFolder folder;
+    std::string path = folder.Path("socket");
+    int listener = Sys_ListenLocal(path.c_str());
+    int waiting = 0;
+    while (int client = Sys_ConnectLocal(path.c_str(), 0)) {
+        Sys_CloseSocket(client);
+        ++waiting;
+    }
+    EXPECT_STREQ("Connection timed out", Sys_LastErrorText());
+    EXPECT_LE(200, waiting);
+    EXPECT_GE(300, waiting);
+    Sys_CloseListener(listener, path.c_str());
+}
+
 TEST(SysListenLocal, LeavesEverythingElseAlone)
 {
     TempFolder folder;
