@@ -464,17 +464,25 @@ TEST_F(EntryKeys, ShareTypesThatTheirFilesCanHave)
     Enc_Select("CP65001");
     BibFile *utf8 = Open("a.bib", "@misc{a,}\n");
     BibFile *other = Open("b.bib", "@gr\xF6\xDF{b, x = {\xFC}}\n");
+    std::string reason;
+    auto typeIn = [&](const BibFile *file, int type) { return Entry_TypeIn(file, type, &reason); };
     int type = Bib_TypeIndex("B\xC3\xBC"
                              "cher");
-    EXPECT_EQ(type, Entry_TypeIn(utf8, type));
+    EXPECT_EQ(type, typeIn(utf8, type));
     EXPECT_STREQ("B\xFC"
                  "cher",
-                 BibTypeTable[Entry_TypeIn(other, type)]);
-    EXPECT_EQ(type, Entry_TypeIn(utf8, Entry_TypeIn(other, type)));
-    EXPECT_EQ(-1, Entry_TypeIn(other, Bib_TypeIndex("\xD0\x96")));
+                 BibTypeTable[typeIn(other, type)]);
+    EXPECT_EQ(type, typeIn(utf8, typeIn(other, type)));
+    EXPECT_EQ("", reason);
+    EXPECT_EQ(-1, typeIn(other, Bib_TypeIndex("\xD0\x96")));
+    EXPECT_THAT(reason, HasSubstr("letters that can't be stored in CP1252"));
+    EXPECT_EQ(-1, typeIn(utf8, Bib_TypeIndex("my type")));
+    EXPECT_EQ("An entry of the type `my type' can't be written to a BIB file.", reason);
     while (BibTypeCount < BIB_TYPE_LIMIT)
         Bib_TypeIndex(("T" + std::to_string(BibTypeCount)).c_str());
     int foreign = other->entries->type;
-    EXPECT_EQ(foreign, Entry_TypeIn(other, foreign));
-    EXPECT_EQ(-1, Entry_TypeIn(utf8, foreign));
+    EXPECT_EQ(foreign, typeIn(other, foreign));
+    EXPECT_EQ("", reason);
+    EXPECT_EQ(-1, typeIn(utf8, foreign));
+    EXPECT_NE("", reason);
 }

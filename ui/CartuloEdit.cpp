@@ -428,11 +428,11 @@ bool Cartulo::Commit()
 // The type as the file has it. False when it can't have one of that name, and the editing goes on.
 bool Cartulo::TakeType(int *type)
 {
-    *type = Entry_TypeIn(m_set.files[m_file], *type);
+    std::string reason;
+    *type = Entry_TypeIn(m_set.files[m_file], *type, &reason);
     if (*type < 0)
-        ShowWarning(CommitTitle, "An entry of this type can't be stored in this file: its encoding "
-                                 "lacks a letter of the name, or there are too many types.\n\n"
-                                 "Choose another type.");
+        ShowWarning(CommitTitle,
+                    StoreText(reason.c_str(), Encoding()) + "\n\nChoose another type.");
     return *type >= 0;
 }
 

@@ -126,17 +126,6 @@ static bool Recode(const BibFile *file, const char *name, std::string *recoded)
     return Enc_Recode(recoded->c_str(), to, from) == name;
 }
 
-int Entry_TypeIn(const BibFile *file, int type)
-{
-    std::string name;
-    bool fits = Recode(file, BibTypeTable[type], &name) && Bib_HasTypeRoom(name.c_str());
-    return fits ? Bib_TypeIndex(name.c_str()) : -1;
-}
-
-// --- New entries ---
-
-const char Entry_ChildSpecs[] = "crossref=*\0";
-
 static std::vector<std::string> MandatoryFields(const char *specs)
 {
     std::vector<std::string> names;
@@ -185,6 +174,17 @@ EntryType Entry_TypeFor(const BibFile *file, const char *typeName, const char *s
                       Enc_Label(Bib_Encoding(file)) + ".";
     return type;
 }
+
+int Entry_TypeIn(const BibFile *file, int type, std::string *reason)
+{
+    EntryType there = Entry_TypeFor(file, BibTypeTable[type], "");
+    *reason = there.reason;
+    return reason->empty() ? Bib_TypeIndex(there.name.c_str()) : -1;
+}
+
+// --- New entries ---
+
+const char Entry_ChildSpecs[] = "crossref=*\0";
 
 BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, const char *specs,
                        const BibEntry *parent)

@@ -42,17 +42,8 @@ KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const B
 
 // --- Types ---
 
-// The type of this name in the encoding of the file; -1 when that lacks a letter, or when there is
-// no room for another type.
-int Entry_TypeIn(const BibFile *file, int type);
-
-// --- New entries ---
-
-// The fields of an entry that refers to another one, as Bib_NewEntry wants them.
-extern const char Entry_ChildSpecs[];
-
-// Why a new entry can't be of this type ("" for none) with the mandatory fields of `specs`; "" when
-// it can. Without this check, Entry_Create may end the process.
+// Why an entry can't be of this type ("" for none) with the mandatory fields of `specs`; "" when it
+// can. Without this check, Entry_Create may end the process, and a save write what can't be read.
 std::string Entry_CheckType(const char *typeName, const char *specs);
 
 // A type and the lines of its section (Schema_FieldSpecs) as text of one file.
@@ -61,6 +52,14 @@ struct EntryType {
     std::string reason; // why an entry of it can't be made there, text of the file; "" when it can
 };
 EntryType Entry_TypeFor(const BibFile *file, const char *typeName, const char *specs);
+
+// The type of this name in the encoding of the file; -1 when an entry can't have it there, and why.
+int Entry_TypeIn(const BibFile *file, int type, std::string *reason);
+
+// --- New entries ---
+
+// The fields of an entry that refers to another one, as Bib_NewEntry wants them.
+extern const char Entry_ChildSpecs[];
 
 // A new entry at the head of the file. When its first field is `crossref`, that names `parent`
 // (null: none). Null when memory is out.

@@ -301,6 +301,30 @@ TEST_F(Edit, ChangesTheTypeAlone)
     EXPECT_NE(std::string::npos, Saved().find("@book{one,"));
 }
 
+// The file could not be read any more.
+TEST_F(Edit, TakesNoTypeThatCannotBeWritten)
+{
+    folder.Write("Cartulo/cartulo.ini", std::string(EditTypes) + "[my type]\ntitle=\n");
+    OpenText(Article);
+    StartEditing();
+    Choose("my type");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("YES", 0, 0, 0, wxID_YES),
+                  ExpectBox(CommitTitle,
+                            "An entry of the type `my type' can't be written to a BIB file.\n\n"
+                            "Choose another type.",
+                            wxID_OK));
+    EXPECT_TRUE(Panel()->InEditMode());
+    SetValue("title", "Changed");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("YES", 0, 1, 0, wxID_YES),
+                  ExpectBox(CommitTitle,
+                            "An entry of the type `my type' can't be written to a BIB file.\n\n"
+                            "Choose another type.",
+                            wxID_OK));
+    Choose("book");
+    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("YES", 0, 1, 0, wxID_YES));
+    EXPECT_EQ("@book{one,\n\tauthor = {A},\n\ttitle = {Changed},\n\tyear = 1999\n}\n", Saved());
+}
+
 static wxString WrongSyntax(const char *field, const char *message)
 {
     return wxString::Format("Wrong syntax of value in the field: `%s':\n\n%s\n\nIn this reason "
