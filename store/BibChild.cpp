@@ -355,8 +355,7 @@ static void ReportMarks(const char *text, size_t length)
         mark = memchr(text, BIB_CLOSE_ABBREVIATION, length);
     if (!mark)
         return;
-    size_t at = static_cast<const char *>(mark) - text;
-    PackMessage(Sending, BTERR_LEXERR, 1 + BibText_CountLines(text, {0, at}),
+    PackMessage(Sending, BTERR_LEXERR, BibText_LineAt(text, static_cast<const char *>(mark) - text),
                 "control character 0x02 or 0x05, which marks abbreviations in this program");
 }
 
@@ -409,16 +408,19 @@ static void ReportBadByte(const char *text, size_t length, int form)
         return;
     size_t valid = Enc_Utf8Length(text, length);
     if (form & BIB_FORM_MARK || !BibText_IsAscii(text, valid))
-        PackMessage(Sending, BTERR_LEXWARN, 1 + BibText_CountLines(text, {0, valid}),
+        PackMessage(Sending, BTERR_LEXWARN, BibText_LineAt(text, valid),
                     "this is no UTF-8 any more, so the whole file is taken for CP1252");
 }
 
-static void ReportNul(const char *text, size_t length)
+// True when there is one. Of the text as it is in the file.
+static bool ReportNul(const char *text, size_t length)
 {
-    if (const void *nul = memchr(text, 0, length))
+    const void *nul = memchr(text, 0, length);
+    if (nul)
         PackMessage(Sending, BTERR_LEXWARN,
                     BibText_LineAt(text, static_cast<const char *>(nul) - text),
                     "a NUL character is not kept, a blank takes its place (more may follow)");
+    return nul != nullptr;
 }
 
 void BibChild_Parse(void *argument) noexcept
@@ -435,9 +437,8 @@ void BibChild_Parse(void *argument) noexcept
     if (!text || length >= INT_MAX) // the lexer counts with int
         Leave(BIB_END_UNREADABLE);
     const int form = BibText_Form(text, length);
-    const bool isBinary = memchr(text, 0, length) != nullptr;
     SendForm(form);
-    ReportNul(text, length);
+    const bool isBinary = ReportNul(text, length);
     length = BibText_Normalise(text, length);
     ReportBadByte(text, length, form);
     ReportMarks(text, length);

@@ -15,7 +15,7 @@ int BibText_Form(const char *text, size_t length);
 // for NUL, and an end on the last line, too. `text` has a spare byte behind it. Returns the length.
 size_t BibText_Normalise(char *text, size_t length);
 
-// The number of the line, from 1, where a byte stands. Of text as it is in the file.
+// The number of the line, from 1, where a byte stands. Of text as it is in the file, or normalised.
 int BibText_LineAt(const char *text, size_t at);
 
 // --- Of normalised text ---

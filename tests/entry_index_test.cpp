@@ -256,6 +256,17 @@ protected:
         Build(); // adams79, kant, knox90, Knuth84, zeta
     }
 
+    // Adds a key to the file in UTF-8, and one in a file that is in a code page.
+    void BuildInTwoEncodings(const char *utf8, const char *page)
+    {
+        Enc_Select("CP65001");
+        int other = AddFile("other");
+        files[other]->form = BIB_FORM_CODE_PAGE;
+        Add(0, utf8);
+        Add(other, page);
+        Build();
+    }
+
     TypeAheadVerdict Press(uint32_t key, int32_t passed = 10, bool modified = false)
     {
         now = static_cast<int32_t>(static_cast<uint32_t>(now) + static_cast<uint32_t>(passed));
@@ -484,14 +495,10 @@ TEST_F(TypeAheadKey, MatchesNothingForACharacterThatTheCodePageLacks)
 
 TEST_F(TypeAheadKey, ComparesTypedLettersInTheEncodingOfEachFile)
 {
-    Enc_Select("CP65001");
-    int other = AddFile("other");
-    files[other]->form = BIB_FORM_CODE_PAGE;
-    Add(0, "\xC3\xBC"
-           "ber");
-    Add(other, "\xFC"
-               "bel");
-    Build();
+    BuildInTwoEncodings("\xC3\xBC"
+                        "ber",
+                        "\xFC"
+                        "bel");
     EXPECT_EQ(TYPE_AHEAD_ROW, Press(0xFC));
     EXPECT_EQ(TYPE_AHEAD_ROW, Press('b'));
     EXPECT_EQ(TYPE_AHEAD_ROW, Press('e'));
@@ -511,14 +518,10 @@ TEST_F(TypeAheadKey, ComparesTypedLettersInTheEncodingOfEachFile)
 
 TEST_F(TypeAheadKey, IgnoresTheCaseOfAllLettersInUtf8)
 {
-    Enc_Select("CP65001");
-    int other = AddFile("other");
-    files[other]->form = BIB_FORM_CODE_PAGE;
-    Add(0, "\xD0\x98"
-           "van2001");
-    Add(other, "\xD6"
-               "rtel");
-    Build();
+    BuildInTwoEncodings("\xD0\x98"
+                        "van2001",
+                        "\xD6"
+                        "rtel");
     EXPECT_EQ(TYPE_AHEAD_ROW, Press(0x0438)); // in small letters
     EXPECT_EQ(TYPE_AHEAD_ROW, Type("VAN2001 (refs)"));
     EXPECT_EQ(TYPE_AHEAD_NO_ROW, Type("x"));

@@ -59,6 +59,16 @@ protected:
         EXPECT_FALSE(Panel()->InEditMode());
     }
 
+    // Answers the question about what would be lost with No.
+    void RefuseToLose(const wxString &losses)
+    {
+        wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
+                      ExpectBox(CommitTitle,
+                                losses + "\n\nDo you want to accept these changes anyway ?",
+                                wxID_NO, wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION));
+        EXPECT_TRUE(Panel()->InEditMode());
+    }
+
     std::string SavedFile(const char *name)
     {
         EXPECT_EQ(1, Panel()->SaveAll(true));
@@ -181,11 +191,7 @@ TEST_F(Encodings, AskBeforeALetterIsLostThatOnlyOneOfThemHas)
     OpenBoth();
     StartEditing();
     SetValue("author", L"\u0416 J\u00FCrgen");
-    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
-                  ExpectBox(CommitTitle,
-                            L"`author': \u0416 can't be stored in CP1252 and would become "
-                            L"\u00FF.\n\nDo you want to accept these changes anyway ?",
-                            wxID_NO));
+    RefuseToLose(L"`author': \u0416 can't be stored in CP1252 and would become \u00FF.");
     SetValue("author", L"\u20AC J\u00FCrgen");
     Commit();
     EXPECT_EQ(Replaced(Latin, "{J", "{\x80 J"), SavedFile("b.bib"));
@@ -197,12 +203,7 @@ TEST_F(Encodings, AskBeforeGuillemetsOfAUtf8FileBecomeMarks)
     SelectRow(1);
     StartEditing();
     SetValue("note", L"\u00ABz\u00FCrich\u00BB");
-    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
-                  ExpectBox(CommitTitle,
-                            L"`note': \u00AB and \u00BB will mark an abbreviation, not stand as "
-                            L"text.\n\nDo you want to accept these changes anyway ?",
-                            wxID_NO));
-    EXPECT_TRUE(Panel()->InEditMode());
+    RefuseToLose(L"`note': \u00AB and \u00BB will mark an abbreviation, not stand as text.");
 }
 
 TEST_F(Encodings, AskBeforeQuotedWordsBecomeAbbreviations)
@@ -210,13 +211,8 @@ TEST_F(Encodings, AskBeforeQuotedWordsBecomeAbbreviations)
     OpenBoth();
     StartEditing();
     SetValue("author", L"Le \u00ABMonde\u00BB");
-    wxTEST_DIALOG(Send(ID_COMMIT_ENTRY), Question("NO", 0, 1, 0, wxID_YES),
-                  ExpectBox(CommitTitle,
-                            L"`author': no abbreviation \u00ABMonde\u00BB is known. As text, "
-                            L"quotation marks are typed in another way, like << and >>.\n\n"
-                            L"Do you want to accept these changes anyway ?",
-                            wxID_NO, wxYES_NO | wxNO_DEFAULT | wxICON_QUESTION));
-    EXPECT_TRUE(Panel()->InEditMode());
+    RefuseToLose(L"`author': no abbreviation \u00ABMonde\u00BB is known. As text, quotation marks "
+                 L"are typed in another way, like << and >>.");
     SetValue("author", L"\u00ABz\u00FCrich\u00BB \u00ABjan\u00BB"); // of the other file; a month
     Commit();
     EXPECT_EQ(Replaced(Latin, "{J\xFCrgen}", "z\xFCrich # { } # jan"), SavedFile("b.bib"));
