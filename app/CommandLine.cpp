@@ -5,11 +5,11 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "app/Companion.h"
-#include "app/Log.h"
+#include "base/Ascii.h"
+#include "base/Companion.h"
+#include "base/Log.h"
+#include "base/Sys.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
-#include "store/Sys.h"
 
 // --- Building a line and taking it apart ---
 

@@ -6,7 +6,7 @@
 #include <wx/filename.h>
 #include <wx/image.h>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 
 enum { BUTTON_ICON_SIZE = 16, BUTTON_GAP = 4, PROGRAM_ICON_SIZE = 48 };
 

@@ -4,10 +4,10 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "app/Companion.h"
 #include "app/Ipc.h"
 #include "app/IpcMessage.h"
-#include "store/Sys.h"
+#include "base/Companion.h"
+#include "base/Sys.h"
 
 static void LogClient(const char *text)
 {

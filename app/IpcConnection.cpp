@@ -2,10 +2,10 @@
 
 #include <wx/datetime.h>
 
-#include "app/Companion.h"
 #include "app/IpcMessage.h"
 #include "app/IpcServer.h"
-#include "store/Sys.h"
+#include "base/Companion.h"
+#include "base/Sys.h"
 
 enum { PATIENCE = 5000, BLOCK_SIZE = 16 * 1024 };
 

@@ -5,11 +5,11 @@
 #include <wx/evtloop.h>
 #include <wx/evtloopsrc.h>
 
-#include "app/Companion.h"
 #include "app/Ipc.h"
 #include "app/IpcConnection.h"
+#include "base/Companion.h"
+#include "base/Sys.h"
 #include "store/BibStore.h"
-#include "store/Sys.h"
 
 enum { PEERS_MAX = 16, COMMANDS_MAX = 64 };
 

@@ -1,7 +1,4 @@
-// app/Log.h - the program's trace lines.
+// app/Log.h - the program's trace lines, for other authors; our own code includes base/Log.h.
 #pragma once
 
-// One line to TNSMessage (app/Companion.h) with the prefix "Cartulo: ": both texts joined and cut
-// to 511 bytes. The level follows the text: 2 when it starts with "Run", "Open" or "Launch",
-// else 3 when it holds "WARNING", else 4 when it holds "ERROR", else 1.
-void AppLog(const char *first, const char *second = nullptr);
+#include "base/Log.h" // IWYU pragma: export

@@ -1,6 +1,6 @@
 #include "app/LogGui.h"
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 
 void MyLogGui::DoLogTextAtLevel(wxLogLevel level, const wxString &text)
 {

@@ -12,15 +12,15 @@
 #include <wx/stdpaths.h>
 #include <wx/utils.h>
 
-#include "app/Companion.h"
 #include "app/Ipc.h"
 #include "app/IpcServer.h"
-#include "app/Log.h"
 #include "app/LogGui.h"
 #include "app/Native.h"
-#include "app/PlainAnswer.h"
+#include "base/Companion.h"
+#include "base/Log.h"
+#include "base/Sys.h"
+#include "base/Usage.h"
 #include "encoding/Encoding.h"
-#include "store/Sys.h"
 
 wxBEGIN_EVENT_TABLE(MyApp, wxApp)
     EVT_ACTIVATE_APP(MyApp::OnActivateApp)
@@ -207,7 +207,7 @@ void MyApp::OnActivateApp(wxActivateEvent &event)
 
 int main(int argc, char **argv)
 {
-    int answered = PlainAnswer(argc, argv, Usage, "cartulo " CARTULO_VERSION "\n");
+    int answered = Usage_Answer(argc, argv, Usage, "cartulo " CARTULO_VERSION "\n");
     if (answered >= 0)
         return answered;
     Sys_FillStandard();

@@ -13,12 +13,12 @@
 #include <wx/utils.h>
 
 #include "app/AboutDlg.h"
-#include "app/Companion.h"
 #include "app/Icons.h"
 #include "app/Ids.h"
-#include "app/Log.h"
 #include "app/Native.h"
-#include "store/Sys.h"
+#include "base/Companion.h"
+#include "base/Log.h"
+#include "base/Sys.h"
 #include "ui/Cartulo.h"
 #include "ui/Messages.h"
 #include "ui/MessagesText.h"

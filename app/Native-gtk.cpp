@@ -6,7 +6,7 @@
 #include <gdk/gdkx.h>
 #include <gtk/gtk.h>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 
 long Native_WindowHandle(wxTopLevelWindow *window)
 {

@@ -11,7 +11,7 @@
 #include "app/Ipc.h"
 #include "app/IpcClient.h"
 #include "app/IpcMessage.h"
-#include "store/Sys.h"
+#include "base/Sys.h"
 
 enum { PATIENCE = 1000, PAUSE = 1000, BLOCK_SIZE = 16 * 1024, CROWD = 200, MANY = 4, TRIES = 10 };
 enum { LONGEST_LIFE = 120 }; // seconds, should nobody end the process

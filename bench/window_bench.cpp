@@ -27,13 +27,13 @@
 #include "app/IpcServer.h"
 #include "app/LogGui.h"
 #include "app/MyFrame.h"
+#include "base/Sys.h"
 #include "bench/Attacks.h"
 #include "bench/Library.h"
 #include "bench/Ratios.h"
 #include "bench/StartUp.h"
 #include "encoding/Encoding.h"
 #include "store/BibStore.h"
-#include "store/Sys.h"
 #include "ui/Cartulo.h"
 
 namespace

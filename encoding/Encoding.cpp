@@ -8,9 +8,8 @@
 #include <unicode/uchar.h>
 #include <unicode/utf8.h>
 
-#include "app/Log.h"
-#include "store/Ascii.h"
-#include "store/BibStore.h" // the marks
+#include "base/Ascii.h"
+#include "base/Log.h"
 
 static const uint32_t CODE_POINTS = 0x10000; // no code page reaches beyond
 static const unsigned char NO_BYTE = 255;
@@ -101,9 +100,9 @@ const EncodingRecord *Enc_OfText(const char *text)
 static wchar_t ToCharacter(const uint32_t *map, unsigned char byte)
 {
     switch (byte) {
-    case BIB_OPEN_ABBREVIATION:
+    case ENC_OPEN_MARK:
         return ENC_SHOWN_OPEN;
-    case BIB_CLOSE_ABBREVIATION:
+    case ENC_CLOSE_MARK:
         return ENC_SHOWN_CLOSE;
     default:
         return static_cast<wchar_t>(map[byte]);
@@ -132,9 +131,9 @@ static void DecodeUtf8(std::wstring *out, const char *text)
     out->reserve(strlen(text));
     while (*text) {
         uint32_t c = NextCharacter(&text);
-        *out += c == BIB_OPEN_ABBREVIATION    ? ENC_SHOWN_OPEN
-                : c == BIB_CLOSE_ABBREVIATION ? ENC_SHOWN_CLOSE
-                                              : static_cast<wchar_t>(c);
+        *out += c == ENC_OPEN_MARK    ? ENC_SHOWN_OPEN
+                : c == ENC_CLOSE_MARK ? ENC_SHOWN_CLOSE
+                                      : static_cast<wchar_t>(c);
     }
 }
 
@@ -167,9 +166,9 @@ static unsigned char ToByte(wchar_t character, const EncodingRecord *encoding)
 {
     switch (character) {
     case ENC_SHOWN_OPEN:
-        return BIB_OPEN_ABBREVIATION;
+        return ENC_OPEN_MARK;
     case ENC_SHOWN_CLOSE:
-        return BIB_CLOSE_ABBREVIATION;
+        return ENC_CLOSE_MARK;
     }
     uint32_t c = static_cast<uint32_t>(character);
     if (encoding != page)
@@ -243,7 +242,7 @@ int Enc_Holds(wchar_t character, const EncodingRecord *encoding)
     if (encoding->map)
         return ToCharacter(encoding->map, ToByte(character, encoding)) == character;
     uint32_t c = static_cast<uint32_t>(character);
-    bool isMark = c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION;
+    bool isMark = c == ENC_OPEN_MARK || c == ENC_CLOSE_MARK;
     return c <= 0x10FFFF && !U_IS_SURROGATE(c) && !isMark;
 }
 
@@ -303,8 +302,8 @@ int Enc_NeedsFolding(const char *text, const EncodingRecord *encoding)
 // Marks are found like the guillemets that they are shown as.
 static char32_t FoldCase(uint32_t c)
 {
-    if (c == BIB_OPEN_ABBREVIATION || c == BIB_CLOSE_ABBREVIATION)
-        return c == BIB_OPEN_ABBREVIATION ? ENC_SHOWN_OPEN : ENC_SHOWN_CLOSE;
+    if (c == ENC_OPEN_MARK || c == ENC_CLOSE_MARK)
+        return c == ENC_OPEN_MARK ? ENC_SHOWN_OPEN : ENC_SHOWN_CLOSE;
     if (c < 0x80)
         return Ascii_Lower(static_cast<unsigned char>(c));
     return static_cast<char32_t>(u_foldCase(static_cast<UChar32>(c), U_FOLD_CASE_DEFAULT));

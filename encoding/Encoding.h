@@ -14,6 +14,8 @@
 
 enum { ENC_LONGEST = 4 }; // bytes of a character in any encoding
 
+enum { ENC_OPEN_MARK = 2, ENC_CLOSE_MARK = 5 }; // the store's marks of abbreviations
+
 // What the marks are shown as.
 const wchar_t ENC_SHOWN_OPEN = 0xAB, ENC_SHOWN_CLOSE = 0xBB;
 

@@ -2,8 +2,8 @@
 
 #include <cstring>
 
-#include "store/Ascii.h"
-#include "store/Sys.h"
+#include "base/Ascii.h"
+#include "base/Sys.h"
 
 static const char MANUAL[] = "manual.html";
 static const char TOPIC[] = ".QRL.Cartulo";

@@ -8,13 +8,12 @@
 #include <wx/image.h>
 #include <wx/msgdlg.h>
 
-#include "app/Companion.h"
 #include "app/Native.h"
-#include "app/PlainAnswer.h"
+#include "base/Companion.h"
+#include "base/Sys.h"
+#include "base/Usage.h"
 #include "help/HelpFrame.h"
 #include "help/HelpPage.h"
-#include "store/BibStore.h"
-#include "store/Sys.h"
 
 static const char Usage[] = "Usage: metahelp [TOPIC]\n"
                             "\n"
@@ -87,7 +86,7 @@ static std::string ReadManual()
 
 int main(int argc, char **argv)
 {
-    int answered = PlainAnswer(argc, argv, Usage, "metahelp " CARTULO_VERSION "\n");
+    int answered = Usage_Answer(argc, argv, Usage, "metahelp " CARTULO_VERSION "\n");
     if (answered >= 0)
         return answered;
     std::string manual = ReadManual();

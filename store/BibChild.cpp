@@ -15,11 +15,11 @@
 
 #include <btparse.h>
 
+#include "base/Sys.h"
 #include "encoding/Encoding.h"
 #include "store/BibItem.h"
 #include "store/BibStore.h"
 #include "store/BibText.h"
-#include "store/Sys.h"
 
 extern "C" {
 // The lexer's state, exported by the library.

@@ -7,9 +7,9 @@
 #include <cstring>
 #include <string>
 
-#include "app/Log.h"
-#include "store/Ascii.h"
-#include "store/Sys.h"
+#include "base/Ascii.h"
+#include "base/Log.h"
+#include "base/Sys.h"
 
 // --- The set ---
 

@@ -10,10 +10,10 @@
 
 #include <btparse.h>
 
-#include "app/Log.h"
-#include "store/Ascii.h"
+#include "base/Ascii.h"
+#include "base/Log.h"
+#include "base/Sys.h"
 #include "store/BibOutside.h"
-#include "store/Sys.h"
 
 int BibLoadSeconds = 10;
 

@@ -6,7 +6,7 @@
 #include <cstring>
 #include <string>
 
-#include "app/Log.h"
+#include "base/Log.h"
 
 BibFile *BibCurrentFile = nullptr;
 

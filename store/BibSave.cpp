@@ -6,9 +6,9 @@
 #include <cstring>
 #include <ctime>
 
-#include "app/Log.h"
+#include "base/Log.h"
+#include "base/Sys.h"
 #include "store/BibOutside.h"
-#include "store/Sys.h"
 
 // --- Values ---
 

@@ -8,14 +8,17 @@
 
 #include <btparse.h>
 
-#include "app/Log.h"
+#include "base/Ascii.h"
+#include "base/Log.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 
 char *BibTypeTable[BIB_TYPE_LIMIT];
 int BibTypeCount = 0;
 char *BibFieldTable[BIB_FIELD_LIMIT];
 int BibFieldCount = 0;
+
+static_assert(BIB_OPEN_ABBREVIATION == int(ENC_OPEN_MARK) &&
+              BIB_CLOSE_ABBREVIATION == int(ENC_CLOSE_MARK));
 
 int BibBackupMode = 2;
 const int BibLockFiles = 0;

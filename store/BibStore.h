@@ -16,6 +16,8 @@
 #include <cstdint>
 #include <cstdio>
 
+#include "base/Sys.h" // Sys_LastErrorText, Sys_ToBackslashes, Sys_ModulePath
+
 struct EncodingRecord; // encoding/Encoding.h
 struct _ast;           // one parsed item of the parser library
 
@@ -244,12 +246,6 @@ int Bib_HasBadKeyChars(const char *key); // 1 when there are some
 // and the characters above are refused.
 int Bib_IsKey(const char *key);
 int Bib_IsName(const char *name);
-
-// --- Small system functions (Sys-posix.cpp) ---
-
-const char *Sys_LastErrorText();     // the system's text for the last error; static buffer
-char *Sys_ToBackslashes(char *path); // every '/' becomes '\', in place; null stays null
-const char *Sys_ModulePath();        // full path of the executable, at most 260 characters
 
 // --- The layout that other code may rely on ---
 

@@ -7,7 +7,7 @@
 #include <functional>
 #include <string>
 
-#include "store/Ascii.h"
+#include "base/Ascii.h"
 #include "tests/support/LoadText.h"
 
 static std::string Verdict(const char *value)

@@ -14,7 +14,7 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include "store/Sys.h"
+#include "base/Sys.h"
 #include "tests/support/LogWatch.h"
 #include "tests/support/TempFolder.h"
 

@@ -12,11 +12,11 @@
 #include <string>
 #include <vector>
 
+#include "base/Ascii.h"
+#include "base/Profile.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 #include "store/BibFileSet.h"
 #include "store/BibStore.h"
-#include "store/Profile.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TempFolder.h"

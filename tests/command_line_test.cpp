@@ -15,8 +15,8 @@
 
 #include <gtest/gtest.h>
 
+#include "base/Sys.h"
 #include "encoding/Encoding.h"
-#include "store/Sys.h"
 
 namespace fs = std::filesystem;
 

@@ -1,4 +1,4 @@
-#include "app/Companion.h"
+#include "base/Companion.h"
 
 #include <gtest/gtest.h>
 
@@ -12,8 +12,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "base/Sys.h"
 #include "store/BibStore.h"
-#include "store/Sys.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TempFolder.h"
 

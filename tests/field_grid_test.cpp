@@ -17,7 +17,6 @@
 #include "tests/support/LoadText.h"
 #include "tests/support/TempFolder.h"
 #include "ui/StringSources.h"
-#include "tests/support/TempFolder.h"
 
 using testing::ElementsAre;
 using testing::IsEmpty;

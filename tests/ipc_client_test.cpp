@@ -12,8 +12,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include "base/Sys.h"
 #include "store/BibStore.h"
-#include "store/Sys.h"
 #include "tests/support/LogWatch.h"
 #include "tests/support/TempFolder.h"
 

@@ -5,8 +5,8 @@
 
 #include <sys/socket.h>
 
-#include "app/Companion.h"
-#include "app/Log.h"
+#include "base/Companion.h"
+#include "base/Log.h"
 
 namespace
 {

@@ -8,7 +8,7 @@
 #include <filesystem>
 #include <string>
 
-#include "store/Ascii.h"
+#include "base/Ascii.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/OutsideLines.h"
 #include "tests/support/TempFolder.h"

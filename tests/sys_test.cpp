@@ -1,4 +1,4 @@
-#include "store/Sys.h"
+#include "base/Sys.h"
 
 #include <gtest/gtest.h>
 

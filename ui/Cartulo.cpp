@@ -17,13 +17,13 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
-#include "app/Companion.h"
 #include "app/FrameRules.h"
 #include "app/Icons.h"
 #include "app/Ids.h"
 #include "app/Ipc.h"
-#include "app/Log.h"
 #include "app/Native.h"
+#include "base/Companion.h"
+#include "base/Log.h"
 #include "encoding/Encoding.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"

@@ -14,11 +14,11 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
 #include "app/Icons.h"
 #include "app/Ids.h"
-#include "app/Log.h"
 #include "app/Native.h"
+#include "base/Companion.h"
+#include "base/Log.h"
 #include "encoding/Encoding.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"

@@ -3,8 +3,8 @@
 
 #include <wx/msgdlg.h>
 
-#include "app/Companion.h"
-#include "app/Log.h"
+#include "base/Companion.h"
+#include "base/Log.h"
 #include "ui/DisplayText.h"
 #include "ui/EntryDialogs.h"
 #include "ui/EntryRules.h"

@@ -7,9 +7,9 @@
 #include <wx/msgdlg.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
 #include "app/Ids.h"
-#include "app/Log.h"
+#include "base/Companion.h"
+#include "base/Log.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/FieldDialogs.h"

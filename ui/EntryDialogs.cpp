@@ -5,7 +5,7 @@
 #include <wx/sizer.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 #include "encoding/Encoding.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"

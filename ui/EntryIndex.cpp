@@ -6,8 +6,8 @@
 #include <cstdlib>
 #include <cwchar>
 
+#include "base/Ascii.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 #include "ui/SearchText.h"
 
 // --- Rows ---

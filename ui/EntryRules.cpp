@@ -4,9 +4,9 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "app/Log.h"
+#include "base/Ascii.h"
+#include "base/Log.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 #include "store/BibOutside.h"
 
 // --- Fields ---

@@ -5,7 +5,7 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/FieldKeys.h"

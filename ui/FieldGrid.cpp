@@ -6,8 +6,8 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "base/Ascii.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 #include "store/BibOutside.h"
 #include "ui/StringSources.h"
 #include "ui/Values.h"

@@ -4,7 +4,7 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/MessagesText.h"

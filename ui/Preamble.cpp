@@ -8,8 +8,8 @@
 #include <wx/textbuf.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
-#include "app/Log.h"
+#include "base/Companion.h"
+#include "base/Log.h"
 #include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
 #include "ui/Dialogs.h"

@@ -8,10 +8,10 @@
 #include <wx/statusbr.h>
 #include <wx/utils.h>
 
-#include "app/Companion.h"
 #include "app/FrameRules.h"
+#include "base/Companion.h"
+#include "base/Sys.h"
 #include "encoding/Encoding.h"
-#include "store/Sys.h"
 #include "ui/Cartulo.h"
 #include "ui/DisplayText.h"
 

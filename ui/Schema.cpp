@@ -4,12 +4,12 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "app/Log.h"
+#include "base/Ascii.h"
+#include "base/Log.h"
+#include "base/Profile.h"
+#include "base/Sys.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 #include "store/BibStore.h"
-#include "store/Profile.h"
-#include "store/Sys.h"
 
 // Of buffers, in bytes with the end: what does not fit is not read.
 enum { SECTION_NAMES_SIZE = 2046, VALUE_SIZE = 64, NAME_SIZE = 256, HELP_SIZE = 1024 };

@@ -6,10 +6,10 @@
 #include <iterator>
 #include <set>
 
+#include "base/Ascii.h"
+#include "base/Profile.h"
 #include "encoding/Encoding.h"
-#include "store/Ascii.h"
 #include "store/BibOutside.h"
-#include "store/Profile.h"
 
 // Of buffers, in bytes with the end: what does not fit is not read.
 enum { NAMES_SIZE = 1024, SECTION_NAME_SIZE = 64, LIST_SIZE = 4096 };

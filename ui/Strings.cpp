@@ -7,10 +7,10 @@
 #include <wx/sizer.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
 #include "app/Icons.h"
-#include "app/Log.h"
 #include "app/Native.h"
+#include "base/Companion.h"
+#include "base/Log.h"
 #include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
 #include "ui/Dialogs.h"

@@ -6,7 +6,7 @@
 
 #include <unistd.h>
 
-#include "store/Ascii.h"
+#include "base/Ascii.h"
 #include "tests/fuzz/Demand.h"
 
 namespace

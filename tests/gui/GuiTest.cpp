@@ -14,9 +14,9 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
-#include "app/Companion.h"
 #include "app/Ids.h"
 #include "app/LogGui.h"
+#include "base/Companion.h"
 #include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
 #include "ui/Messages.h"

@@ -7,8 +7,8 @@
 #include <wx/scrolwin.h>
 #include <wx/settings.h>
 
-#include "app/Companion.h"
 #include "app/Native.h"
+#include "base/Companion.h"
 #include "ui/PanelRules.h"
 
 using Lines = std::vector<LogLine>;

@@ -10,8 +10,8 @@
 #include "ui/EntryDialogs.h"
 #include "ui/Preamble.h"
 #include "ui/PreambleText.h"
-#include "ui/StringSources.h"
 #include "ui/Strings.h"
+#include "ui/StringSources.h"
 
 using Texts = std::vector<wxString>;
 

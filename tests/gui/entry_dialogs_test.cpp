@@ -11,8 +11,8 @@
 #include <wx/textctrl.h>
 #include <wx/uiaction.h>
 
-#include "app/Companion.h"
 #include "app/Ids.h"
+#include "base/Companion.h"
 #include "ui/Cartulo.h"
 #include "ui/EntryDialogs.h"
 #include "ui/QListBox.h"

@@ -5,7 +5,7 @@
 
 #include <algorithm>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 #include "ui/FieldDialogs.h"
 
 using Lines = std::vector<LogLine>;

@@ -15,10 +15,10 @@
 #include <wx/utils.h>
 
 #include "app/AboutDlg.h"
-#include "app/Companion.h"
 #include "app/Icons.h"
 #include "app/Ids.h"
 #include "app/Native.h"
+#include "base/Companion.h"
 #include "ui/Cartulo.h"
 #include "ui/QListBox.h"
 

@@ -18,13 +18,13 @@
 #include <wx/dialog.h>
 #include <wx/timer.h>
 
-#include "app/Companion.h"
 #include "app/Ipc.h"
 #include "app/IpcConnection.h"
 #include "app/IpcMessage.h"
 #include "app/IpcServer.h"
+#include "base/Companion.h"
+#include "base/Sys.h"
 #include "store/BibStore.h"
-#include "store/Sys.h"
 #include "ui/Cartulo.h"
 #include "ui/QListBox.h"
 

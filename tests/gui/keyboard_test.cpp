@@ -6,8 +6,8 @@
 #include <wx/srchctrl.h>
 #include <wx/uiaction.h>
 
-#include "app/Companion.h"
 #include "app/Ids.h"
+#include "base/Companion.h"
 #include "ui/Cartulo.h"
 #include "ui/QListBox.h"
 

@@ -10,8 +10,8 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
 #include "app/Ids.h"
+#include "base/Companion.h"
 #include "ui/Cartulo.h"
 #include "ui/QListBox.h"
 

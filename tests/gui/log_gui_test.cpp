@@ -4,8 +4,8 @@
 
 #include <wx/log.h>
 
-#include "app/Companion.h"
 #include "app/LogGui.h"
+#include "base/Companion.h"
 
 // What `log` makes the toolkit write.
 template <class Function> static std::vector<LogLine> Written(Function log)

@@ -6,8 +6,8 @@
 #include <wx/settings.h>
 #include <wx/textctrl.h>
 
-#include "app/Companion.h"
 #include "app/Ids.h"
+#include "base/Companion.h"
 #include "ui/Cartulo.h"
 #include "ui/PanelRules.h"
 

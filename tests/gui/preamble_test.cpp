@@ -5,7 +5,7 @@
 
 #include <wx/clipbrd.h>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 #include "ui/Preamble.h"
 #include "ui/PreambleText.h"
 

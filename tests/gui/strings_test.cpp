@@ -6,7 +6,7 @@
 #include <wx/listbox.h>
 #include <wx/uiaction.h>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 #include "ui/Strings.h"
 
 using Lines = std::vector<LogLine>;

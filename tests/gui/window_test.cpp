@@ -18,9 +18,9 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
-#include "app/Companion.h"
 #include "app/Ids.h"
-#include "store/Sys.h"
+#include "base/Companion.h"
+#include "base/Sys.h"
 #include "ui/Cartulo.h"
 #include "ui/Messages.h"
 #include "ui/PanelRules.h"

@@ -13,7 +13,7 @@
 
 #include <unistd.h>
 
-#include "app/Log.h"
+#include "base/Log.h"
 
 class LogWatch
 {

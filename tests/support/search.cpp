@@ -3,7 +3,7 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 
 int main(int argc, char **argv)
 {

@@ -1,7 +1,7 @@
-// store/Sys-posix.cpp - files, locks, time and places, for POSIX systems.
+// base/SysFiles-posix.cpp - files, locks, time and places, for POSIX systems.
 
-#include "store/Sys-posix.h"
-#include "store/Sys.h"
+#include "base/Sys-posix.h"
+#include "base/Sys.h"
 
 #include <algorithm>
 #include <cerrno>
@@ -17,8 +17,6 @@
 #include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
-
-#include "store/BibStore.h"
 
 // Descriptors of the locks that this process holds.
 static std::vector<int> LockHandles;

@@ -1,7 +1,7 @@
-// store/SysChild-posix.cpp - child processes that work for this one, for POSIX systems.
+// base/SysChild-posix.cpp - child processes that work for this one, for POSIX systems.
 
-#include "store/Sys-posix.h"
-#include "store/Sys.h"
+#include "base/Sys-posix.h"
+#include "base/Sys.h"
 
 #include <cerrno>
 #include <clocale>

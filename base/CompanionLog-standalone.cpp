@@ -1,5 +1,5 @@
-// app/CompanionLog-standalone.cpp - the log of a program that runs on its own.
-#include "app/Companion.h"
+// base/CompanionLog-standalone.cpp - the log of a program that runs on its own.
+#include "base/Companion.h"
 
 #include <cstdio>
 #include <cstdlib>

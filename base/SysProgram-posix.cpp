@@ -1,7 +1,7 @@
-// store/SysProgram-posix.cpp - other programs, and files in folders, for POSIX systems.
+// base/SysProgram-posix.cpp - other programs, and files in folders, for POSIX systems.
 
-#include "store/Sys-posix.h"
-#include "store/Sys.h"
+#include "base/Sys-posix.h"
+#include "base/Sys.h"
 
 #include <algorithm>
 #include <cerrno>

@@ -1,4 +1,4 @@
-// store/Ascii.h - comparison and search that ignore the case of the ASCII letters only.
+// base/Ascii.h - comparison and search that ignore the case of the ASCII letters only.
 // The C library's own depend on the locale; keys and names must not.
 #pragma once
 

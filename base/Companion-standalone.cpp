@@ -1,17 +1,16 @@
-// app/Companion-standalone.cpp - the TeX environment's services for a program that runs on its own:
-// its files are looked for where TeX and the system keep them, its settings come from an INI file,
-// and its windows are named by notes that end with their process.
-#include "app/Companion.h"
+// base/Companion-standalone.cpp - the TeX environment's services for a program that runs on its
+// own: its files are looked for where TeX and the system keep them, its settings come from an INI
+// file, and its windows are named by notes that end with their process.
+#include "base/Companion.h"
 
 #include <cstdlib>
 #include <cstring>
 #include <string>
 #include <vector>
 
-#include "store/Ascii.h"
-#include "store/BibStore.h"
-#include "store/Profile.h"
-#include "store/Sys.h"
+#include "base/Ascii.h"
+#include "base/Profile.h"
+#include "base/Sys.h"
 
 using Folders = std::vector<std::string>;
 

@@ -1,11 +1,19 @@
-// store/Sys.h - what the program asks of the operating system.
-// Includes no system header; see Sys-posix.cpp. Sys_LastErrorText, Sys_ToBackslashes and
-// Sys_ModulePath are declared in BibStore.h.
+// base/Sys.h - what the program asks of the operating system.
+//
+// Includes no system header. The section on files, and those on errors, time and the executable,
+// are in SysFiles-posix.cpp, the others in the file of their name: SysPlaces, SysNote, SysProgram,
+// SysSocket and SysChild.
 #pragma once
 
 #include <cstddef>
 #include <cstdint>
 #include <cstdio>
+
+// --- Errors and the executable ---
+
+const char *Sys_LastErrorText();     // the system's text for the last error; static buffer
+char *Sys_ToBackslashes(char *path); // every '/' becomes '\', in place; null stays null
+const char *Sys_ModulePath();        // full path of the executable, at most 260 characters
 
 // --- Files ---
 

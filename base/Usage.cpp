@@ -1,4 +1,4 @@
-#include "app/PlainAnswer.h"
+#include "base/Usage.h"
 
 #include <cstdio>
 #include <cstring>
@@ -11,7 +11,7 @@ static const char *AnswerTo(const char *argument, const char *usage, const char 
     return strcmp(argument, "--version") == 0 ? version : nullptr;
 }
 
-int PlainAnswer(int argc, char **argv, const char *usage, const char *version)
+int Usage_Answer(int argc, char **argv, const char *usage, const char *version)
 {
     for (int i = 1; i < argc; ++i) {
         const char *answer = AnswerTo(argv[i], usage, version);

@@ -1,6 +1,6 @@
-// store/SysPlaces-posix.cpp - the user's folders, for POSIX systems.
+// base/SysPlaces-posix.cpp - the user's folders, for POSIX systems.
 
-#include "store/Sys.h"
+#include "base/Sys.h"
 
 #include <cerrno>
 #include <cstdlib>

@@ -1,4 +1,4 @@
-// store/Profile.h - reading INI files, with the rules of the private profiles that such files were
+// base/Profile.h - reading INI files, with the rules of the private profiles that such files were
 // written for.
 //
 // "[section]" lines head their lines; "key=value" lines set keys; lines whose first character is

@@ -1,15 +1,15 @@
 // By hand: the libraries for INI files join sections of one name, let the last line of a key hold,
 // or take '#' for a comment too.
 
-#include "store/Profile.h"
+#include "base/Profile.h"
 
 #include <algorithm>
 #include <cstring>
 #include <string>
 #include <string_view>
 
-#include "store/Ascii.h"
-#include "store/Sys.h"
+#include "base/Ascii.h"
+#include "base/Sys.h"
 
 using Text = std::string_view;
 

@@ -1,12 +1,12 @@
-// store/SysNote-posix.cpp - texts that stand while their process lives, for POSIX systems.
+// base/SysNote-posix.cpp - texts that stand while their process lives, for POSIX systems.
 //
 // The process holds a record lock on the file, which the system takes away when the process ends,
 // whatever ends it. Here this lock is better than that of flock: children do not inherit it. What
 // it costs is that closing any descriptor of the file drops it, so a process never opens a note of
 // its own a second time.
 
-#include "store/Sys-posix.h"
-#include "store/Sys.h"
+#include "base/Sys-posix.h"
+#include "base/Sys.h"
 
 #include <cerrno>
 #include <cstdlib>

@@ -1,9 +1,9 @@
-// app/Log.cpp - the program's trace lines.
-#include "app/Log.h"
+// base/Log.cpp - the program's trace lines.
+#include "base/Log.h"
 
 #include <cstring>
 
-#include "app/Companion.h"
+#include "base/Companion.h"
 
 static const size_t LINE_LENGTH = 511; // without the NUL
 

@@ -1,7 +1,7 @@
-// store/SysSocket-posix.cpp - byte streams between the user's processes, for POSIX systems.
+// base/SysSocket-posix.cpp - byte streams between the user's processes, for POSIX systems.
 
-#include "store/Sys-posix.h"
-#include "store/Sys.h"
+#include "base/Sys-posix.h"
+#include "base/Sys.h"
 
 #include <algorithm>
 #include <cerrno>

@@ -1,4 +1,4 @@
-// store/Sys-posix.h - shared by the files that implement Sys.h on POSIX systems.
+// base/Sys-posix.h - shared by the files that implement Sys.h on POSIX systems.
 #pragma once
 
 int Sys_FailWith(int error);     // leaves the reason in errno; 0
