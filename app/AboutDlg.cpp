@@ -7,8 +7,8 @@
 #include <wx/statbmp.h>
 #include <wx/stattext.h>
 
-#include "app/Icons.h"
 #include "base/Companion.h"
+#include "ui/Icons.h"
 #include "ui/Theme.h"
 
 enum { LOGO_SIZE = 128 };

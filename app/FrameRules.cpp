@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstdlib>
 
-#include "app/Ids.h"
+#include "ui/Ids.h"
 
 FrameGeometry Frame_FitGeometry(FrameGeometry stored, FrameSize smallest, FrameSize desktop)
 {
@@ -63,7 +63,7 @@ const Shortcut *Frame_FindShortcut(int key, bool alt, bool ctrl, bool editMode, 
     return nullptr;
 }
 
-uint32_t Frame_LogCharacter(uint32_t character)
+uint32_t Log_Character(uint32_t character)
 {
     bool isControl = character < ' ' || (character >= 0x7F && character < 0xA0);
     bool isSurrogate = character >= 0xD800 && character <= 0xDFFF;

@@ -47,4 +47,4 @@ const Shortcut *Frame_FindShortcut(int key, bool alt, bool ctrl, bool editMode, 
 
 // What stands for a character in the log: itself, or a blank for a control character, a surrogate
 // or 0, which would end or spoil the line.
-uint32_t Frame_LogCharacter(uint32_t character);
+uint32_t Log_Character(uint32_t character);

@@ -15,12 +15,12 @@
 #include "app/Ipc.h"
 #include "app/IpcServer.h"
 #include "app/LogGui.h"
-#include "app/Native.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "base/Sys.h"
 #include "base/Usage.h"
 #include "encoding/Encoding.h"
+#include "ui/Native.h"
 
 wxBEGIN_EVENT_TABLE(MyApp, wxApp)
     EVT_ACTIVATE_APP(MyApp::OnActivateApp)

@@ -4,8 +4,8 @@
 #include <wx/app.h>
 #include <wx/weakref.h>
 
-#include "app/CommandLine.h"
 #include "app/MyFrame.h"
+#include "session/CommandLine.h"
 
 class MyServer;
 

@@ -13,15 +13,15 @@
 #include <wx/utils.h>
 
 #include "app/AboutDlg.h"
-#include "app/Icons.h"
-#include "app/Ids.h"
-#include "app/Native.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "base/Sys.h"
+#include "session/MessagesText.h"
 #include "ui/Cartulo.h"
+#include "ui/Icons.h"
+#include "ui/Ids.h"
 #include "ui/Messages.h"
-#include "ui/MessagesText.h"
+#include "ui/Native.h"
 #include "ui/QListBox.h"
 
 enum { SMALLEST_WINDOW = 512, DEFAULT_PLACE = 50, TOOL_MARGIN = 4, SEARCH_WIDTH = 160 };
@@ -338,8 +338,8 @@ static void LogKey(const wxKeyEvent &event)
 {
     int key = event.GetKeyCode();
     uint32_t character = key < WXK_START ? uint32_t(key) : 0; // the others are no characters
-    wxString text = wxString::Format(
-        "Key=%d(%c),Mod=%x", key, wxUniChar(Frame_LogCharacter(character)), event.GetModifiers());
+    wxString text = wxString::Format("Key=%d(%c),Mod=%x", key, wxUniChar(Log_Character(character)),
+                                     event.GetModifiers());
     TNSMessage("INFO: MyFrame::OnCharHook ", text.utf8_str(), TNS_LIFECYCLE);
 }
 

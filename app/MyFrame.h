@@ -7,8 +7,8 @@
 #include <wx/frame.h>
 #include <wx/timer.h>
 
-#include "app/CommandLine.h"
 #include "app/FrameRules.h"
+#include "session/CommandLine.h"
 
 class Cartulo;
 class DialogCount;

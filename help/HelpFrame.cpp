@@ -8,8 +8,8 @@
 #include <wx/sizer.h>
 #include <wx/utils.h>
 
-#include "app/Icons.h"
 #include "help/HelpPage.h"
+#include "ui/Icons.h"
 
 enum { ID_SEARCH_TEXT = 1, VIEW_MARGIN = 12 };
 

@@ -8,12 +8,12 @@
 #include <wx/image.h>
 #include <wx/msgdlg.h>
 
-#include "app/Native.h"
 #include "base/Companion.h"
 #include "base/Sys.h"
 #include "base/Usage.h"
 #include "help/HelpFrame.h"
 #include "help/HelpPage.h"
+#include "ui/Native.h"
 
 static const char Usage[] = "Usage: metahelp [TOPIC]\n"
                             "\n"

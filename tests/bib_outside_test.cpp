@@ -11,10 +11,10 @@
 #include <btparse.h>
 
 #include "encoding/Encoding.h"
-#include "store/BibFileSet.h"
+#include "session/EntryRules.h"
+#include "session/FileSet.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/TempFolder.h"
-#include "ui/EntryRules.h"
 #include "ui/FieldGrid.h"
 #include "ui/PreambleText.h"
 #include "ui/StringSources.h"

@@ -15,12 +15,12 @@
 #include "base/Ascii.h"
 #include "base/Profile.h"
 #include "encoding/Encoding.h"
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
+#include "session/Schema.h"
 #include "store/BibStore.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TempFolder.h"
-#include "ui/Schema.h"
 
 namespace
 {

@@ -1,5 +1,5 @@
 // tests/command_line_test.cpp - tokens, file names, and the files that a command line opens.
-#include "app/CommandLine.h"
+#include "session/CommandLine.h"
 
 #include <algorithm>
 #include <cstdio>

@@ -1,4 +1,4 @@
-#include "ui/EntryRules.h"
+#include "session/EntryRules.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -7,9 +7,9 @@
 #include <vector>
 
 #include "encoding/Encoding.h"
+#include "session/Schema.h"
 #include "tests/support/LogWatch.h"
 #include "tests/support/TempFolder.h"
-#include "ui/Schema.h"
 
 using testing::ElementsAre;
 using testing::HasSubstr;
@@ -405,7 +405,7 @@ TEST_F(EntryKeys, AreComparedAcrossEncodings)
     BibFile *utf8 = Open("a.bib", "@misc{M\xC3\xBCller,}\n");
     BibFile *other = Open("b.bib", "@misc{\xD6sterreich,}\n");
     auto check = [this](const wchar_t *key, const BibFile *target) {
-        return Entry_CheckNewKey(&set, target, Key_Read(key, Bib_Encoding(target)));
+        return Entry_CheckNewKey(&set, target, Name_Read(key, Bib_Encoding(target)));
     };
     EXPECT_EQ(KEY_TAKEN_ELSEWHERE, check(L"m\u00FCller", other));
     EXPECT_EQ(KEY_TAKEN, check(L"m\u00FCller", utf8));
@@ -420,9 +420,9 @@ TEST_F(EntryKeys, AreComparedWithoutTheLettersThatAnEncodingLacks)
     Enc_Select("CP65001");
     BibFile *utf8 = Open("a.bib", "@misc{a,}\n");
     Open("b.bib", "@misc{\xFF,}\n");
-    EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, utf8, Key_Read(L"\u0416", &EncodingUtf8)));
+    EXPECT_EQ(KEY_OK, Entry_CheckNewKey(&set, utf8, Name_Read(L"\u0416", &EncodingUtf8)));
     EXPECT_EQ(KEY_TAKEN_ELSEWHERE,
-              Entry_CheckNewKey(&set, utf8, Key_Read(L"\u00FF", &EncodingUtf8)));
+              Entry_CheckNewKey(&set, utf8, Name_Read(L"\u00FF", &EncodingUtf8)));
 }
 
 TEST_F(NewEntry, HasNamesInTheEncodingOfItsFile)

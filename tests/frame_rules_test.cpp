@@ -3,7 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "app/FrameRules.h"
-#include "app/Ids.h"
+#include "ui/Ids.h"
 
 static int IdOf(int key, bool alt, bool ctrl, bool editMode = false)
 {
@@ -166,9 +166,9 @@ TEST(FrameShortcutKey, TakesAltAndCtrlTogetherWhenTheyTypeNothingElse)
 TEST(FrameLogCharacter, IsABlankForWhatCannotBeShown)
 {
     for (uint32_t c : {0x0, 0x1, 0x9, 0xD, 0x1B, 0x1F, 0x7F, 0x80, 0x9F, 0xD800, 0xDFFF})
-        EXPECT_EQ(uint32_t(' '), Frame_LogCharacter(c)) << c;
+        EXPECT_EQ(uint32_t(' '), Log_Character(c)) << c;
     for (uint32_t c : {0x20, 0x41, 0x7E, 0xA0, 0xFC, 0x44C, 0xD7FF, 0xE000, 0xFFFD})
-        EXPECT_EQ(c, Frame_LogCharacter(c));
+        EXPECT_EQ(c, Log_Character(c));
 }
 
 TEST(FrameFindShortcut, LeavesOtherKeysAlone)

@@ -3,7 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "encoding/Encoding.h"
-#include "ui/MessagesText.h"
+#include "session/MessagesText.h"
 
 static std::wstring Widen(const char *text)
 {

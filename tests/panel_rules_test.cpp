@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "app/Ids.h"
+#include "ui/Ids.h"
 #include "ui/PanelRules.h"
 
 static const Colour White = {255, 255, 255}, Black = {0, 0, 0};
@@ -71,15 +71,15 @@ TEST_F(PanelToolStates, NothingWithoutFilesOrWhileAnEntryIsEdited)
 
 TEST(PanelContrast, IsThatOfTheGuidelines)
 {
-    EXPECT_NEAR(21.0, Panel_Contrast(Black, White), 0.001);
-    EXPECT_NEAR(1.0, Panel_Contrast(White, White), 0.001);
-    EXPECT_NEAR(4.54, Panel_Contrast({118, 118, 118}, White), 0.01);
+    EXPECT_NEAR(21.0, Colour_Contrast(Black, White), 0.001);
+    EXPECT_NEAR(1.0, Colour_Contrast(White, White), 0.001);
+    EXPECT_NEAR(4.54, Colour_Contrast({118, 118, 118}, White), 0.01);
 }
 
 TEST(PanelTextColour, KeepsTheChosenColourOnLightThemes)
 {
     for (Colour heading : Headings) {
-        Colour c = Panel_TextColour(heading, White, false);
+        Colour c = Colour_ForText(heading, White, false);
         EXPECT_EQ(heading.red, c.red);
         EXPECT_EQ(heading.green, c.green);
         EXPECT_EQ(heading.blue, c.blue);
@@ -90,25 +90,25 @@ TEST(PanelTextColour, IsReadableOnDarkThemes)
 {
     for (Colour background : {Black, Colour{45, 45, 45}, Colour{56, 56, 56}}) {
         for (Colour heading : Headings)
-            EXPECT_GE(Panel_Contrast(Panel_TextColour(heading, background, true), background), 4.5);
+            EXPECT_GE(Colour_Contrast(Colour_ForText(heading, background, true), background), 4.5);
     }
 }
 
 TEST(PanelTextColour, KeepsDarkAndBrightColoursApartOnDarkThemes)
 {
     const Colour back = {53, 53, 53};
-    Colour dark = Panel_TextColour({0, 0, 128}, back, true);
-    Colour bright = Panel_TextColour({0, 0, 255}, back, true);
-    EXPECT_GE(Panel_Contrast(dark, bright), 1.4);
+    Colour dark = Colour_ForText({0, 0, 128}, back, true);
+    Colour bright = Colour_ForText({0, 0, 255}, back, true);
+    EXPECT_GE(Colour_Contrast(dark, bright), 1.4);
 }
 
 TEST(PanelTextColour, KeepsTheHueOnDarkThemes)
 {
-    Colour blue = Panel_TextColour({0, 0, 100}, {45, 45, 45}, true);
+    Colour blue = Colour_ForText({0, 0, 100}, {45, 45, 45}, true);
     EXPECT_EQ(255, blue.blue);
     EXPECT_EQ(blue.red, blue.green);
     EXPECT_LT(blue.red, blue.blue);
-    Colour green = Panel_TextColour({0, 128, 0}, {45, 45, 45}, true);
+    Colour green = Colour_ForText({0, 128, 0}, {45, 45, 45}, true);
     EXPECT_EQ(green.red, green.blue);
     EXPECT_LT(green.red, green.green);
     EXPECT_GT(green.green, 128); // lighter than on light themes

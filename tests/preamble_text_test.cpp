@@ -4,7 +4,7 @@
 #include <cstring>
 #include <string>
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 #include "tests/support/LoadText.h"
 #include "ui/PreambleText.h"
 

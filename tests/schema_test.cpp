@@ -6,10 +6,10 @@
 #include <vector>
 
 #include "encoding/Encoding.h"
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
+#include "session/Schema.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TempFolder.h"
-#include "ui/Schema.h"
 
 TEST(SchemaIniPath, ReplacesTheEndingOfTheFileName)
 {
@@ -202,7 +202,7 @@ TEST(SchemaFieldColour, TellsTheClassesApart)
                        {FIELD_MANDATORY, 0, 0, 128},
                        {FIELD_OPTIONAL, 0, 0, 255}};
     for (const auto &c : cases) {
-        Colour colour = Schema_FieldColour(c.fieldClass);
+        Colour colour = Colour_OfField(c.fieldClass);
         EXPECT_THAT((std::vector<int>{colour.red, colour.green, colour.blue}),
                     ElementsAre(c.red, c.green, c.blue));
     }

@@ -5,8 +5,8 @@
 #include <string>
 
 #include "encoding/Encoding.h"
+#include "session/Values.h"
 #include "tests/support/LoadText.h"
-#include "ui/Values.h"
 
 namespace
 {

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/TempFolder.h"
 #include "ui/StringSources.h"

@@ -2,7 +2,7 @@
 #include <gtest/gtest.h>
 
 #include "encoding/Encoding.h"
-#include "ui/Values.h"
+#include "session/Values.h"
 
 TEST(ValueRead, MakesStoreTextOfWhatWasTyped)
 {

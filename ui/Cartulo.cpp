@@ -18,22 +18,22 @@
 #include <wx/toolbar.h>
 
 #include "app/FrameRules.h"
-#include "app/Icons.h"
-#include "app/Ids.h"
 #include "app/Ipc.h"
-#include "app/Native.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/Schema.h"
+#include "session/Values.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
+#include "ui/Icons.h"
+#include "ui/Ids.h"
 #include "ui/Messages.h"
+#include "ui/Native.h"
 #include "ui/Preamble.h"
 #include "ui/QListBox.h"
-#include "ui/Schema.h"
 #include "ui/Strings.h"
 #include "ui/Theme.h"
-#include "ui/Values.h"
 
 enum { SASH_POSITION = 300, SMALLEST_PANE = 20, HELP_HEIGHT = 40 };
 enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window

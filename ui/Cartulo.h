@@ -7,8 +7,8 @@
 
 #include <string>
 
-#include "app/CommandLine.h"
-#include "store/BibFileSet.h"
+#include "session/CommandLine.h"
+#include "session/FileSet.h"
 #include "ui/FieldGrid.h"
 
 class Cartulo_Messages;

@@ -14,17 +14,17 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "app/Icons.h"
-#include "app/Ids.h"
-#include "app/Native.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/EntryRules.h"
+#include "session/Schema.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
-#include "ui/EntryRules.h"
+#include "ui/Icons.h"
+#include "ui/Ids.h"
+#include "ui/Native.h"
 #include "ui/QListBox.h"
-#include "ui/Schema.h"
 #include "ui/StringSources.h"
 #include "ui/Theme.h"
 #include "ui/TypeChoice.h"
@@ -286,7 +286,7 @@ void Cartulo::Update_Field_Colors(const char *type)
     TNSMessage("INFO: Update_Field_Colors for ", type, TNS_LIFECYCLE);
     for (int i = 0; i < m_grid.count; ++i) {
         FieldClass fieldClass = Schema_FieldClass(m_ini.c_str(), type, m_grid.rows[i].key.c_str());
-        Theme_SetTextColour(m_rows[i].label, Schema_FieldColour(fieldClass));
+        Theme_SetTextColour(m_rows[i].label, Colour_OfField(fieldClass));
     }
 }
 

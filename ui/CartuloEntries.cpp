@@ -5,9 +5,9 @@
 
 #include "base/Companion.h"
 #include "base/Log.h"
+#include "session/EntryRules.h"
 #include "ui/DisplayText.h"
 #include "ui/EntryDialogs.h"
-#include "ui/EntryRules.h"
 #include "ui/QListBox.h"
 
 void Cartulo::OnNewEntry(wxCommandEvent &)

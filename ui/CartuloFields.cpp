@@ -7,14 +7,14 @@
 #include <wx/msgdlg.h>
 #include <wx/textctrl.h>
 
-#include "app/Ids.h"
 #include "base/Companion.h"
 #include "base/Log.h"
+#include "session/Names.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/FieldDialogs.h"
 #include "ui/FieldKeys.h"
-#include "ui/Keys.h"
+#include "ui/Ids.h"
 #include "ui/PanelRules.h"
 #include "ui/QListBox.h"
 
@@ -54,7 +54,7 @@ void Cartulo::OnNewField(wxCommandEvent &)
     TNSMessage("INFO: Cartulo::OnNewField", "", TNS_ACTION);
     if (!m_editMode || !m_entry)
         return;
-    TypedKey key = Key_Read(m_newFieldKey->GetValue().ToStdWstring().c_str(), m_grid.encoding);
+    TypedName key = Name_Read(m_newFieldKey->GetValue().ToStdWstring().c_str(), m_grid.encoding);
     switch (Name_Check(key)) {
     case NAME_EMPTY:
         ShowWarning(AddTitle, "Field key is undefined.\nPlease enter key name or choose some "
@@ -64,7 +64,7 @@ void Cartulo::OnNewField(wxCommandEvent &)
         Box_WarnOrCancel(wxGetTopLevelParent(this), AddTitle, FieldKey_BadCharsText);
         break;
     case NAME_MISFIT:
-        ShowWarning(AddTitle, Key_MisfitText(key));
+        ShowWarning(AddTitle, Name_MisfitText(key));
         break;
     case NAME_UNWRITABLE:
         ShowWarning(AddTitle, FieldKey_UnwritableText);

@@ -9,9 +9,9 @@
 #include <wx/textctrl.h>
 #include <wx/textentry.h>
 
+#include "session/Names.h"
 #include "store/BibStore.h"
 #include "ui/DisplayText.h"
-#include "ui/Keys.h"
 
 enum { LONG_WORD = 1000 }; // characters
 
@@ -83,7 +83,7 @@ bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, lo
 }
 
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
-                       const TypedKey &key, wxWindow *field)
+                       const TypedName &key, wxWindow *field)
 {
     wxTextEntry *entry = dynamic_cast<wxTextEntry *>(field);
     const bool accepted = Box_WarnOrCancel(parent, caption, text);

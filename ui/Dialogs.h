@@ -4,7 +4,7 @@
 #include <wx/sizer.h>
 #include <wx/string.h>
 
-struct TypedKey;
+struct TypedName;
 class wxDialog;
 class wxTextCtrl;
 class wxWindow;
@@ -40,7 +40,7 @@ bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, lo
 // Offers to take the characters out of `key` that no key may hold; what is left goes into `field`,
 // which is a text entry and gets the focus.
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,
-                       const TypedKey &key, wxWindow *field);
+                       const TypedName &key, wxWindow *field);
 
 // --- Texts in controls ---
 

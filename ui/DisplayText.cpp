@@ -5,8 +5,8 @@
 #include <wx/strconv.h>
 
 #include "encoding/Encoding.h"
+#include "session/Values.h"
 #include "store/BibStore.h"
-#include "ui/Values.h"
 
 enum { LONGEST_TEXT = 1000 }; // characters
 

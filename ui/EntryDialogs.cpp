@@ -7,10 +7,10 @@
 
 #include "base/Companion.h"
 #include "encoding/Encoding.h"
+#include "session/Names.h"
+#include "session/Schema.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
-#include "ui/Keys.h"
-#include "ui/Schema.h"
 #include "ui/TypeChoice.h"
 
 enum { KEY_WIDTH = 280 };
@@ -53,10 +53,10 @@ int EntryDialog::CurrentChoice() const
     return wxNOT_FOUND;
 }
 
-TypedKey EntryDialog::Key(const BibFile *file) const
+TypedName EntryDialog::Key(const BibFile *file) const
 {
-    return Key_Read(m_key->GetValue().ToStdWstring().c_str(),
-                    file ? Bib_Encoding(file) : Enc_Current());
+    return Name_Read(m_key->GetValue().ToStdWstring().c_str(),
+                     file ? Bib_Encoding(file) : Enc_Current());
 }
 
 void EntryDialog::Refuse(const wxString &text)
@@ -70,7 +70,7 @@ bool EntryDialog::AcceptDuplicate()
     return Box_Ask(this, m_texts.caption, m_texts.takenElsewhere);
 }
 
-bool EntryDialog::Accept(KeyVerdict verdict, const TypedKey &key)
+bool EntryDialog::Accept(KeyVerdict verdict, const TypedName &key)
 {
     switch (verdict) {
     case KEY_OK:
@@ -86,7 +86,7 @@ bool EntryDialog::Accept(KeyVerdict verdict, const TypedKey &key)
                           key, m_key);
         return false;
     case KEY_MISFIT:
-        Refuse(Key_MisfitText(key));
+        Refuse(Name_MisfitText(key));
         return false;
     case KEY_UNWRITABLE:
         Refuse("An entry with this key can't be written to a BIB file.");
@@ -163,7 +163,7 @@ void Cartulo_NewEntry::OnOK(wxCommandEvent &event)
 {
     int file = TargetFile();
     const BibFile *target = file >= 0 ? m_current.set->files[file] : nullptr;
-    TypedKey key = Key(target);
+    TypedName key = Key(target);
     KeyVerdict verdict = Entry_CheckNewKey(m_current.set, target, key);
     if (Accept(verdict, key) && Create(file, key.text))
         event.Skip(); // closes
@@ -229,7 +229,7 @@ void Cartulo_RenameEntry::OnOK(wxCommandEvent &event)
         return;
     }
     BibFile *file = m_current.set->files[m_current.file];
-    TypedKey key = Key(file);
+    TypedName key = Key(file);
     KeyVerdict verdict = Entry_CheckRename(m_current.set, file, m_current.entry, key);
     if (Accept(verdict, key)) {
         Entry_Rename(file, m_current.entry, key.text.c_str());

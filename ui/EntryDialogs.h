@@ -9,7 +9,7 @@
 #include <string>
 #include <vector>
 
-#include "ui/EntryRules.h"
+#include "session/EntryRules.h"
 
 class wxCheckBox;
 class wxChoice;
@@ -42,10 +42,10 @@ protected:
     EntryDialog(wxWindow *parent, const EntryPlace &current, const Texts &texts);
 
     int CurrentChoice() const;
-    TypedKey Key(const BibFile *file) const; // as text of the file; null for none
+    TypedName Key(const BibFile *file) const; // as text of the file; null for none
 
     // False when it can't be the key; the user knows why then, or has one without bad characters.
-    bool Accept(KeyVerdict verdict, const TypedKey &key);
+    bool Accept(KeyVerdict verdict, const TypedName &key);
     void Refuse(const wxString &text);
     void SetChanged(BibEntry *entry, int file);
 

@@ -6,10 +6,10 @@
 #include <wx/textctrl.h>
 
 #include "base/Companion.h"
+#include "session/Names.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/FieldKeys.h"
-#include "ui/Keys.h"
 
 // --- The value ---
 
@@ -74,7 +74,7 @@ Cartulo_RenameField::Cartulo_RenameField(wxWindow *parent, const FieldGrid *grid
 }
 
 // False when the user has to see to the name first. An empty one is accepted: nothing changes.
-bool Cartulo_RenameField::Accept(const TypedKey &name)
+bool Cartulo_RenameField::Accept(const TypedName &name)
 {
     switch (FieldKey_CheckNewName(m_grid, name)) {
     case NAME_OK:
@@ -84,7 +84,7 @@ bool Cartulo_RenameField::Accept(const TypedKey &name)
         Box_OfferStripped(this, GetTitle(), FieldKey_BadCharsText, name, m_name);
         return false;
     case NAME_MISFIT:
-        Box_Warn(this, GetTitle(), Key_MisfitText(name));
+        Box_Warn(this, GetTitle(), Name_MisfitText(name));
         return false;
     case NAME_UNWRITABLE:
         Box_Warn(this, GetTitle(), FieldKey_UnwritableText);
@@ -97,7 +97,7 @@ bool Cartulo_RenameField::Accept(const TypedKey &name)
 
 void Cartulo_RenameField::OnOK(wxCommandEvent &event)
 {
-    TypedKey name = Key_Read(m_name->GetValue().ToStdWstring().c_str(), m_grid->encoding);
+    TypedName name = Name_Read(m_name->GetValue().ToStdWstring().c_str(), m_grid->encoding);
     if (!Accept(name))
         return;
     m_newName = name.text;

@@ -9,7 +9,7 @@
 class wxComboBox;
 class wxTextCtrl;
 struct FieldGrid;
-struct TypedKey;
+struct TypedName;
 
 enum { ID_FIELD_KEY = 6001, ID_FIELD_VALUE = 6002, ID_FIELD_NEW_NAME = 6002 };
 
@@ -39,7 +39,7 @@ public:
 
 private:
     void OnOK(wxCommandEvent &event);
-    bool Accept(const TypedKey &name);
+    bool Accept(const TypedName &name);
 
     const FieldGrid *m_grid;
     wxComboBox *m_name; // child window

@@ -8,9 +8,9 @@
 
 #include "base/Ascii.h"
 #include "encoding/Encoding.h"
+#include "session/Values.h"
 #include "store/BibOutside.h"
 #include "ui/StringSources.h"
-#include "ui/Values.h"
 
 static bool SameName(const char *a, const char *b)
 {

@@ -7,7 +7,7 @@ const char FieldKey_UnwritableText[] = "A field of this name can't be written to
                                        "or control character.";
 const char FieldKey_TakenText[] = "Field with specified key is already exists.";
 
-NameVerdict FieldKey_CheckNewName(const FieldGrid *grid, const TypedKey &name)
+NameVerdict FieldKey_CheckNewName(const FieldGrid *grid, const TypedName &name)
 {
     NameVerdict form = Name_Check(name);
     if (form != NAME_OK)

@@ -5,9 +5,9 @@
 #include <wx/textctrl.h>
 
 #include "base/Companion.h"
+#include "session/MessagesText.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
-#include "ui/MessagesText.h"
 #include "ui/Theme.h"
 
 enum { ID_MESSAGES_TEXT = 6001 };

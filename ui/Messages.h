@@ -3,7 +3,7 @@
 
 #include <wx/dialog.h>
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 
 class wxStaticText;
 class wxTextCtrl;

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cmath>
 
-#include "app/Ids.h"
+#include "ui/Ids.h"
 
 enum { DIMMEST = 50 }; // of a colour on a dark desktop, percent
 
@@ -50,7 +50,7 @@ static double Luminance(Colour c)
     return 0.2126 * Linear(c.red) + 0.7152 * Linear(c.green) + 0.0722 * Linear(c.blue);
 }
 
-double Panel_Contrast(Colour a, Colour b)
+double Colour_Contrast(Colour a, Colour b)
 {
     double la = Luminance(a), lb = Luminance(b);
     return (std::max(la, lb) + 0.05) / (std::min(la, lb) + 0.05);
@@ -80,7 +80,7 @@ static Colour Dim(Colour c, int percent)
     return {dim(c.red), dim(c.green), dim(c.blue)};
 }
 
-Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme)
+Colour Colour_ForText(Colour chosen, Colour background, bool darkTheme)
 {
     if (!darkTheme)
         return chosen;
@@ -88,11 +88,11 @@ Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme)
     double contrast = std::max({chosen.red, chosen.green, chosen.blue}) > 128 ? 4.5 : 7;
     Colour full = Saturate(chosen);
     for (int percent = DIMMEST; percent < 100; percent += 5)
-        if (Colour dim = Dim(full, percent); Panel_Contrast(dim, background) >= contrast)
+        if (Colour dim = Dim(full, percent); Colour_Contrast(dim, background) >= contrast)
             return dim;
     for (int percent = 0; percent < 100; percent += 5) {
         Colour lighter = MixWithWhite(full, percent);
-        if (Panel_Contrast(lighter, background) >= contrast)
+        if (Colour_Contrast(lighter, background) >= contrast)
             return lighter;
     }
     return {255, 255, 255};

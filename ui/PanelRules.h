@@ -1,7 +1,7 @@
 // ui/PanelRules.h - decisions of the editor panel that need no window.
 #pragma once
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 
 // What the panel shows beside the list, or instead of it.
 enum PanelPane {
@@ -28,9 +28,9 @@ struct Colour {
 };
 
 // How far two colours stand apart for the eye: 1 (equal) to 21 (black on white).
-double Panel_Contrast(Colour a, Colour b);
+double Colour_Contrast(Colour a, Colour b);
 
 // The colour of a text whose colour was chosen for light backgrounds: itself on those, and on a
 // dark one the same hue, light enough for a contrast of 4.5 at least, of 7 where the colour was
 // dark, so that dark and bright ones stay apart.
-Colour Panel_TextColour(Colour chosen, Colour background, bool darkTheme);
+Colour Colour_ForText(Colour chosen, Colour background, bool darkTheme);

@@ -11,12 +11,12 @@
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/Values.h"
 #include "ui/Cartulo.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/QListBox.h"
 #include "ui/Theme.h"
-#include "ui/Values.h"
 
 static const char QuestionCaption[] = "Editing Preamble Question";
 

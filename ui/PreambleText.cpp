@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <cstring>
 
+#include "session/Values.h"
 #include "store/BibOutside.h"
-#include "ui/Values.h"
 
 int CurrentPreamble = 0;
 

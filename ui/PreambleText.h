@@ -9,7 +9,7 @@
 #include <vector>
 
 #include "encoding/Encoding.h"
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 
 extern int CurrentPreamble; // index of the file that the window showed last
 

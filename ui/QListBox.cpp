@@ -143,9 +143,9 @@ void QListBox::OnKeyDown(wxKeyEvent &event)
 
 static void LogKey(uint32_t key, int32_t now, int32_t last)
 {
-    wxString text = wxString::Format("Key=%d(%c), Time=%d-%d=%d ms", int(key),
-                                     wxUniChar(Frame_LogCharacter(key)), int(now), int(last),
-                                     int(uint32_t(now) - uint32_t(last)));
+    wxString text =
+        wxString::Format("Key=%d(%c), Time=%d-%d=%d ms", int(key), wxUniChar(Log_Character(key)),
+                         int(now), int(last), int(uint32_t(now) - uint32_t(last)));
     TNSMessage("INFO: QListBox:OnChar ", text.utf8_str(), TNS_LIFECYCLE);
 }
 

@@ -251,7 +251,7 @@ BibString *String_Find(const BibFile *file, int row, const char *key)
     return first;
 }
 
-NameVerdict String_CheckNewKey(const BibFile *file, const TypedKey &key)
+NameVerdict String_CheckNewKey(const BibFile *file, const TypedName &key)
 {
     NameVerdict form = Name_Check(key);
     if (form != NAME_OK)

@@ -12,8 +12,8 @@
 #include <vector>
 
 #include "encoding/Encoding.h"
-#include "store/BibFileSet.h"
-#include "ui/Keys.h"
+#include "session/FileSet.h"
+#include "session/Names.h"
 
 enum { STRINGS_OF_ALL_FILES = -1 };
 
@@ -81,7 +81,7 @@ bool Strings_IsHeld(int32_t *last, int32_t now);
 // --- One file's abbreviations ---
 
 // For a new one: taken when the file has it already, ignoring case; other files do not matter.
-NameVerdict String_CheckNewKey(const BibFile *file, const TypedKey &key);
+NameVerdict String_CheckNewKey(const BibFile *file, const TypedName &key);
 
 // The abbreviation in a row of the file's lines if it goes by `key`, ignoring case, else the first
 // that does (a file may define one name more than once); null for none.

@@ -7,16 +7,16 @@
 #include <wx/sizer.h>
 #include <wx/textctrl.h>
 
-#include "app/Icons.h"
-#include "app/Native.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/Values.h"
 #include "ui/Cartulo.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
+#include "ui/Icons.h"
+#include "ui/Native.h"
 #include "ui/QListBox.h"
-#include "ui/Values.h"
 
 static const char Caption[] = "Editing Strings"; // also of the boxes
 
@@ -361,7 +361,7 @@ void Cartulo_Strings_Edit::Refuse(const wxString &text, wxTextCtrl *at)
 }
 
 // False when the user has to see to the key first.
-bool Cartulo_Strings_Edit::AcceptKey(const TypedKey &key, NameVerdict verdict)
+bool Cartulo_Strings_Edit::AcceptKey(const TypedName &key, NameVerdict verdict)
 {
     switch (verdict) {
     case NAME_OK:
@@ -370,7 +370,7 @@ bool Cartulo_Strings_Edit::AcceptKey(const TypedKey &key, NameVerdict verdict)
         Refuse("Please enter key for new string.", m_key);
         return false;
     case NAME_MISFIT:
-        Refuse(Key_MisfitText(key), m_key);
+        Refuse(Name_MisfitText(key), m_key);
         return false;
     case NAME_BAD_CHARS:
         Box_OfferStripped(this, Caption,
@@ -423,7 +423,7 @@ bool Cartulo_Strings_Edit::RefuseForMemory() // false
 
 bool Cartulo_Strings_Edit::Add()
 {
-    TypedKey key = Key_Read(m_key->GetValue().ToStdWstring().c_str(), m_encoding);
+    TypedName key = Name_Read(m_key->GetValue().ToStdWstring().c_str(), m_encoding);
     if (!AcceptKey(key, String_CheckNewKey(m_file, key)))
         return false;
     std::string value = Value_Read(m_value->GetValue().ToStdWstring(), m_encoding);

@@ -66,7 +66,7 @@ public:
 private:
     void Fill();
     void Refuse(const wxString &text, wxTextCtrl *at);
-    bool AcceptKey(const TypedKey &key, NameVerdict verdict);
+    bool AcceptKey(const TypedName &key, NameVerdict verdict);
     bool AcceptValue(const std::string &value);
     bool AcceptLosses();
     bool RefuseForMemory();

@@ -9,7 +9,7 @@
 #include <string>
 #include <vector>
 
-#include "app/CommandLine.h"
+#include "session/CommandLine.h"
 #include "tests/fuzz/Demand.h"
 
 static void CheckTokens(const std::string &line, size_t size)

@@ -14,11 +14,11 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
-#include "app/Ids.h"
 #include "app/LogGui.h"
 #include "base/Companion.h"
 #include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
+#include "ui/Ids.h"
 #include "ui/Messages.h"
 #include "ui/QListBox.h"
 

@@ -116,7 +116,7 @@ TEST_F(About, HasReadableColours)
     AboutDlg about(nullptr);
     for (const wxWindow *window : Column(about)) {
         EXPECT_GE(
-            Panel_Contrast(of(window->GetForegroundColour()), of(window->GetBackgroundColour())),
+            Colour_Contrast(of(window->GetForegroundColour()), of(window->GetBackgroundColour())),
             4.5)
             << window->GetLabel();
     }

@@ -7,8 +7,8 @@
 #include <wx/scrolwin.h>
 #include <wx/settings.h>
 
-#include "app/Native.h"
 #include "base/Companion.h"
+#include "ui/Native.h"
 #include "ui/PanelRules.h"
 
 using Lines = std::vector<LogLine>;
@@ -210,8 +210,8 @@ TEST_F(Edit, TellsFieldsApartByColours)
     };
     const wxColour back = wxSystemSettings::GetColour(wxSYS_COLOUR_BTNFACE);
     auto isShown = [&](const char *key, Colour chosen) {
-        Colour wanted = Panel_TextColour(chosen, {back.Red(), back.Green(), back.Blue()},
-                                         wxSystemSettings::GetAppearance().IsUsingDarkBackground());
+        Colour wanted = Colour_ForText(chosen, {back.Red(), back.Green(), back.Blue()},
+                                       wxSystemSettings::GetAppearance().IsUsingDarkBackground());
         Colour shown = colours()[key];
         return shown.red == wanted.red && shown.green == wanted.green && shown.blue == wanted.blue;
     };

@@ -11,10 +11,10 @@
 #include <wx/textctrl.h>
 #include <wx/uiaction.h>
 
-#include "app/Ids.h"
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
 #include "ui/EntryDialogs.h"
+#include "ui/Ids.h"
 #include "ui/QListBox.h"
 
 using Lines = std::vector<LogLine>;

@@ -15,11 +15,11 @@
 #include <wx/utils.h>
 
 #include "app/AboutDlg.h"
-#include "app/Icons.h"
-#include "app/Ids.h"
-#include "app/Native.h"
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
+#include "ui/Icons.h"
+#include "ui/Ids.h"
+#include "ui/Native.h"
 #include "ui/QListBox.h"
 
 static const char OneEntry[] = "@book{one, title = {First}}\n";

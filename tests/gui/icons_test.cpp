@@ -1,4 +1,4 @@
-#include "app/Icons.h"
+#include "ui/Icons.h"
 
 #include <cstring>
 
@@ -55,7 +55,7 @@ int ClearPart(const wxImage &image, Colour back)
     int clear = 0;
     for (int y = 0; y < image.GetHeight(); ++y) {
         for (int x = 0; x < image.GetWidth(); ++x)
-            clear += Panel_Contrast(Shown(image, x, y, back), back) >= 3;
+            clear += Colour_Contrast(Shown(image, x, y, back), back) >= 3;
     }
     return 100 * clear / (image.GetWidth() * image.GetHeight());
 }

@@ -6,9 +6,9 @@
 #include <wx/srchctrl.h>
 #include <wx/uiaction.h>
 
-#include "app/Ids.h"
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
+#include "ui/Ids.h"
 #include "ui/QListBox.h"
 
 class Keyboard : public CartuloWindow

@@ -10,9 +10,9 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "app/Ids.h"
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
+#include "ui/Ids.h"
 #include "ui/QListBox.h"
 
 class ListInWindow : public CartuloWindow

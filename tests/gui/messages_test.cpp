@@ -6,9 +6,9 @@
 #include <wx/settings.h>
 #include <wx/textctrl.h>
 
-#include "app/Ids.h"
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
+#include "ui/Ids.h"
 #include "ui/PanelRules.h"
 
 using Lines = std::vector<LogLine>;
@@ -30,8 +30,8 @@ protected:
         wxStaticText *heading = FirstChild<wxStaticText>(&dialog);
         EXPECT_EQ(text, heading->GetLabelText());
         wxColour back = wxSystemSettings::GetColour(wxSYS_COLOUR_BTNFACE);
-        Colour shown = Panel_TextColour(colour, {back.Red(), back.Green(), back.Blue()},
-                                        wxSystemSettings::GetAppearance().IsUsingDarkBackground());
+        Colour shown = Colour_ForText(colour, {back.Red(), back.Green(), back.Blue()},
+                                      wxSystemSettings::GetAppearance().IsUsingDarkBackground());
         EXPECT_EQ(wxColour(shown.red, shown.green, shown.blue), heading->GetForegroundColour());
     }
 };

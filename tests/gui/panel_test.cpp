@@ -13,9 +13,9 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
-#include "app/Ids.h"
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
+#include "ui/Ids.h"
 #include "ui/QListBox.h"
 
 static const char OneEntry[] = "@book{one, title = {First}}\n";

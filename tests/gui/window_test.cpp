@@ -18,10 +18,10 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
-#include "app/Ids.h"
 #include "base/Companion.h"
 #include "base/Sys.h"
 #include "ui/Cartulo.h"
+#include "ui/Ids.h"
 #include "ui/Messages.h"
 #include "ui/PanelRules.h"
 #include "ui/QListBox.h"
@@ -725,7 +725,7 @@ static void CheckTexts(wxWindow *window)
     for (wxWindow *child : window->GetChildren()) {
         if (wxStaticText *text = dynamic_cast<wxStaticText *>(child)) {
             EXPECT_GE(
-                Panel_Contrast(Of(text->GetForegroundColour()), Of(text->GetBackgroundColour())),
+                Colour_Contrast(Of(text->GetForegroundColour()), Of(text->GetBackgroundColour())),
                 4.5)
                 << text->GetLabelText();
         }
@@ -744,5 +744,5 @@ TEST_F(Window, HasReadableColours)
     Cartulo_Messages messages(frame, Panel()->Files());
     CheckTexts(&messages);
     auto colour = [](wxSystemColour index) { return Of(wxSystemSettings::GetColour(index)); };
-    EXPECT_GE(Panel_Contrast(colour(wxSYS_COLOUR_LISTBOXTEXT), colour(wxSYS_COLOUR_LISTBOX)), 4.5);
+    EXPECT_GE(Colour_Contrast(colour(wxSYS_COLOUR_LISTBOXTEXT), colour(wxSYS_COLOUR_LISTBOX)), 4.5);
 }

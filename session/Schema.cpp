@@ -1,4 +1,4 @@
-#include "ui/Schema.h"
+#include "session/Schema.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -104,7 +104,7 @@ FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key)
     }
 }
 
-Colour Schema_FieldColour(FieldClass fieldClass)
+Colour Colour_OfField(FieldClass fieldClass)
 {
     switch (fieldClass) {
     case FIELD_CROSSREF:

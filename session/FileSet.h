@@ -1,4 +1,4 @@
-// store/BibFileSet.h - the open files of a run: find, lock, count, save all.
+// session/FileSet.h - the open files of a run: find, lock, count, save all.
 // The set owns its records; a record that is listed twice is closed and freed once.
 #pragma once
 

@@ -1,9 +1,9 @@
-// ui/MessagesText.h - what the loading-messages window says.
+// session/MessagesText.h - what the loading-messages window says.
 #pragma once
 
 #include <string>
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 
 enum MessagesVerdict { MESSAGES_NONE, MESSAGES_WARNINGS, MESSAGES_ERRORS };
 

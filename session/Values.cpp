@@ -1,4 +1,4 @@
-#include "ui/Values.h"
+#include "session/Values.h"
 
 #include <algorithm>
 #include <cstring>

@@ -1,4 +1,4 @@
-// app/Native.h - what only the window system can answer. See Native-gtk.cpp.
+// ui/Native.h - what only the window system can answer. See Native-gtk.cpp.
 #pragma once
 
 #include <wx/event.h>

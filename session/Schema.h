@@ -1,4 +1,4 @@
-// ui/Schema.h - the INI file that describes the entry types and their fields.
+// session/Schema.h - the INI file that describes the entry types and their fields.
 //
 // The program's own name and one section for each entry type; sections whose names begin with '*'
 // hold other things. Read afresh at each use: what the user changes in it counts at once.
@@ -36,7 +36,7 @@ enum FieldClass {
     FIELD_OPTIONAL
 };
 FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key);
-Colour Schema_FieldColour(FieldClass fieldClass); // of its label, on a light background
+Colour Colour_OfField(FieldClass fieldClass); // of its label, on a light background
 
 // "Custom Entry Type" for a type without a section or description.
 std::string Schema_Description(const char *ini, const char *type);

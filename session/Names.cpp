@@ -1,11 +1,11 @@
-#include "ui/Keys.h"
+#include "session/Names.h"
 
 #include <algorithm>
 #include <cwchar>
 
 #include "encoding/Encoding.h"
+#include "session/Values.h"
 #include "store/BibStore.h"
-#include "ui/Values.h"
 
 static bool Fits(wchar_t c, const EncodingRecord *encoding)
 {
@@ -13,7 +13,7 @@ static bool Fits(wchar_t c, const EncodingRecord *encoding)
     return c <= 32 || (Enc_Holds(c, encoding) && !isMark);
 }
 
-TypedKey Key_Read(const wchar_t *typed, const EncodingRecord *encoding)
+TypedName Name_Read(const wchar_t *typed, const EncodingRecord *encoding)
 {
     std::string text = Value_Read(typed, encoding);
     text.erase(std::remove_if(text.begin(), text.end(), [](unsigned char c) { return c <= 32; }),
@@ -23,7 +23,7 @@ TypedKey Key_Read(const wchar_t *typed, const EncodingRecord *encoding)
     return {text, fits, encoding};
 }
 
-std::string Key_MisfitText(const TypedKey &key)
+std::string Name_MisfitText(const TypedName &key)
 {
     if (key.encoding == &EncodingUtf8)
         return "The key includes guillemets, which mark abbreviations.";
@@ -31,7 +31,7 @@ std::string Key_MisfitText(const TypedKey &key)
            Enc_Label(key.encoding) + ".";
 }
 
-NameVerdict Name_Check(const TypedKey &name)
+NameVerdict Name_Check(const TypedName &name)
 {
     if (name.text.empty())
         return NAME_EMPTY;

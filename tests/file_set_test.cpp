@@ -1,4 +1,4 @@
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

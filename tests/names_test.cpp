@@ -1,11 +1,11 @@
 #include <gtest/gtest.h>
 
 #include "encoding/Encoding.h"
-#include "ui/Keys.h"
+#include "session/Names.h"
 
-static TypedKey Read(const wchar_t *typed)
+static TypedName Read(const wchar_t *typed)
 {
-    return Key_Read(typed, Enc_Current());
+    return Name_Read(typed, Enc_Current());
 }
 
 TEST(KeyRead, LosesBlanksAndControlCharacters)
@@ -30,22 +30,22 @@ TEST(KeyRead, TellsWhatTheCodePageLacks)
     EXPECT_FALSE(Read(L"\u0141ukasz").fits);
     EXPECT_FALSE(Read(L"a\U0001F600").fits);
     EXPECT_EQ("The key includes characters that can't be stored in CP1252.",
-              Key_MisfitText(Read(L"")));
+              Name_MisfitText(Read(L"")));
     Enc_Select("CP1250");
     EXPECT_TRUE(Read(L"\u0141ukasz").fits);
     EXPECT_FALSE(Read(L"\u00FF").fits);
     EXPECT_EQ("The key includes characters that can't be stored in CP1250.",
-              Key_MisfitText(Read(L"")));
+              Name_MisfitText(Read(L"")));
 }
 
 TEST(KeyRead, FitsInUtf8WhateverItIs)
 {
-    TypedKey key = Key_Read(L"\u0141ukasz \U0001F600", &EncodingUtf8);
+    TypedName key = Name_Read(L"\u0141ukasz \U0001F600", &EncodingUtf8);
     EXPECT_EQ("\xC5\x81ukasz\xF0\x9F\x98\x80", key.text);
     EXPECT_TRUE(key.fits);
     EXPECT_EQ(&EncodingUtf8, key.encoding);
-    EXPECT_FALSE(Key_Read(L"a\u00AB", &EncodingUtf8).fits);
-    EXPECT_EQ("The key includes guillemets, which mark abbreviations.", Key_MisfitText(key));
+    EXPECT_FALSE(Name_Read(L"a\u00AB", &EncodingUtf8).fits);
+    EXPECT_EQ("The key includes guillemets, which mark abbreviations.", Name_MisfitText(key));
 }
 
 TEST(KeyRead, TellsOfGuillemets)

@@ -1,4 +1,5 @@
-// ui/Values.h - what users type for a value: of a field, an abbreviation, a preamble, a search.
+// session/Values.h - what users type for a value: of a field, an abbreviation, a preamble, a
+// search.
 #pragma once
 
 #include <string>

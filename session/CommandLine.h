@@ -1,4 +1,4 @@
-// app/CommandLine.h - the command line: tokens, options, file names, and the set of open files.
+// session/CommandLine.h - the command line: tokens, options, file names, and the set of open files.
 //
 // A command line replaces the set of open files: files that it names again stay as they are, new
 // ones are loaded, the others are saved when modified and closed.
@@ -6,7 +6,7 @@
 
 #include <string>
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 
 enum { COMMAND_LINE_SIZE = 1024, BASE_FOLDER_SIZE = 256, TOKEN_SIZE = 512 };
 

@@ -1,4 +1,4 @@
-#include "app/Native.h"
+#include "ui/Native.h"
 
 #include <cstring>
 

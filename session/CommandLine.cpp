@@ -1,5 +1,5 @@
-// app/CommandLine.cpp - carries out command lines: tokens, options, file names.
-#include "app/CommandLine.h"
+// session/CommandLine.cpp - carries out command lines: tokens, options, file names.
+#include "session/CommandLine.h"
 
 #include <algorithm>
 #include <cstdlib>

@@ -1,4 +1,4 @@
-// app/Ids.h - command identifiers, shared by the tool bar, the keyboard table and the panel.
+// ui/Ids.h - command identifiers, shared by the tool bar, the keyboard table and the panel.
 #pragma once
 
 enum {

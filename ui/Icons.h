@@ -1,4 +1,4 @@
-// app/Icons.h - pictures of the tools and of the program, and buttons that show them.
+// ui/Icons.h - pictures of the tools and of the program, and buttons that show them.
 #pragma once
 
 #include <wx/artprov.h>

@@ -1,4 +1,4 @@
-#include "ui/EntryRules.h"
+#include "session/EntryRules.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -67,7 +67,7 @@ static int HasKey(const BibFile *file, const char *key)
     return 0;
 }
 
-static KeyVerdict CheckForm(const TypedKey &key)
+static KeyVerdict CheckForm(const TypedName &key)
 {
     if (key.text.empty())
         return KEY_EMPTY;
@@ -96,7 +96,7 @@ static KeyVerdict CheckFree(const BibFileSet *set, const BibFile *file, const ch
     return KEY_OK;
 }
 
-KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const TypedKey &key)
+KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const TypedName &key)
 {
     KeyVerdict form = CheckForm(key);
     if (form != KEY_OK)
@@ -106,7 +106,7 @@ KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const
 
 // An old key that could not be written may stay: that changes nothing.
 KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const BibEntry *entry,
-                             const TypedKey &key)
+                             const TypedName &key)
 {
     KeyVerdict form = CheckForm(key);
     if (form != KEY_OK && form != KEY_UNWRITABLE)

@@ -1,12 +1,13 @@
-// ui/EntryRules.h - what may be added, renamed and removed, and what that changes in the store.
+// session/EntryRules.h - what may be added, renamed and removed, and what that changes in the
+// store.
 #pragma once
 
 #include <string>
 #include <vector>
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
+#include "session/Names.h"
 #include "ui/EntryIndex.h"
-#include "ui/Keys.h"
 
 // --- Where a new entry may go ---
 
@@ -27,7 +28,7 @@ bool Entry_MayBeParent(const BibFile *file, const BibEntry *entry);
 enum KeyVerdict {
     KEY_OK,
     KEY_EMPTY,
-    KEY_MISFIT,         // see Key_MisfitText; first, as a stripped key takes the typed one's place
+    KEY_MISFIT,         // see Name_MisfitText; first, as a stripped key takes the typed one's place
     KEY_BAD_CHARS,      // holds characters that no key may hold; Bib_StripKeyChars removes them
     KEY_UNWRITABLE,     // the parser would not read it back
     KEY_NO_FILE,        // nowhere to put it
@@ -36,9 +37,9 @@ enum KeyVerdict {
     KEY_TAKEN_ELSEWHERE // by an entry of another file: the user may want that
 };
 
-KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const TypedKey &key);
+KeyVerdict Entry_CheckNewKey(const BibFileSet *set, const BibFile *target, const TypedName &key);
 KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const BibEntry *entry,
-                             const TypedKey &key);
+                             const TypedName &key);
 
 // --- Types ---
 

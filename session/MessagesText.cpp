@@ -1,7 +1,7 @@
-#include "ui/MessagesText.h"
+#include "session/MessagesText.h"
 
 #include "encoding/Encoding.h"
-#include "ui/Values.h"
+#include "session/Values.h"
 
 static int HasLoadErrors(const BibFileSet *set)
 {

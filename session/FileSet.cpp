@@ -1,6 +1,6 @@
-// store/BibFileSet.cpp - the open files of a run.
+// session/FileSet.cpp - the open files of a run.
 
-#include "store/BibFileSet.h"
+#include "session/FileSet.h"
 
 #include <cstdarg>
 #include <cstdlib>
