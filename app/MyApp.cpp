@@ -141,6 +141,11 @@ static char *FindBib(const char *name)
     return TNSearch("bib", name);
 }
 
+static int HandToService(const char *service, const char *text)
+{
+    return SendCommand(service, text);
+}
+
 static void LogControl(const char *word)
 {
     const char *answer = TNSFind(word);
@@ -170,6 +175,7 @@ bool MyApp::OnInit()
     AppLog("Cartulo::OnInit --- ", "Frame ...");
     strcpy(m_state.baseFolder, m_start.baseFolder.c_str());
     m_state.findBib = FindBib;
+    m_state.sendCommand = HandToService;
     m_frame = new MyFrame("Quarlo Cartulo", m_start.commandLine, &m_state);
     Publish(Native_WindowHandle(m_frame));
     m_frame->Show();

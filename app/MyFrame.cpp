@@ -13,11 +13,13 @@
 #include <wx/utils.h>
 
 #include "app/AboutDlg.h"
+#include "app/FrameRules.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "base/Sys.h"
 #include "session/MessagesText.h"
 #include "ui/Cartulo.h"
+#include "ui/Commands.h"
 #include "ui/Icons.h"
 #include "ui/Ids.h"
 #include "ui/Messages.h"
@@ -206,37 +208,40 @@ static int ToolIconSize()
     return size;
 }
 
-void MyFrame::AddTool(int id, const char *label, const char *icon, const char *tip)
+void MyFrame::AddTool(const Command &command)
 {
+    const CommandTool &tool = command.tool;
     wxToolBar *bar = GetToolBar();
-    bar->AddTool(id, label, Icon_Load(icon, bar->GetToolBitmapSize().x), tip);
+    bar->AddTool(command.id, tool.label, Icon_Load(tool.icon, bar->GetToolBitmapSize().x),
+                 tool.tip);
 }
 
+void MyFrame::AddSearch(const Command &command)
+{
+    wxToolBar *bar = GetToolBar();
+    m_search = new wxSearchCtrl(bar, command.id, "", wxDefaultPosition,
+                                FromDIP(wxSize(SEARCH_WIDTH, -1)), wxTE_PROCESS_ENTER);
+    m_search->SetDescriptiveText("Find");
+    m_search->SetToolTip(command.tool.tip);
+    bar->AddControl(m_search, command.tool.label);
+}
+
+// Messages have a tool only where there are some when the window opens.
 void MyFrame::CreateTools()
 {
     wxToolBar *bar = CreateToolBar();
     int size = ToolIconSize();
     bar->SetToolBitmapSize(wxSize(size, size));
     bar->SetMargins(TOOL_MARGIN, TOOL_MARGIN);
-    AddTool(ID_SAVE, "Save", "document-save", "Save All BIB files.");
-    AddTool(ID_STRINGS, "Strings", "script-edit", "Edit/Insert Strings [Abbreviations] (Alt+S)");
-    AddTool(ID_PREAMBLE, "Preambles", "accessories-text-editor", "Edit Preamble (Alt+P)");
-    AddTool(ID_CITE, "\\cite", "insert-tex-cite",
-            "Inserts `\\cite' command into the currently edited (La)TeX file (ENTER)");
-    AddTool(ID_NEW_ENTRY, "New", "list-add", "Add new Bibliography entry (Alt+A)");
-    AddTool(ID_RENAME_ENTRY, "Rename", "list-rename", "Rename currently selected entry (Alt+N)");
-    AddTool(ID_REMOVE_ENTRY, "Delete", "list-remove", "Remove currently selected entry (Alt+D)");
-    AddTool(ID_EDIT_ENTRY, "Edit", "list-edit", "Edit currently selected entry (Alt+E,ESC,TAB)");
-    if (Messages_HasCounts(m_panel->Files()))
-        AddTool(ID_MESSAGES, "Messages", "Warning",
-                "Show error/warning messages of loading current BIB-file (Alt+M)");
-    m_search = new wxSearchCtrl(bar, ID_SEARCH, "", wxDefaultPosition,
-                                FromDIP(wxSize(SEARCH_WIDTH, -1)), wxTE_PROCESS_ENTER);
-    m_search->SetDescriptiveText("Find");
-    m_search->SetToolTip("Enter string to find entries");
-    bar->AddControl(m_search, "Find");
-    AddTool(ID_HELP, "Help", "help-contents", "Help on using Cartulo");
-    AddTool(ID_ABOUT, "About", "help-about", "About Cartulo");
+    const bool hasMessages = Messages_HasCounts(m_panel->Files());
+    for (const Command *command = Commands; command < Commands + CommandCount; ++command) {
+        if (!command->tool.label || (command->id == ID_MESSAGES && !hasMessages))
+            continue;
+        if (command->id == ID_SEARCH)
+            AddSearch(*command);
+        else
+            AddTool(*command);
+    }
     bar->Realize();
     m_toolsWidth = bar->GetBestSize().x - m_search->GetSize().x;
     FitSearch();
@@ -365,7 +370,7 @@ static int KeyOf(const wxKeyEvent &event)
     case WXK_NUMPAD_ENTER:
         return WXK_RETURN;
     case WXK_F1:
-        return FRAME_KEY_F1;
+        return COMMAND_KEY_F1;
     default:
         return event.GetKeyCode();
     }
@@ -394,17 +399,15 @@ void MyFrame::OnCharHook(wxKeyEvent &event)
         event.Skip();
         return;
     }
-    int id = 0;
-    key = Frame_ShortcutKey(key, event.GetUnicodeKey(), Native_LatinLetter(event), alt, ctrl);
-    const Shortcut *row =
-        m_panel ? Frame_FindShortcut(key, alt, ctrl, m_panel->InEditMode(), &id) : nullptr;
-    if (!row) {
+    key = Command_Key(key, event.GetUnicodeKey(), Native_LatinLetter(event), alt, ctrl);
+    const Command *found = m_panel ? Command_Find(key, alt, ctrl, m_panel->InEditMode()) : nullptr;
+    if (!found) {
         event.Skip();
         return;
     }
-    TNSMessage("INFO: MyFrame::OnCharHook ", row->label, TNS_LIFECYCLE);
+    TNSMessage("INFO: MyFrame::OnCharHook ", found->keyLabel, TNS_LIFECYCLE);
     // Not queued: what is typed next is for the new mode, or for the dialog.
-    wxCommandEvent command(wxEVT_MENU, id);
+    wxCommandEvent command(wxEVT_MENU, found->id);
     m_panel->GetEventHandler()->ProcessEvent(command);
 }
 

@@ -7,11 +7,11 @@
 #include <wx/frame.h>
 #include <wx/timer.h>
 
-#include "app/FrameRules.h"
 #include "session/CommandLine.h"
 
 class Cartulo;
 class DialogCount;
+struct Command;
 class wxMenu;
 class wxSearchCtrl;
 
@@ -51,7 +51,8 @@ private:
     void SaveGeometry();
     void CreateTools();
     void CreateStatusFields();
-    void AddTool(int id, const char *label, const char *icon, const char *tip);
+    void AddTool(const Command &command);
+    void AddSearch(const Command &command);
     void UpdateCiteTool();
     void FitSearch();
     void OnQuit(wxCommandEvent &event);

@@ -42,3 +42,10 @@ void AppLog(const char *first, const char *second)
     line[length] = 0;
     TNSMessage("Cartulo: ", line, LevelOf(line));
 }
+
+uint32_t Log_Character(uint32_t character)
+{
+    bool isControl = character < ' ' || (character >= 0x7F && character < 0xA0);
+    bool isSurrogate = character >= 0xD800 && character <= 0xDFFF;
+    return isControl || isSurrogate ? ' ' : character;
+}

@@ -287,6 +287,17 @@ int Enc_IsUtf8(const char *text, size_t length)
     return Enc_Utf8Length(text, length) == length;
 }
 
+std::string Enc_CutTo(size_t size, std::string text)
+{
+    if (text.size() < size)
+        return text;
+    text.resize(size);
+    size_t valid = Enc_Utf8Length(text.data(), size);
+    if (size - valid < ENC_LONGEST)
+        text.resize(valid);
+    return text;
+}
+
 // Neither other letters nor marks: most values are like that.
 static bool IsPlain(const char *text)
 {

@@ -83,6 +83,10 @@ std::string Enc_Recode(const char *text, const EncodingRecord *from, const Encod
 size_t Enc_Utf8Length(const char *text, size_t length);
 int Enc_IsUtf8(const char *text, size_t length); // 1 when all of it is
 
+// A text that is, or may have been, cut to `size` bytes to fit, is cut to them: not in the middle
+// of a character.
+std::string Enc_CutTo(size_t size, std::string text);
+
 // One character as UTF-8; what is none becomes U+FFFD. Returns the count of bytes.
 size_t Enc_PutUtf8(char *out, uint32_t character);
 

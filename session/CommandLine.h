@@ -18,6 +18,9 @@ struct CommandState {
     char companionService[BASE_FOLDER_SIZE + 1]; // -w; "" for none
     // Answers TNSearch("bib", ...): malloc'd path or null. Null: nothing more is found.
     char *(*findBib)(const char *name);
+    // Hands a command line to a service, like that of the companion: 1, or 0 when nobody took it.
+    // Null: nobody is there.
+    int (*sendCommand)(const char *service, const char *text);
 };
 
 struct CommandResult {

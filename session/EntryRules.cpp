@@ -241,15 +241,3 @@ int Entry_Remove(BibFile *file, BibEntry *entry)
     Bib_FreeEntry(entry);
     return 1;
 }
-
-// A file that is listed twice has two rows for each entry.
-BibEntry *Entry_NextInList(const IndexItem *index, int count, int row)
-{
-    for (int i = row + 1; i < count; ++i)
-        if (index[i].entry != index[row].entry)
-            return index[i].entry;
-    for (int i = row - 1; i >= 0; --i)
-        if (index[i].entry != index[row].entry)
-            return index[i].entry;
-    return nullptr;
-}

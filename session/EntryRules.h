@@ -7,7 +7,6 @@
 
 #include "session/FileSet.h"
 #include "session/Names.h"
-#include "ui/EntryIndex.h"
 
 // --- Where a new entry may go ---
 
@@ -79,7 +78,3 @@ std::string Entry_Referrers(const BibFile *file, const BibEntry *entry);
 
 // Unlinks and frees the entry. Returns 0, logged, when it is not of that file.
 int Entry_Remove(BibFile *file, BibEntry *entry);
-
-// The entry to select when that of `row` is gone: the one after it in the list, else the one
-// before it; null for none.
-BibEntry *Entry_NextInList(const IndexItem *index, int count, int row);

@@ -251,24 +251,11 @@ int FileSet_SaveAll(BibFileSet *set)
     return modified > 0 && failed == 0;
 }
 
-static std::string ModifiedPaths(const BibFileSet *set)
+std::string FileSet_ModifiedPaths(const BibFileSet *set)
 {
     std::string text;
     for (int i = 0; i < set->count; ++i)
         if (IsModified(set, i))
             text += std::string(set->files[i]->path) + "\n";
     return text;
-}
-
-char *FileSet_ModifiedPaths(const BibFileSet *set)
-{
-    std::string text = ModifiedPaths(set);
-    return Bib_CopyText(text.c_str(), text.size());
-}
-
-char *FileSet_SaveQuestion(const BibFileSet *set)
-{
-    std::string text =
-        "There are modified Bib-files:\n\n" + ModifiedPaths(set) + "\nDo you want to save them ?";
-    return Bib_CopyText(text.c_str(), text.size());
 }

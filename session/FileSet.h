@@ -2,6 +2,8 @@
 // The set owns its records; a record that is listed twice is closed and freed once.
 #pragma once
 
+#include <string>
+
 #include "store/BibStore.h"
 
 struct BibFileSet {
@@ -48,8 +50,5 @@ int FileSet_SaveLast(BibFileSet *set, BibFile *file);
 // 0 when nothing was modified or a write failed, 1 when all were saved.
 int FileSet_SaveAll(BibFileSet *set);
 
-// The paths of the files with unsaved changes, one a line; malloc'd.
-char *FileSet_ModifiedPaths(const BibFileSet *set);
-
-// "There are modified Bib-files: ..." for the question before saving; malloc'd.
-char *FileSet_SaveQuestion(const BibFileSet *set);
+// The paths of the files with unsaved changes, one a line.
+std::string FileSet_ModifiedPaths(const BibFileSet *set);

@@ -104,38 +104,11 @@ FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key)
     }
 }
 
-Colour Colour_OfField(FieldClass fieldClass)
-{
-    switch (fieldClass) {
-    case FIELD_CROSSREF:
-        return {128, 0, 0};
-    case FIELD_UNKNOWN:
-        return {0, 128, 0};
-    case FIELD_MANDATORY:
-        return {0, 0, 128};
-    case FIELD_OPTIONAL:
-        break;
-    }
-    return {0, 0, 255};
-}
-
-// A text that is, or may have been, cut off to fit: not in the middle of a character.
-static std::string CutTo(size_t size, std::string text)
-{
-    if (text.size() < size)
-        return text;
-    text.resize(size);
-    size_t valid = Enc_Utf8Length(text.data(), size);
-    if (size - valid < ENC_LONGEST)
-        text.resize(valid);
-    return text;
-}
-
 std::string Schema_Description(const char *ini, const char *type)
 {
     char description[HELP_SIZE];
     Profile_GetString(type, "*", "Custom Entry Type", description, sizeof description, ini);
-    return CutTo(HELP_SIZE - 1, description);
+    return Enc_CutTo(HELP_SIZE - 1, description);
 }
 
 void Schema_FieldSpecs(const char *ini, const char *type, char *buffer, size_t size)
@@ -235,37 +208,4 @@ SchemaAdvice Schema_Advise(const char *ini, const char *type, const std::vector<
             AdviseField(&advice, &missing, spec, rows);
     advice.note = Note(missing);
     return advice;
-}
-
-// --- Help ---
-
-static const char ListHelp[] =
-    "<Entry List> Mode Accelerators:\n"
-    "\tAlt+E\tEdit an Entry (also ESC) - comes to <Entry Editing> mode,\n"
-    "\tAlt+A\tAdd New Entry\n"
-    "\tAlt+D\tDelete an Entry\n"
-    "\tAlt+N\tRename an Entry\n"
-    "\tAlt+S\tEdit Strings\n"
-    "\tAlt+P\tEdit Preamble\n"
-    "\tAlt+B\tSave Modified BIB files\n"
-    "\tEnter\tInsert proper \\cite command into your document.";
-
-static const char EditHelp[] =
-    "<Entry Editing> mode Accelerators:\n"
-    "\tESC\tReturn to <Entry List> mode.\n"
-    "\tAlt+E\tEdits currently selected field in large window.\n"
-    "\tAlt+A\tAdd new Field with key name specified in bottom combo box.\n"
-    "\tAlt+D\tDelete currently selected field.\n"
-    "\tAlt+N\tRename currently selected field (change field key).\n"
-    "\tAlt+S\tEdit Strings. It is useful to insert into a field reference on string.\n"
-    "\tAlt+P\tEdit Preamble.\n"
-    "\tEnter\tInsert proper \\cite command into your document.\n";
-
-std::string Schema_HelpText(const char *ini, const char *type, bool editMode)
-{
-    if (!editMode)
-        return ListHelp;
-    std::string text = EditHelp;
-    text.append("`").append(type).append("' entry is for ").append(Schema_Description(ini, type));
-    return CutTo(HELP_SIZE - 1, text);
 }

@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "ui/PanelRules.h"
+#include "session/FileSet.h"
 
 // "/usr/bin/cartulo" gives "/usr/bin/cartulo.ini": the ending of the file name is replaced.
 std::string Schema_IniPath(const char *modulePath);
@@ -36,7 +36,6 @@ enum FieldClass {
     FIELD_OPTIONAL
 };
 FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key);
-Colour Colour_OfField(FieldClass fieldClass); // of its label, on a light background
 
 // "Custom Entry Type" for a type without a section or description.
 std::string Schema_Description(const char *ini, const char *type);
@@ -58,6 +57,3 @@ struct SchemaAdvice {
     std::string note;                   // "There is missed mandatory field: ...", or ""
 };
 SchemaAdvice Schema_Advise(const char *ini, const char *type, const std::vector<SchemaRow> &rows);
-
-// The help text of the entry pane (store text).
-std::string Schema_HelpText(const char *ini, const char *type, bool editMode);

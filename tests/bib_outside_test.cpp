@@ -13,11 +13,11 @@
 #include "encoding/Encoding.h"
 #include "session/EntryRules.h"
 #include "session/FileSet.h"
+#include "session/KnownStrings.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/TempFolder.h"
 #include "ui/FieldGrid.h"
 #include "ui/PreambleText.h"
-#include "ui/StringSources.h"
 
 using testing::HasSubstr;
 

@@ -21,6 +21,7 @@
 #include "tests/support/LoadText.h"
 #include "tests/support/LogCapture.h"
 #include "tests/support/TempFolder.h"
+#include "ui/Commands.h"
 
 namespace
 {
@@ -330,7 +331,7 @@ TEST(DefaultIni, DescribesEveryTypeInALine)
         EXPECT_NE("Custom Entry Type", description) << type;
         EXPECT_EQ('.', description.back()) << type;
         EXPECT_GE(100u, description.size()) << type;
-        string help = Schema_HelpText(Ini, type.c_str(), true);
+        string help = Command_HelpText(Ini, type.c_str(), true);
         string end = "' entry is for " + description;
         ASSERT_LE(end.size(), help.size());
         EXPECT_EQ(end, help.substr(help.size() - end.size())) << "cut";

@@ -529,3 +529,22 @@ TEST_F(TypeAheadKey, IgnoresTheCaseOfAllLettersInUtf8)
     EXPECT_EQ(TYPE_AHEAD_NO_ROW, Press(0xF6)); // the other file is in a code page
     EXPECT_EQ(TYPE_AHEAD_ROW, Press(0xD6));
 }
+
+TEST(EntryIndexNext, IsTheOneBehindOrElseTheOneBefore)
+{
+    BibEntry a = {}, b = {}, c = {};
+    const IndexItem index[] = {{&a, 0}, {&b, 0}, {&c, 0}};
+    EXPECT_EQ(&b, EntryIndex_Next(index, 3, 0));
+    EXPECT_EQ(&c, EntryIndex_Next(index, 3, 1));
+    EXPECT_EQ(&b, EntryIndex_Next(index, 3, 2));
+    EXPECT_EQ(nullptr, EntryIndex_Next(index, 1, 0));
+}
+
+TEST(EntryIndexNext, IsNotTheSameEntryInItsOtherRow)
+{
+    BibEntry a = {}, b = {};
+    const IndexItem index[] = {{&a, 0}, {&a, 1}, {&b, 0}, {&b, 1}};
+    EXPECT_EQ(&b, EntryIndex_Next(index, 4, 0));
+    EXPECT_EQ(&a, EntryIndex_Next(index, 4, 2));
+    EXPECT_EQ(nullptr, EntryIndex_Next(index, 2, 0));
+}

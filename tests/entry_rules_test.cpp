@@ -378,25 +378,6 @@ TEST_F(RemovedEntry, HasToBeOfTheFile)
     EXPECT_EQ("Ost77 ", Keys(other));
 }
 
-TEST_F(RemovedEntry, LeavesTheSelectionToTheNextOrThePrevious)
-{
-    BibEntry a = {}, b = {}, c = {};
-    const IndexItem index[] = {{&a, 0}, {&b, 0}, {&c, 0}};
-    EXPECT_EQ(&b, Entry_NextInList(index, 3, 0));
-    EXPECT_EQ(&c, Entry_NextInList(index, 3, 1));
-    EXPECT_EQ(&b, Entry_NextInList(index, 3, 2));
-    EXPECT_EQ(nullptr, Entry_NextInList(index, 1, 0));
-}
-
-TEST_F(RemovedEntry, IsNotSelectedAgainByItsOtherRow)
-{
-    BibEntry a = {}, b = {};
-    const IndexItem index[] = {{&a, 0}, {&a, 1}, {&b, 0}, {&b, 1}};
-    EXPECT_EQ(&b, Entry_NextInList(index, 4, 0));
-    EXPECT_EQ(&a, Entry_NextInList(index, 4, 2));
-    EXPECT_EQ(nullptr, Entry_NextInList(index, 2, 0));
-}
-
 // --- Files in several encodings ---
 
 TEST_F(EntryKeys, AreComparedAcrossEncodings)

@@ -14,9 +14,9 @@
 #include <sys/resource.h>
 
 #include "encoding/Encoding.h"
+#include "session/KnownStrings.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/TempFolder.h"
-#include "ui/StringSources.h"
 
 using testing::ElementsAre;
 using testing::IsEmpty;
@@ -801,4 +801,20 @@ TEST(GridCommitTable, HasEveryPartOfEachCase)
         EXPECT_FALSE(one.commit.empty()) << one.title;
         EXPECT_NE("", one.saved) << one.title;
     }
+}
+
+TEST(GridCheckNewName, LooksAtTheValuesThatAreShown)
+{
+    FieldGrid grid = {};
+    grid.count = 2;
+    grid.encoding = Enc_Current();
+    grid.rows[0].key = "note";
+    grid.rows[0].text = L"Title";
+    grid.rows[1].key = "year";
+    grid.rows[1].text = L"1999";
+    EXPECT_EQ(NAME_TAKEN, Grid_CheckNewName(&grid, {"title", true}));
+    EXPECT_EQ(NAME_OK, Grid_CheckNewName(&grid, {"year", true}));
+    EXPECT_EQ(NAME_UNWRITABLE, Grid_CheckNewName(&grid, {"1999", true}));
+    EXPECT_EQ(NAME_EMPTY, Grid_CheckNewName(&grid, {"", true}));
+    EXPECT_EQ(NAME_BAD_CHARS, Grid_CheckNewName(&grid, {"ti{tle", true}));
 }

@@ -1,4 +1,5 @@
 #include "session/FileSet.h"
+#include "ui/PanelRules.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
@@ -72,13 +73,7 @@ struct FileSet : testing::Test {
         return set.files[set.count - 1];
     }
     std::string LoadErrors() const { return set.loadErrors ? set.loadErrors : ""; }
-    std::string Question() const
-    {
-        char *text = FileSet_SaveQuestion(&set);
-        std::string question = text;
-        free(text);
-        return question;
-    }
+    std::string Question() const { return Panel_SaveQuestion(&set); }
 
     // A record that a save fails for, without a message box.
     BibFile *AddUnsavable()
@@ -494,9 +489,7 @@ TEST_F(FileSet, ListsEachModifiedFileOnce)
     Open("c.bib", Good);
     FileSet_Append(&set, a);
     a->modified = b->modified = 1;
-    char *paths = FileSet_ModifiedPaths(&set);
-    EXPECT_EQ(std::string(a->path) + "\n" + b->path + "\n", paths);
-    free(paths);
+    EXPECT_EQ(std::string(a->path) + "\n" + b->path + "\n", FileSet_ModifiedPaths(&set));
 }
 
 } // namespace

@@ -269,3 +269,11 @@ TEST_F(LogFile, GetsLongLinesInOneWrite)
         ASSERT_TRUE(line == std::string(9000, 'a') || line == std::string(9000, 'b'));
     EXPECT_EQ(400, count);
 }
+
+TEST(LogCharacter, IsABlankForWhatCannotBeShown)
+{
+    for (uint32_t c : {0x0, 0x1, 0x9, 0xD, 0x1B, 0x1F, 0x7F, 0x80, 0x9F, 0xD800, 0xDFFF})
+        EXPECT_EQ(uint32_t(' '), Log_Character(c)) << c;
+    for (uint32_t c : {0x20, 0x41, 0x7E, 0xA0, 0xFC, 0x44C, 0xD7FF, 0xE000, 0xFFFD})
+        EXPECT_EQ(c, Log_Character(c));
+}

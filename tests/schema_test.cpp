@@ -92,9 +92,6 @@ TEST_F(SchemaFile, CutsNoLetterInTwo)
         std::string text = Schema_Description(ini.c_str(), "misc");
         EXPECT_TRUE(Enc_IsUtf8(text.data(), text.size()));
         EXPECT_EQ(1022u + start.size(), text.size());
-        text = Schema_HelpText(ini.c_str(), "misc", true);
-        EXPECT_TRUE(Enc_IsUtf8(text.data(), text.size()));
-        EXPECT_LE(1022u, text.size());
     }
 }
 
@@ -190,22 +187,6 @@ TEST_F(SchemaFieldClass, CountsAtOnceWhenTheFileChanges)
     EXPECT_EQ(FIELD_UNKNOWN, Of("note"));
     folder.Write("a.ini", "[article]\nnote=\n");
     EXPECT_EQ(FIELD_OPTIONAL, Of("note"));
-}
-
-TEST(SchemaFieldColour, TellsTheClassesApart)
-{
-    struct {
-        FieldClass fieldClass;
-        int red, green, blue;
-    } const cases[] = {{FIELD_CROSSREF, 128, 0, 0},
-                       {FIELD_UNKNOWN, 0, 128, 0},
-                       {FIELD_MANDATORY, 0, 0, 128},
-                       {FIELD_OPTIONAL, 0, 0, 255}};
-    for (const auto &c : cases) {
-        Colour colour = Colour_OfField(c.fieldClass);
-        EXPECT_THAT((std::vector<int>{colour.red, colour.green, colour.blue}),
-                    ElementsAre(c.red, c.green, c.blue));
-    }
 }
 
 TEST_F(SchemaFile, DescribesTypes)
@@ -392,49 +373,4 @@ TEST_F(SchemaAdvise, EndsWhereTheSectionIsCut)
     filler.insert(4, 2, 'x'); // no room for the sign
     Write(filler + "volume=\ntitle=*\npublisher=*editor\nyear=*\n");
     EXPECT_THAT(Of({}).proposals, ElementsAre("volume", "title"));
-}
-
-// --- Help ---
-
-TEST_F(SchemaFile, HelpsWithTheList)
-{
-    std::string ini = folder.Write("a.ini", Types);
-    EXPECT_EQ("<Entry List> Mode Accelerators:\n"
-              "\tAlt+E\tEdit an Entry (also ESC) - comes to <Entry Editing> mode,\n"
-              "\tAlt+A\tAdd New Entry\n"
-              "\tAlt+D\tDelete an Entry\n"
-              "\tAlt+N\tRename an Entry\n"
-              "\tAlt+S\tEdit Strings\n"
-              "\tAlt+P\tEdit Preamble\n"
-              "\tAlt+B\tSave Modified BIB files\n"
-              "\tEnter\tInsert proper \\cite command into your document.",
-              Schema_HelpText(ini.c_str(), "article", false));
-}
-
-static const std::string EditingHelp =
-    "<Entry Editing> mode Accelerators:\n"
-    "\tESC\tReturn to <Entry List> mode.\n"
-    "\tAlt+E\tEdits currently selected field in large window.\n"
-    "\tAlt+A\tAdd new Field with key name specified in bottom combo box.\n"
-    "\tAlt+D\tDelete currently selected field.\n"
-    "\tAlt+N\tRename currently selected field (change field key).\n"
-    "\tAlt+S\tEdit Strings. It is useful to insert into a field reference on string.\n"
-    "\tAlt+P\tEdit Preamble.\n"
-    "\tEnter\tInsert proper \\cite command into your document.\n";
-
-TEST_F(SchemaFile, HelpsWithEditing)
-{
-    std::string ini = folder.Write("a.ini", Types);
-    EXPECT_EQ(EditingHelp + "`Article' entry is for a paper.",
-              Schema_HelpText(ini.c_str(), "Article", true));
-    EXPECT_EQ(EditingHelp + "`talk' entry is for Custom Entry Type",
-              Schema_HelpText(ini.c_str(), "talk", true));
-}
-
-TEST_F(SchemaFile, CutsTheHelpWithEditing)
-{
-    std::string prose(2000, 'x');
-    std::string ini = folder.Write("a.ini", "[t]\n* = " + prose + "\n");
-    EXPECT_EQ((EditingHelp + "`t' entry is for " + prose).substr(0, 1023),
-              Schema_HelpText(ini.c_str(), "t", true));
 }

@@ -17,8 +17,6 @@
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
-#include "app/FrameRules.h"
-#include "app/Ipc.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
@@ -30,8 +28,10 @@
 #include "ui/Ids.h"
 #include "ui/Messages.h"
 #include "ui/Native.h"
+#include "ui/PanelRules.h"
 #include "ui/Preamble.h"
 #include "ui/QListBox.h"
+#include "ui/Status.h"
 #include "ui/Strings.h"
 #include "ui/Theme.h"
 
@@ -495,7 +495,8 @@ void Cartulo::OnInsertCite(wxCommandEvent &)
     wxString command = "-s (" + StoreText(m_entry->key, Encoding()) + ") ...InsCite";
     AppLog("Pass* ", command.utf8_str());
     Native_BringForward(m_state->companionWindow);
-    if (!SendCommand(m_state->companionService, command.utf8_str()))
+    if (!m_state->sendCommand ||
+        !m_state->sendCommand(m_state->companionService, command.utf8_str()))
         ShowStatusError(this, "ERROR: The editor of the document does not answer.");
 }
 
@@ -543,12 +544,11 @@ void Cartulo::SetModified(int file)
 // wxYES, wxNO or wxCANCEL.
 int Cartulo::AskToSave()
 {
-    char *question = FileSet_SaveQuestion(&m_set);
     m_busy = true; // another program may be activated meanwhile: nothing is saved before the answer
-    int answer = wxMessageBox(PathText(question), "Save Bibliography File - Question",
+    int answer = wxMessageBox(PathText(Panel_SaveQuestion(&m_set).c_str()),
+                              "Save Bibliography File - Question",
                               wxYES_NO | wxCANCEL | wxICON_QUESTION, wxGetTopLevelParent(this));
     m_busy = false;
-    free(question);
     return answer;
 }
 
@@ -573,10 +573,7 @@ wxString Cartulo::UnsavedText() const
 {
     if (m_set.saveErrors)
         return PathText(m_set.saveErrors);
-    char *paths = FileSet_ModifiedPaths(&m_set);
-    wxString text = PathText(paths);
-    free(paths);
-    return text;
+    return PathText(FileSet_ModifiedPaths(&m_set).c_str());
 }
 
 void Cartulo::OnSave(wxCommandEvent &)

@@ -18,14 +18,15 @@
 #include "base/Log.h"
 #include "encoding/Encoding.h"
 #include "session/EntryRules.h"
+#include "session/KnownStrings.h"
 #include "session/Schema.h"
+#include "ui/Commands.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/Icons.h"
 #include "ui/Ids.h"
 #include "ui/Native.h"
 #include "ui/QListBox.h"
-#include "ui/StringSources.h"
 #include "ui/Theme.h"
 #include "ui/TypeChoice.h"
 
@@ -311,7 +312,7 @@ void Cartulo::CheckMandatoryFields(int last)
 
 void Cartulo::UpdateHelpText()
 {
-    std::string text = Schema_HelpText(m_ini.c_str(), m_typeName.c_str(), m_editMode);
+    std::string text = Command_HelpText(m_ini.c_str(), m_typeName.c_str(), m_editMode);
     m_help->ChangeValue(OwnText(text.c_str()));
 }
 

@@ -100,7 +100,7 @@ void Cartulo::RemoveEntry(int row)
                         ".\n\nrefer it in `crossref' field.");
         return;
     }
-    BibEntry *next = Entry_NextInList(m_list->Item(0), int(m_list->GetItemCount()), row);
+    BibEntry *next = EntryIndex_Next(m_list->Item(0), int(m_list->GetItemCount()), row);
     int index = m_file;
     Grid_Clear(&m_grid); // it shows the entry
     if (!Entry_Remove(file, m_entry))

@@ -13,7 +13,6 @@
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/FieldDialogs.h"
-#include "ui/FieldKeys.h"
 #include "ui/Ids.h"
 #include "ui/PanelRules.h"
 #include "ui/QListBox.h"

@@ -70,6 +70,18 @@ int EntryIndex_RowToSelect(const IndexItem *index, int count, const BibEntry *se
     return row < 0 ? 0 : row;
 }
 
+// A file that is listed twice has two rows for each entry.
+BibEntry *EntryIndex_Next(const IndexItem *index, int count, int row)
+{
+    for (int i = row + 1; i < count; ++i)
+        if (index[i].entry != index[row].entry)
+            return index[i].entry;
+    for (int i = row - 1; i >= 0; --i)
+        if (index[i].entry != index[row].entry)
+            return index[i].entry;
+    return nullptr;
+}
+
 // --- Row texts ---
 
 // What stands in the parentheses: the file's name, or its number, which is written to `number`.

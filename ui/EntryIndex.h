@@ -29,6 +29,10 @@ int EntryIndex_Find(const IndexItem *index, int count, const BibEntry *entry);
 // -1 when there are no rows.
 int EntryIndex_RowToSelect(const IndexItem *index, int count, const BibEntry *select);
 
+// The entry to select when that of `row` is gone: the one after it in the list, else the one
+// before it; null for none.
+BibEntry *EntryIndex_Next(const IndexItem *index, int count, int row);
+
 // "key (file)", the key as store text. "key (number)" when `files` is null or has no such file.
 std::string EntryIndex_RowText(const IndexItem *item, BibFile *const *files, int fileCount);
 

@@ -9,7 +9,14 @@
 #include "session/Names.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
-#include "ui/FieldKeys.h"
+#include "ui/FieldGrid.h"
+
+const char FieldKey_BadCharsText[] = "Specified field key includes wrong characters.\n"
+                                     "We will remove them from key and continue.";
+const char FieldKey_UnwritableText[] = "A field of this name can't be written to a BIB file.\n"
+                                       "It must not begin with a digit, and hold no backslash "
+                                       "or control character.";
+const char FieldKey_TakenText[] = "Field with specified key is already exists.";
 
 // --- The value ---
 
@@ -76,7 +83,7 @@ Cartulo_RenameField::Cartulo_RenameField(wxWindow *parent, const FieldGrid *grid
 // False when the user has to see to the name first. An empty one is accepted: nothing changes.
 bool Cartulo_RenameField::Accept(const TypedName &name)
 {
-    switch (FieldKey_CheckNewName(m_grid, name)) {
+    switch (Grid_CheckNewName(m_grid, name)) {
     case NAME_OK:
     case NAME_EMPTY:
         return true;

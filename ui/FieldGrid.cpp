@@ -8,9 +8,9 @@
 
 #include "base/Ascii.h"
 #include "encoding/Encoding.h"
+#include "session/KnownStrings.h"
 #include "session/Values.h"
 #include "store/BibOutside.h"
-#include "ui/StringSources.h"
 
 static bool SameName(const char *a, const char *b)
 {
@@ -216,6 +216,14 @@ bool Grid_MayRename(const FieldGrid *grid, const char *name)
 void Grid_Rename(FieldGrid *grid, int row, const char *name)
 {
     grid->rows[row].key = name;
+}
+
+NameVerdict Grid_CheckNewName(const FieldGrid *grid, const TypedName &name)
+{
+    NameVerdict form = Name_Check(name);
+    if (form != NAME_OK)
+        return form;
+    return Grid_MayRename(grid, name.text.c_str()) ? NAME_OK : NAME_TAKEN;
 }
 
 // --- What the rows amount to ---

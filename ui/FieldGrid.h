@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "session/Names.h"
 #include "store/BibStore.h"
 
 struct EncodingRecord;
@@ -82,6 +83,10 @@ GridRemove Grid_Remove(FieldGrid *grid, int row);
 // False when a shown value equals the name, ignoring case. Other keys do not matter.
 bool Grid_MayRename(const FieldGrid *grid, const char *name);
 void Grid_Rename(FieldGrid *grid, int row, const char *name);
+
+// For the new name of a field. It is taken when a shown value reads like it. Whether a name is
+// taken for a new field is up to Grid_Add.
+NameVerdict Grid_CheckNewName(const FieldGrid *grid, const TypedName &name);
 
 // --- Committing: of a grid that shows an entry ---
 

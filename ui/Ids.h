@@ -1,6 +1,8 @@
 // ui/Ids.h - command identifiers, shared by the tool bar, the keyboard table and the panel.
 #pragma once
 
+enum { TOOL_ICON_SIZE = 16 }; // of the pictures of tools; device-independent pixels
+
 enum {
     ID_COMMAND_FIRST = 4999, // the frame hands commands of this range on to the panel
     ID_OPEN = 5000,

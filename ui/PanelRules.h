@@ -1,6 +1,8 @@
 // ui/PanelRules.h - decisions of the editor panel that need no window.
 #pragma once
 
+#include <string>
+
 #include "session/FileSet.h"
 
 // What the panel shows beside the list, or instead of it.
@@ -18,19 +20,10 @@ struct PanelTools {
 };
 PanelTools Panel_Tools(const BibFileSet *set, int file, bool editMode);
 
+// The question before files are saved; bytes as the system spells names, not store text.
+std::string Panel_SaveQuestion(const BibFileSet *set);
+
 // The row whose field a command removes: of a row's button (ID_REMOVE_ROW and following), or, for
 // ID_REMOVE_FIELD, the one with the focus; when none has it (-1), `storedRows`, which is no row.
 // -1 for another command.
 int Panel_RowToRemove(int id, int focusedRow, int storedRows);
-
-struct Colour {
-    unsigned char red, green, blue;
-};
-
-// How far two colours stand apart for the eye: 1 (equal) to 21 (black on white).
-double Colour_Contrast(Colour a, Colour b);
-
-// The colour of a text whose colour was chosen for light backgrounds: itself on those, and on a
-// dark one the same hue, light enough for a contrast of 4.5 at least, of 7 where the colour was
-// dark, so that dark and bright ones stay apart.
-Colour Colour_ForText(Colour chosen, Colour background, bool darkTheme);

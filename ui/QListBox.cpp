@@ -3,13 +3,11 @@
 #include <cstdlib>
 
 #include <wx/dc.h>
-#include <wx/frame.h>
 #include <wx/settings.h>
-#include <wx/statusbr.h>
 #include <wx/utils.h>
 
-#include "app/FrameRules.h"
 #include "base/Companion.h"
+#include "base/Log.h"
 #include "base/Sys.h"
 #include "encoding/Encoding.h"
 #include "ui/Cartulo.h"
@@ -168,31 +166,4 @@ void QListBox::OnChar(wxKeyEvent &event)
         ShowStatus(this, m_typeAhead.prefix);
         SendSelectedEvent();
     }
-}
-
-static wxStatusBar *StatusBarOf(wxWindow *window)
-{
-    wxFrame *frame = dynamic_cast<wxFrame *>(wxGetTopLevelParent(window));
-    return frame ? frame->GetStatusBar() : nullptr;
-}
-
-void ShowStatus(wxWindow *window, const wxString &text, bool bell)
-{
-    wxStatusBar *bar = StatusBarOf(window);
-    if (!bar)
-        return;
-    bar->SetStatusText(text, 0);
-    if (bell)
-        wxBell();
-}
-
-void ShowStatusError(wxWindow *window, const wxString &text)
-{
-    ShowStatus(window, text, true);
-}
-
-void ShowEncoding(wxWindow *window, const wxString &name)
-{
-    if (wxStatusBar *bar = StatusBarOf(window))
-        bar->SetStatusText(name, 1);
 }

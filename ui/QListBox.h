@@ -7,6 +7,7 @@
 #include <wx/vlbox.h>
 
 #include "ui/EntryIndex.h"
+#include "ui/Status.h" // ShowStatus, ShowStatusError
 
 class Cartulo;
 
@@ -51,9 +52,3 @@ private:
 
     wxDECLARE_EVENT_TABLE();
 };
-
-// A text for field 0 of the status bar of the window's frame, with or without the bell.
-void ShowStatus(wxWindow *window, const wxString &text, bool bell = false);
-void ShowStatusError(wxWindow *window, const wxString &text); // always with the bell
-
-void ShowEncoding(wxWindow *window, const wxString &name); // in field 1

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "ui/StringSources.h"
+#include "ui/StringRules.h"
 
 class Cartulo;
 class wxChoice;

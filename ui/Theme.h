@@ -3,7 +3,7 @@
 
 #include <wx/window.h>
 
-#include "ui/PanelRules.h"
+#include "ui/Colours.h"
 
 // Gives the window's text `colour`, or its readable twin when the desktop is dark.
 void Theme_SetTextColour(wxWindow *window, Colour colour);

@@ -13,6 +13,7 @@
 
 #include "tests/gui/GuiTest.h"
 #include "tests/support/DataFolder.h"
+#include "ui/Colours.h"
 #include "ui/PanelRules.h"
 
 namespace

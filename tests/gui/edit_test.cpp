@@ -8,6 +8,7 @@
 #include <wx/settings.h>
 
 #include "base/Companion.h"
+#include "ui/Colours.h"
 #include "ui/Native.h"
 #include "ui/PanelRules.h"
 

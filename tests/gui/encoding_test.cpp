@@ -7,11 +7,11 @@
 #include <wx/srchctrl.h>
 #include <wx/statusbr.h>
 
+#include "session/KnownStrings.h"
 #include "ui/EntryDialogs.h"
 #include "ui/Preamble.h"
 #include "ui/PreambleText.h"
 #include "ui/Strings.h"
-#include "ui/StringSources.h"
 
 using Texts = std::vector<wxString>;
 

@@ -8,6 +8,7 @@
 
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
+#include "ui/Colours.h"
 #include "ui/Ids.h"
 #include "ui/PanelRules.h"
 

@@ -21,6 +21,7 @@
 #include "base/Companion.h"
 #include "base/Sys.h"
 #include "ui/Cartulo.h"
+#include "ui/Colours.h"
 #include "ui/Ids.h"
 #include "ui/Messages.h"
 #include "ui/PanelRules.h"

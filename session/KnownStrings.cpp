@@ -1,9 +1,7 @@
-#include "ui/StringSources.h"
+#include "session/KnownStrings.h"
 
-#include <algorithm>
 #include <cstdlib>
 #include <cstring>
-#include <iterator>
 #include <set>
 
 #include "base/Ascii.h"
@@ -13,10 +11,6 @@
 
 // Of buffers, in bytes with the end: what does not fit is not read.
 enum { NAMES_SIZE = 1024, SECTION_NAME_SIZE = 64, LIST_SIZE = 4096 };
-
-enum { LONGEST_REPEAT = 1000 }; // milliseconds between two presses by a key that is held down
-
-int CurrentStringSource = STRINGS_OF_ALL_FILES;
 
 // --- Sources ---
 
@@ -44,14 +38,6 @@ StringSources Strings_Sources(const BibFileSet *set, const std::string &ini)
 int Strings_FirstFile(const StringSources *sources)
 {
     return static_cast<int>(sources->lists.size()) + 1;
-}
-
-int Strings_FitSource(const StringSources *sources, int source)
-{
-    if (sources->set->count == 1)
-        return 0;
-    bool isThere = source < sources->set->count && source >= -Strings_FirstFile(sources);
-    return isThere ? source : STRINGS_OF_ALL_FILES;
 }
 
 // --- Lines ---
@@ -95,17 +81,6 @@ std::vector<StringLine> Strings_Lines(const StringSources *sources, int source)
 bool StringLine::operator==(const StringLine &other) const
 {
     return text == other.text && encoding == other.encoding;
-}
-
-LineChange Strings_Compare(const std::vector<StringLine> &before,
-                           const std::vector<StringLine> &after)
-{
-    auto start = std::mismatch(before.begin(), before.end(), after.begin(), after.end());
-    auto end = std::mismatch(before.rbegin(), std::make_reverse_iterator(start.first),
-                             after.rbegin(), std::make_reverse_iterator(start.second));
-    return {static_cast<size_t>(start.first - before.begin()),
-            static_cast<size_t>(end.first.base() - start.first),
-            static_cast<size_t>(end.second.base() - start.second)};
 }
 
 std::string Strings_KeyOf(const StringLine &line)
@@ -194,40 +169,6 @@ std::wstring Strings_UnknownIn(const StringSources *sources, const std::wstring 
         return L"";
     return L"`" + name + L"': no abbreviation " + ListNames(unknown) +
            L" is known. As text, quotation marks are typed in another way, like << and >>.\n";
-}
-
-// --- Files ---
-
-BibFile *Strings_WritableFile(const StringSources *sources, int source)
-{
-    if (source < 0 || source >= sources->set->count)
-        return nullptr;
-    BibFile *file = sources->set->files[source];
-    return file->readOnly ? nullptr : file;
-}
-
-// --- Commands ---
-
-static const StringCommand Commands[] = {
-    {'A', ID_STRING_ADD, "Add New String ..."},
-    {'D', ID_STRING_REMOVE, "Delete String ..."},
-    {'E', ID_STRING_EDIT, "Edit String ..."},
-};
-
-const StringCommand *Strings_FindCommand(int key)
-{
-    for (const StringCommand &command : Commands)
-        if (command.key == key)
-            return &command;
-    return nullptr;
-}
-
-// The release may go to another window, so a press counts again after a while.
-bool Strings_IsHeld(int32_t *last, int32_t now)
-{
-    const int32_t before = *last;
-    *last = now;
-    return before != 0 && now - before < LONGEST_REPEAT;
 }
 
 // --- One file's abbreviations ---
