@@ -11,6 +11,13 @@
 
 // --- Errors and the executable ---
 
+// Why a call failed. Functions that can fail for many reasons take one as their last argument and
+// fill it when they fail; null: nobody wants to know.
+struct SysReason {
+    char text[256]; // in the system's words, for the user
+    int isTaken;    // somebody else holds the lock
+};
+
 const char *Sys_LastErrorText();     // the system's text for the last error; static buffer
 char *Sys_ToBackslashes(char *path); // every '/' becomes '\', in place; null stays null
 const char *Sys_ModulePath();        // full path of the executable, at most 260 characters
