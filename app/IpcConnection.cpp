@@ -1,9 +1,9 @@
-#include "app/IpcConnection.h"
+// app/IpcConnection.cpp - a client of the command server: what it may ask, and its socket.
+#include "app/IpcServer.h"
 
 #include <wx/datetime.h>
 
 #include "app/IpcMessage.h"
-#include "app/IpcServer.h"
 #include "base/Companion.h"
 #include "base/Sys.h"
 

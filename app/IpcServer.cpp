@@ -6,7 +6,6 @@
 #include <wx/evtloopsrc.h>
 
 #include "app/Ipc.h"
-#include "app/IpcConnection.h"
 #include "base/Companion.h"
 #include "base/Sys.h"
 #include "store/BibStore.h"

@@ -1,28 +1,17 @@
 #include "session/EntryRules.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <cstring>
 
 #include "base/Ascii.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
-#include "store/BibOutside.h"
 
 // --- Fields ---
 
 static int FindCrossref(const BibEntry *entry)
 {
     return Bib_FindField(entry, "crossref");
-}
-
-static void ReplaceText(char **text, const char *with)
-{
-    char *copy = Bib_CopyText(with, strlen(with));
-    if (!copy)
-        return;
-    free(*text);
-    *text = copy;
 }
 
 // --- Where a new entry may go ---
@@ -186,20 +175,9 @@ int Entry_TypeIn(const BibFile *file, int type, std::string *reason)
 
 const char Entry_ChildSpecs[] = "crossref=*\0";
 
-BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, const char *specs,
-                       const BibEntry *parent)
-{
-    BibEntry *entry = Bib_NewEntry(file, key, typeName, specs, 0);
-    if (entry && parent && FindCrossref(entry) == 0)
-        ReplaceText(&entry->fields[0].value, parent->key);
-    return entry;
-}
+// --- References ---
 
-// --- Changes ---
-
-// The slot of the `crossref` that names `key`; -1 when the entry does not refer to it. Logs each
-// value that it looks at: the log tells why a removal was refused.
-static int FindReference(const BibEntry *entry, const char *key)
+int Entry_FindReference(const BibEntry *entry, const char *key)
 {
     int crossref = FindCrossref(entry);
     if (crossref < 0)
@@ -209,35 +187,11 @@ static int FindReference(const BibEntry *entry, const char *key)
     return Ascii_Compare(value, key) == 0 ? crossref : -1;
 }
 
-void Entry_Rename(BibFile *file, BibEntry *entry, const char *key)
-{
-    AppLog("Fix crossref's on the entry: ", entry->key);
-    for (BibEntry *other = file->entries; other && other != entry; other = other->next) {
-        int reference = FindReference(other, entry->key);
-        if (reference >= 0)
-            ReplaceText(&other->fields[reference].value, key);
-    }
-    ReplaceText(&entry->key, key);
-}
-
 std::string Entry_Referrers(const BibFile *file, const BibEntry *entry)
 {
     std::string keys;
     for (const BibEntry *other = file->entries; other && other != entry; other = other->next)
-        if (FindReference(other, entry->key) >= 0)
+        if (Entry_FindReference(other, entry->key) >= 0)
             keys += std::string(keys.empty() ? "`" : ", `") + other->key + "'";
     return keys;
-}
-
-int Entry_Remove(BibFile *file, BibEntry *entry)
-{
-    BibEntry **link = Bib_FindLink(file, entry);
-    if (!link) {
-        AppLog("DELETEENTRY: ", "Current entry not found.");
-        return 0;
-    }
-    Outside_HandOnEntry(file, entry);
-    *link = entry->next;
-    Bib_FreeEntry(entry);
-    return 1;
 }

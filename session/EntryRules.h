@@ -43,7 +43,8 @@ KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const B
 // --- Types ---
 
 // Why an entry can't be of this type ("" for none) with the mandatory fields of `specs`; "" when it
-// can. Without this check, Entry_Create may end the process, and a save write what can't be read.
+// can. Without this check, Change_AddEntry may end the process, and a save write what can't be
+// read.
 std::string Entry_CheckType(const char *typeName, const char *specs);
 
 // A type and the lines of its section (Schema_FieldSpecs) as text of one file.
@@ -61,20 +62,12 @@ int Entry_TypeIn(const BibFile *file, int type, std::string *reason);
 // The fields of an entry that refers to another one, as Bib_NewEntry wants them.
 extern const char Entry_ChildSpecs[];
 
-// A new entry at the head of the file. When its first field is `crossref`, that names `parent`
-// (null: none). Null when memory is out.
-BibEntry *Entry_Create(BibFile *file, const char *key, const char *typeName, const char *specs,
-                       const BibEntry *parent);
+// --- References ---
 
-// --- Changes ---
-
-// Renames the entry and the `crossref` fields of the entries before it in its file. A key or a
-// reference for which memory is out stays as it was.
-void Entry_Rename(BibFile *file, BibEntry *entry, const char *key);
+// The slot of the `crossref` that names `key`; -1 when the entry does not refer to it. Logs each
+// value that it looks at: the log tells why a removal was refused.
+int Entry_FindReference(const BibEntry *entry, const char *key);
 
 // The keys of the entries before this one in the file whose `crossref` names it, as "`a', `b'"; ""
 // for none.
 std::string Entry_Referrers(const BibFile *file, const BibEntry *entry);
-
-// Unlinks and frees the entry. Returns 0, logged, when it is not of that file.
-int Entry_Remove(BibFile *file, BibEntry *entry);

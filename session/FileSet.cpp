@@ -158,7 +158,7 @@ static std::string LockFailureText(const char *path)
 static void ReportLockFailure(const BibFileSet *set, const char *caption, const std::string &text)
 {
     if (set->box)
-        set->box(set->boxOwner, caption, text.c_str());
+        set->box(set->owner, caption, text.c_str());
     AppLog("ERROR: ", text.c_str());
 }
 

@@ -16,7 +16,9 @@ struct BibFileSet {
                       // "File: `path'\nreason\n" each; null when it wrote everything
     // Shows a warning with an OK button and returns when it is closed. Null: only the log.
     void (*box)(void *owner, const char *caption, const char *text);
-    void *boxOwner;
+    // Told after each change of an open file (Changes.h). Null: nobody.
+    void (*changed)(void *owner);
+    void *owner; // whom both call
 };
 
 void FileSet_Append(BibFileSet *set, BibFile *file);

@@ -1,13 +1,11 @@
 #include "session/KnownStrings.h"
 
-#include <cstdlib>
 #include <cstring>
 #include <set>
 
 #include "base/Ascii.h"
 #include "base/Profile.h"
 #include "encoding/Encoding.h"
-#include "store/BibOutside.h"
 
 // Of buffers, in bytes with the end: what does not fit is not read.
 enum { NAMES_SIZE = 1024, SECTION_NAME_SIZE = 64, LIST_SIZE = 4096 };
@@ -198,45 +196,4 @@ NameVerdict String_CheckNewKey(const BibFile *file, const TypedName &key)
     if (form != NAME_OK)
         return form;
     return String_Find(file, 0, key.text.c_str()) ? NAME_TAKEN : NAME_OK;
-}
-
-int String_Add(BibFile *file, const char *key, const char *value)
-{
-    BibString *string = static_cast<BibString *>(Bib_Alloc(sizeof(BibString)));
-    char *name = Bib_CopyText(key, strlen(key));
-    char *copy = Bib_CopyText(value, strlen(value));
-    if (!string || !name || !copy) {
-        free(string);
-        free(name);
-        free(copy);
-        return 0;
-    }
-    *string = {nullptr, name, copy};
-    BibString **end = &file->strings;
-    while (*end)
-        end = &(*end)->next;
-    *end = string;
-    return 1;
-}
-
-int String_SetValue(BibString *string, const char *value)
-{
-    char *copy = Bib_CopyText(value, strlen(value));
-    if (!copy)
-        return 0;
-    free(string->value);
-    string->value = copy;
-    return 1;
-}
-
-void String_Remove(BibFile *file, BibString *string)
-{
-    BibString **link = &file->strings;
-    while (*link != string)
-        link = &(*link)->next;
-    Outside_HandOnString(file, string);
-    *link = string->next;
-    free(string->value);
-    free(string->name);
-    free(string);
 }

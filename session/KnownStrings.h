@@ -51,10 +51,3 @@ NameVerdict String_CheckNewKey(const BibFile *file, const TypedName &key);
 // The abbreviation in a row of the file's lines if it goes by `key`, ignoring case, else the first
 // that does (a file may define one name more than once); null for none.
 BibString *String_Find(const BibFile *file, int row, const char *key);
-
-// These return 0, with nothing changed, when memory is out.
-int String_Add(BibFile *file, const char *key, const char *value); // at the end of its list
-int String_SetValue(BibString *string, const char *value);
-
-// Unlinks and frees it; entries may refer to it still. It is one of that file.
-void String_Remove(BibFile *file, BibString *string);

@@ -1,4 +1,5 @@
 // What stands between the items of a file is there again after a save.
+#include "session/Changes.h"
 #include "store/BibOutside.h"
 
 #include <gmock/gmock.h>
@@ -78,11 +79,14 @@ protected:
         return entry;
     }
 
-    void RemoveEntry(const std::string &key) { EXPECT_EQ(1, Entry_Remove(file, Entry(key))); }
+    void RemoveEntry(const std::string &key)
+    {
+        EXPECT_EQ(1, Change_RemoveEntry(nullptr, file, Entry(key)));
+    }
 
     void RemoveString(const std::string &name)
     {
-        String_Remove(file, String_Find(file, 0, name.c_str()));
+        Change_RemoveString(nullptr, file, String_Find(file, 0, name.c_str()));
     }
 
     // As the panel commits it.
@@ -92,12 +96,14 @@ protected:
         Grid_Fill(&grid, Entry(key), Bib_Encoding(file));
         grid.rows[0].text = value;
         BibEntry *changed = Grid_Build(&grid, grid.entry->type);
-        ASSERT_EQ(1, Grid_Replace(file, Entry(key), changed));
+        ASSERT_EQ(1, Change_ReplaceEntry(nullptr, file, Entry(key), changed));
     }
 
     void EditPreamble(const std::wstring &typed)
     {
-        Preamble_Store(file, Preamble_Read(typed, file->preamble, Bib_Encoding(file)));
+        PreambleEdit edit = Preamble_Read(typed, file->preamble, Bib_Encoding(file));
+        EXPECT_EQ(1, Change_SetPreamble(nullptr, file, edit.text.c_str(), edit.places.data(),
+                                        int(edit.places.size())));
     }
 
     std::string MessagesOf(const std::string &text)
@@ -260,11 +266,11 @@ TEST_F(BibOutsideTest, MayBeLong)
 TEST_F(BibOutsideTest, StaysWhenItsItemIsRenamedOrChanged)
 {
     Load(AllKinds);
-    Entry_Rename(file, Entry("b"), "z");
+    Change_RenameEntry(nullptr, file, Entry("b"), "z");
     Commit("z", L"changed");
     Commit("a", L"changed, too");
     Entry("c")->type = Bib_TypeIndex("book");
-    EXPECT_EQ(1, String_SetValue(String_Find(file, 0, "s"), "new"));
+    EXPECT_EQ(1, Change_SetString(nullptr, file, String_Find(file, 0, "s"), "new"));
     EditPreamble(L"A\r\nb\r\nc!\r\n");
     std::string expected = AllKinds;
     for (auto [from, to] : {std::pair("{a}", "{A}"), std::pair("{c}", "{c!}"),
@@ -321,7 +327,7 @@ TEST_F(BibOutsideTest, IsNotThatOfANewItem)
 {
     Load("% a\n@misc{a,\n}\n% b\n@misc{b,\n}\n% end\n");
     Bib_NewEntry(file, "new", "misc", "\0", 0);
-    EXPECT_EQ(1, String_Add(file, "s", "S"));
+    EXPECT_EQ(1, Change_AddString(nullptr, file, "s", "S"));
     EXPECT_EQ("@STRING{s = {S}}\n\n@misc{new,\n}\n% a\n@misc{a,\n}\n% b\n@misc{b,\n}\n% end\n",
               Saved());
 }

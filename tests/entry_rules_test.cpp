@@ -61,8 +61,7 @@ protected:
 using EntryFiles = EntryRules;
 using EntryKeys = EntryRules;
 using NewEntry = EntryRules;
-using RenamedEntry = EntryRules;
-using RemovedEntry = EntryRules;
+using ReferredEntry = EntryRules;
 
 const std::string Talks = "@misc{Griske84, note = {Talk}}\n";
 const std::string Books = "@book{Ost77, title = {East}}\n";
@@ -201,52 +200,6 @@ TEST_F(EntryKeys, AreRefusedForCharactersThatTheCodePageLacks)
 
 // --- New entries ---
 
-TEST_F(NewEntry, HasTheMandatoryFieldsOfItsType)
-{
-    BibFile *file = Open("a.bib", Talks);
-    std::string ini = folder.Write("types.ini", "[talk]\n*=A talk\nauthor=*editor\neditor=*author\n"
-                                                "note=\nTitle=*\n");
-    char specs[2048];
-    Schema_FieldSpecs(ini.c_str(), "talk", specs, sizeof specs);
-    ASSERT_EQ("", Entry_CheckType("talk", specs));
-    BibEntry *entry = Entry_Create(file, "new1", "talk", specs, nullptr);
-    EXPECT_EQ(entry, file->entries);
-    EXPECT_EQ("@talk{new1,\n\tauthor = {},\n\teditor = {},\n\tTitle = {}\n}\n"
-              "@misc{Griske84,\n\tnote = {Talk}\n}\n",
-              Saved(file, "a.bib"));
-}
-
-TEST_F(NewEntry, HasNoFieldsWhereItsTypeIsNotDescribed)
-{
-    BibFile *file = Open("a.bib", Talks);
-    char specs[2048];
-    Schema_FieldSpecs(folder.Path("none.ini").c_str(), "misc", specs, sizeof specs);
-    ASSERT_EQ("", Entry_CheckType("misc", specs));
-    EXPECT_EQ(0, Entry_Create(file, "new1", "misc", specs, nullptr)->fieldCount);
-    EXPECT_EQ("new1 Griske84 ", Keys(file));
-}
-
-TEST_F(NewEntry, RefersToItsParent)
-{
-    BibFile *file = Open("a.bib", Family);
-    ASSERT_EQ("", Entry_CheckType("inbook", Entry_ChildSpecs));
-    BibEntry *entry = Entry_Create(file, "child", "inbook", Entry_ChildSpecs, Find(file, "parent"));
-    ASSERT_EQ(1, entry->fieldCount);
-    EXPECT_STREQ("crossref", BibFieldTable[entry->fields[0].name]);
-    EXPECT_STREQ("parent", entry->fields[0].value);
-    EXPECT_NE(Find(file, "parent")->key, entry->fields[0].value);
-    EXPECT_EQ("child first second stranger lonely parent last ", Keys(file));
-}
-
-TEST_F(NewEntry, RefersToNothingWhereItsFirstFieldIsAnother)
-{
-    BibFile *file = Open("a.bib", Talks);
-    const char specs[] = "title=*\0crossref=*\0";
-    BibEntry *entry = Entry_Create(file, "child", "misc", specs, file->entries);
-    EXPECT_STREQ("", entry->fields[0].value);
-    EXPECT_STREQ("", entry->fields[1].value);
-}
-
 TEST_F(NewEntry, NeedsAType)
 {
     EXPECT_THAT(Entry_CheckType("", ""), HasSubstr("no type"));
@@ -280,57 +233,9 @@ TEST_F(NewEntry, NeedsRoomForItsType)
     EXPECT_THAT(Entry_CheckType("more", ""), HasSubstr("`more'"));
 }
 
-// --- Renaming ---
+// --- References ---
 
-TEST_F(RenamedEntry, TakesTheChildrenBeforeItAlong)
-{
-    BibFile *file = Open("a.bib", Family);
-    BibFile *other = Open("b.bib", "@inbook{away, crossref = {parent}}\n");
-    Entry_Rename(file, Find(file, "parent"), "mother");
-    EXPECT_EQ("@inbook{first,\n\tcrossref = {mother}\n}\n"
-              "@inbook{second,\n\tcrossref = {mother},\n\tpages = 7\n}\n"
-              "@inbook{stranger,\n\tcrossref = {parents}\n}\n"
-              "@book{lonely,\n\ttitle = {L}\n}\n"
-              "@book{mother,\n\ttitle = {P}\n}\n"
-              "@inbook{last,\n\tcrossref = {parent}\n}\n",
-              Saved(file, "a.bib"));
-    EXPECT_STREQ("parent", other->entries->fields[0].value);
-}
-
-TEST_F(RenamedEntry, LogsTheReferencesThatItLooksAt)
-{
-    BibFile *file = Open("a.bib", Family);
-    log.Lines();
-    Entry_Rename(file, Find(file, "parent"), "mother");
-    EXPECT_THAT(log.Lines(), ElementsAre("Fix crossref's on the entry: parent", "crossref= PARENT",
-                                         "crossref= parent", "crossref= parents"));
-}
-
-TEST_F(RenamedEntry, MayBeTheFirstOfItsFile)
-{
-    BibFile *file = Open("a.bib", Family);
-    Entry_Rename(file, file->entries, "firstborn");
-    EXPECT_EQ("firstborn second stranger lonely parent last ", Keys(file));
-    EXPECT_STREQ("PARENT", file->entries->fields[0].value);
-}
-
-// Loading puts the last one first.
-TEST_F(RenamedEntry, ChangesTheFirstReferenceOfAnEntryOnly)
-{
-    BibFile *file = Open("a.bib", "@misc{child, crossref = {a}, crossref = {b}}\n"
-                                  "@misc{a, note = 1}\n@misc{b, note = 1}\n");
-    const BibField *fields = file->entries->fields;
-    Entry_Rename(file, Find(file, "a"), "c");
-    EXPECT_STREQ("b", fields[0].value);
-    EXPECT_STREQ("a", fields[1].value);
-    Entry_Rename(file, Find(file, "b"), "d");
-    EXPECT_STREQ("d", fields[0].value);
-    EXPECT_STREQ("a", fields[1].value);
-}
-
-// --- Removing ---
-
-TEST_F(RemovedEntry, IsReferredToByTheEntriesBeforeIt)
+TEST_F(ReferredEntry, IsReferredToByTheEntriesBeforeIt)
 {
     BibFile *file = Open("a.bib", Family);
     Open("b.bib", "@inbook{away, crossref = {lonely}}\n");
@@ -339,43 +244,19 @@ TEST_F(RemovedEntry, IsReferredToByTheEntriesBeforeIt)
     EXPECT_EQ("", Entry_Referrers(file, Find(file, "first")));
 }
 
-TEST_F(RemovedEntry, IsNotHeldByAReferenceOfItsOwn)
+TEST_F(ReferredEntry, IsNotHeldByAReferenceOfItsOwn)
 {
     BibFile *file = Open("a.bib", "@misc{self, crossref = {self}}\n");
     EXPECT_EQ("", Entry_Referrers(file, file->entries));
 }
 
-TEST_F(RemovedEntry, LogsTheReferencesThatItLooksAt)
+TEST_F(ReferredEntry, LogsTheReferencesThatItLooksAt)
 {
     BibFile *file = Open("a.bib", Family);
     log.Lines();
     Entry_Referrers(file, Find(file, "lonely"));
     EXPECT_THAT(log.Lines(),
                 ElementsAre("crossref= PARENT", "crossref= parent", "crossref= parents"));
-}
-
-TEST_F(RemovedEntry, LeavesTheOthersAsTheyWere)
-{
-    BibFile *file = Open("a.bib", Family);
-    EXPECT_EQ(1, Entry_Remove(file, Find(file, "lonely")));
-    EXPECT_EQ("first second stranger parent last ", Keys(file));
-    EXPECT_EQ(1, Entry_Remove(file, Find(file, "first")));
-    EXPECT_EQ("second stranger parent last ", Keys(file));
-    EXPECT_EQ(1, Entry_Remove(file, Find(file, "last")));
-    EXPECT_EQ("@inbook{second,\n\tcrossref = {parent},\n\tpages = 7\n}\n"
-              "@inbook{stranger,\n\tcrossref = {parents}\n}\n"
-              "@book{parent,\n\ttitle = {P}\n}\n",
-              Saved(file, "a.bib"));
-}
-
-TEST_F(RemovedEntry, HasToBeOfTheFile)
-{
-    BibFile *file = Open("a.bib", Talks), *other = Open("b.bib", Books);
-    log.Lines();
-    EXPECT_EQ(0, Entry_Remove(file, other->entries));
-    EXPECT_THAT(log.Lines(), ElementsAre("DELETEENTRY: Current entry not found."));
-    EXPECT_EQ("Griske84 ", Keys(file));
-    EXPECT_EQ("Ost77 ", Keys(other));
 }
 
 // --- Files in several encodings ---

@@ -1,3 +1,4 @@
+#include "session/Changes.h"
 #include "ui/FieldGrid.h"
 
 #include <gmock/gmock.h>
@@ -496,10 +497,10 @@ TEST_F(Grid, ReplacesNoEntryOfAnotherFile)
     BibFile *other = LoadText("@misc{x, note = {a}}\n");
     Show("@misc{k, note = {a}}\n", "k");
     BibEntry *entry = Grid_Build(&grid, grid.entry->type);
-    EXPECT_EQ(0, Grid_Replace(other, file->entries, entry));
+    EXPECT_EQ(0, Change_ReplaceEntry(nullptr, other, file->entries, entry));
     EXPECT_STREQ("x", other->entries->key);
     EXPECT_STREQ("k", file->entries->key);
-    EXPECT_EQ(1, Grid_Replace(file, file->entries, entry));
+    EXPECT_EQ(1, Change_ReplaceEntry(nullptr, file, file->entries, entry));
     EXPECT_EQ(entry, file->entries);
     Bib_FreeFile(other);
 }
@@ -757,7 +758,7 @@ protected:
         if (!CheckRows())
             return;
         ASSERT_TRUE(Grid_HasRoom(&grid));
-        EXPECT_EQ(1, Grid_Replace(file, old, Grid_Build(&grid, type)));
+        EXPECT_EQ(1, Change_ReplaceEntry(nullptr, file, old, Grid_Build(&grid, type)));
     }
 
     // The file's bytes; it must load without a fault.

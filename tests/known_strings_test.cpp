@@ -182,35 +182,6 @@ TEST_F(StringKeys, HaveToBeReadable)
 
 using StringList = StringSourcesTest;
 
-TEST_F(StringList, GetsNewOnesAtItsEnd)
-{
-    BibFile *file = Load("@string{b = {B}}\n");
-    EXPECT_EQ(1, String_Add(file, "a", "A \2b\5"));
-    EXPECT_EQ(1, String_Add(file, "c", ""));
-    EXPECT_THAT(NamesIn(file), ElementsAre("b", "a", "c"));
-    EXPECT_STREQ("A \2b\5", file->strings->next->value);
-    BibFile *empty = Load("");
-    EXPECT_EQ(1, String_Add(empty, "a", "A"));
-    EXPECT_THAT(NamesIn(empty), ElementsAre("a"));
-}
-
-TEST_F(StringList, LosesAnyOfItsOwn)
-{
-    BibFile *file = Load("@string{a = {A}}\n@string{b = {B}}\n@string{c = {C}}\n");
-    String_Remove(file, file->strings->next);
-    EXPECT_THAT(NamesIn(file), ElementsAre("a", "c"));
-    String_Remove(file, file->strings);
-    String_Remove(file, file->strings);
-    EXPECT_EQ(nullptr, file->strings);
-}
-
-TEST_F(StringList, TakesAnotherValue)
-{
-    BibFile *file = Load("@string{a = {A}}\n");
-    EXPECT_EQ(1, String_SetValue(file->strings, "Another"));
-    EXPECT_STREQ("Another", file->strings->value);
-}
-
 TEST_F(StringList, FindsTheOneInARowAmongNamesakes)
 {
     BibFile *file = Load("@string{a = {1}}\n@string{b = {2}}\n@string{A = {3}}\n");

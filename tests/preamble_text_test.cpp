@@ -135,16 +135,6 @@ TEST(PreambleCheck, NamesEachWrongPiece)
     EXPECT_THAT(faults[3].reason, testing::StartsWith("The name of an abbreviation"));
 }
 
-TEST(PreambleStore, FillsTheBuffer)
-{
-    BibFile *file = LoadText("@preamble{{a}}\n");
-    Preamble_Store(file, {std::string(8191, 'x'), {}, L"", ""});
-    EXPECT_EQ(8191u, strlen(file->preamble));
-    Preamble_Store(file, {"b\r\n", {}, L"", ""});
-    EXPECT_STREQ("b\r\n", file->preamble);
-    Bib_FreeFile(file);
-}
-
 TEST(PreambleRead, KeepsTheBytesOfUntouchedPiecesInUtf8)
 {
     PreambleEdit edit = Preamble_Read(L"\u00ABa\u00BB\r\n\u0416\r\n",

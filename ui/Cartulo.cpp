@@ -20,6 +20,7 @@
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/Changes.h"
 #include "session/Schema.h"
 #include "session/Values.h"
 #include "ui/Dialogs.h"
@@ -93,7 +94,8 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
       m_state(state)
 {
     m_set.box = ShowBox;
-    m_set.boxOwner = this;
+    m_set.changed = OnChanged;
+    m_set.owner = this;
     ReadSchema();
     AppLog("IFNO: Cartulo::Cartulo ", "Parse_Command_Line");
     ProcessCommand(commandLine, "OnInit");
@@ -101,6 +103,7 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     m_sashPosition = int(wxConfigBase::Get()->ReadLong(SashKey, 0));
     SetMinimumPaneSize(FromDIP(SMALLEST_PANE));
     m_list = new QListBox(this, this, ID_INDEX, wxDefaultPosition, wxDefaultSize, wxBORDER_STATIC);
+    m_list->SetFiles(&m_set);
     m_list->Update_Index(nullptr, m_search.c_str());
     CreateEntryPane();
     Arrange();
@@ -359,6 +362,11 @@ void Cartulo::ShowBox(void *owner, const char *caption, const char *text)
     static_cast<Cartulo *>(owner)->ShowWarning(caption, PathText(text));
 }
 
+void Cartulo::OnChanged(void *owner)
+{
+    static_cast<Cartulo *>(owner)->UpdateSaveTool();
+}
+
 void Cartulo::ShowWarning(const wxString &caption, const wxString &text)
 {
     Box_Warn(wxGetTopLevelParent(this), caption, text);
@@ -473,7 +481,8 @@ void Cartulo::OnEditStrings(wxCommandEvent &)
 {
     int row = RowWithFocus(m_grid.count);
     TNSMessage("INFO: Cartulo::OnEditStrings, mode=", row < 0 ? "Edit" : "Insert", TNS_ACTION);
-    Cartulo_Strings dialog(this, row < 0 ? nullptr : m_rows[row].value);
+    Cartulo_Strings dialog(wxGetTopLevelParent(this), &m_set, m_ini,
+                           row < 0 ? nullptr : m_rows[row].value);
     dialog.ShowModal();
     if (row >= 0)
         FocusRow(row);
@@ -482,7 +491,7 @@ void Cartulo::OnEditStrings(wxCommandEvent &)
 void Cartulo::OnEditPreamble(wxCommandEvent &)
 {
     TNSMessage("INFO: Cartulo::OnEditPreamble", "", TNS_ACTION);
-    Cartulo_Preamble(this).ShowModal();
+    Cartulo_Preamble(wxGetTopLevelParent(this), &m_set).ShowModal();
 }
 
 // --- Other programs ---
@@ -534,7 +543,7 @@ void Cartulo::Update_Tools()
 void Cartulo::SetModified(int file)
 {
     if (file >= 0 && file < m_set.count)
-        ++m_set.files[file]->modified;
+        Change_Count(&m_set, m_set.files[file]);
     else if (file > 0)
         AppLog("SetModified-ERROR - wrong file index ",
                wxString::Format(" %d out of 0..%d", file, m_set.count).utf8_str());

@@ -135,13 +135,14 @@ private:
     void RemoveRow(int row);
     const EncodingRecord *Encoding() const; // of the current entry
     void SelectInList(BibEntry *entry);
-    void ShowChanged(BibEntry *entry, int file);
+    void ShowChanged(BibEntry *entry);
     void RemoveEntry(int row);
     void UpdateSaveTool();
     void ShowRow(const char *handler);
     int AskToSave();
     void ShowWarning(const wxString &caption, const wxString &text);
     static void ShowBox(void *owner, const char *caption, const char *text);
+    static void OnChanged(void *owner);
 
     void OnOpen(wxCommandEvent &event);
     void OnSave(wxCommandEvent &event);

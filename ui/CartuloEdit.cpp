@@ -17,6 +17,7 @@
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/Changes.h"
 #include "session/EntryRules.h"
 #include "session/KnownStrings.h"
 #include "session/Schema.h"
@@ -421,9 +422,7 @@ bool Cartulo::Commit()
         return false;
     if (!Grid_ChangesOnlyType(&changes))
         return ReplaceEntry(type);
-    m_entry->type = type;
-    SetModified(m_file);
-    return true;
+    return Change_SetType(&m_set, m_set.files[m_file], m_entry, type) != 0;
 }
 
 // The type as the file has it. False when it can't have one of that name, and the editing goes on.
@@ -490,13 +489,11 @@ bool Cartulo::ReplaceEntry(int type)
         return false;
     }
     m_list->Drop_Index(); // its rows refer to the old entry
-    if (Grid_Replace(m_set.files[m_file], m_entry, entry)) {
+    if (Change_ReplaceEntry(&m_set, m_set.files[m_file], m_entry, entry)) {
         m_entry = entry;
-        SetModified(m_file);
         return true;
     }
-    AppLog("ERROR: Can't locate our entry inside BIB-file data");
-    Bib_FreeEntry(entry);
+    Bib_FreeEntry(entry); // it was no file's
     ShowWarning(CommitTitle, "The changes can't be stored: the entry is not in its file any more.");
     return true;
 }

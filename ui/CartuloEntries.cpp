@@ -5,6 +5,7 @@
 
 #include "base/Companion.h"
 #include "base/Log.h"
+#include "session/Changes.h"
 #include "session/EntryRules.h"
 #include "ui/DisplayText.h"
 #include "ui/EntryDialogs.h"
@@ -22,7 +23,7 @@ void Cartulo::OnNewEntry(wxCommandEvent &)
     m_dialogResult = dialog.ShowModal();
     if (!dialog.Changed())
         return;
-    ShowChanged(dialog.Changed(), dialog.ChangedFile());
+    ShowChanged(dialog.Changed());
     if (m_entry != dialog.Changed())
         ShowStatus(this, "The new entry is not in the list: it does not hold the searched text.");
 }
@@ -39,12 +40,11 @@ void Cartulo::OnRenameEntry(wxCommandEvent &)
     m_dialogResult = dialog.ShowModal();
     if (!dialog.Changed())
         return;
-    ShowChanged(dialog.Changed(), dialog.ChangedFile());
+    ShowChanged(dialog.Changed());
 }
 
-void Cartulo::ShowChanged(BibEntry *entry, int file)
+void Cartulo::ShowChanged(BibEntry *entry)
 {
-    SetModified(file);
     SelectInList(entry);
     ShowSelection();
     FocusList();
@@ -101,14 +101,12 @@ void Cartulo::RemoveEntry(int row)
         return;
     }
     BibEntry *next = EntryIndex_Next(m_list->Item(0), int(m_list->GetItemCount()), row);
-    int index = m_file;
     Grid_Clear(&m_grid); // it shows the entry
-    if (!Entry_Remove(file, m_entry))
+    if (!Change_RemoveEntry(&m_set, file, m_entry))
         return;
     m_entry = nullptr;
     SelectInList(next);
     ShowSelection();
-    SetModified(index);
     m_list->Refresh();
     FocusList();
 }

@@ -7,6 +7,7 @@
 
 #include "base/Companion.h"
 #include "encoding/Encoding.h"
+#include "session/Changes.h"
 #include "session/Names.h"
 #include "session/Schema.h"
 #include "ui/Dialogs.h"
@@ -182,8 +183,8 @@ bool Cartulo_NewEntry::Create(int file, const std::string &key)
         Refuse(StoreText(type.reason.c_str(), Bib_Encoding(target)));
         return false;
     }
-    BibEntry *entry = Entry_Create(target, key.c_str(), type.name.c_str(), type.specs.c_str(),
-                                   child ? m_current.entry : nullptr);
+    BibEntry *entry = Change_AddEntry(m_current.set, target, key.c_str(), type.name.c_str(),
+                                      type.specs.c_str(), child ? m_current.entry : nullptr);
     if (!entry) {
         Refuse("There is not enough memory for a new entry.");
         return false;
@@ -221,6 +222,16 @@ bool Cartulo_RenameEntry::MayRename() const
            !m_current.set->files[m_current.file]->readOnly;
 }
 
+bool Cartulo_RenameEntry::Rename(BibFile *file, const std::string &key)
+{
+    if (!Change_RenameEntry(m_current.set, file, m_current.entry, key.c_str())) {
+        Refuse("There is not enough memory for the new key.");
+        return false;
+    }
+    SetChanged(m_current.entry, m_current.file);
+    return true;
+}
+
 // An empty key closes the window as well.
 void Cartulo_RenameEntry::OnOK(wxCommandEvent &event)
 {
@@ -231,11 +242,7 @@ void Cartulo_RenameEntry::OnOK(wxCommandEvent &event)
     BibFile *file = m_current.set->files[m_current.file];
     TypedName key = Key(file);
     KeyVerdict verdict = Entry_CheckRename(m_current.set, file, m_current.entry, key);
-    if (Accept(verdict, key)) {
-        Entry_Rename(file, m_current.entry, key.text.c_str());
-        SetChanged(m_current.entry, m_current.file);
-    } else if (verdict != KEY_EMPTY) {
-        return; // stays open
-    }
-    event.Skip();
+    bool renamed = Accept(verdict, key) && Rename(file, key.text);
+    if (renamed || verdict == KEY_EMPTY)
+        event.Skip(); // closes
 }

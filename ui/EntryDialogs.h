@@ -1,7 +1,7 @@
 // ui/EntryDialogs.h - the windows that add an entry and rename one.
 //
 // Their OK handlers change the store only. After the window is closed the caller asks for
-// Changed(), updates list and pane, and marks the file as modified.
+// Changed(), and updates list and pane.
 #pragma once
 
 #include <wx/dialog.h>
@@ -90,6 +90,7 @@ public:
 
 private:
     bool MayRename() const;
+    bool Rename(BibFile *file, const std::string &key);
     void OnOK(wxCommandEvent &event);
 
     wxDECLARE_EVENT_TABLE();

@@ -8,9 +8,9 @@
 
 #include "base/Ascii.h"
 #include "encoding/Encoding.h"
+#include "session/Changes.h"
 #include "session/KnownStrings.h"
 #include "session/Values.h"
-#include "store/BibOutside.h"
 
 static bool SameName(const char *a, const char *b)
 {
@@ -32,11 +32,6 @@ static const BibField *FindField(const BibEntry *entry, const char *name)
 static int CountShown(const BibEntry *entry) // fields that get a row
 {
     return std::min<int>(entry->fieldCount, GRID_ROWS);
-}
-
-static int CountHidden(const BibEntry *entry) // the others
-{
-    return entry->fieldCount - CountShown(entry);
 }
 
 // --- Showing ---
@@ -407,49 +402,26 @@ bool Grid_HasRoom(const FieldGrid *grid)
 
 // --- Building ---
 
-// 1, or 0 when memory is out: some values are null then.
-static int BuildFields(BibField *field, const FieldGrid *grid)
+// With heap copies of the values; null where memory is out.
+static std::vector<BibField> Fields(const FieldGrid *grid)
 {
-    int complete = 1;
+    std::vector<BibField> fields;
     for (int i = 0; i < grid->count; ++i) {
         const GridRow *row = &grid->rows[i];
-        if (row->inherited)
-            continue;
-        *field = {Bib_FieldIndex(row->key.c_str()), row->companion, CopyValue(grid, row)};
-        complete &= field++->value != nullptr;
+        if (!row->inherited)
+            fields.push_back(
+                {Bib_FieldIndex(row->key.c_str()), row->companion, CopyValue(grid, row)});
     }
     for (int i = CountShown(grid->entry); i < grid->entry->fieldCount; ++i) {
         const BibField *hidden = &grid->entry->fields[i];
-        *field = {hidden->name, hidden->companion,
-                  Bib_CopyText(hidden->value, strlen(hidden->value))};
-        complete &= field++->value != nullptr;
+        fields.push_back(
+            {hidden->name, hidden->companion, Bib_CopyText(hidden->value, strlen(hidden->value))});
     }
-    return complete;
+    return fields;
 }
 
 BibEntry *Grid_Build(const FieldGrid *grid, int type)
 {
-    BibEntry *entry = Bib_AllocEntry(CountOwnRows(grid) + CountHidden(grid->entry));
-    if (!entry)
-        return nullptr;
-    entry->type = type;
-    entry->reserved = grid->entry->reserved;
-    entry->key = Bib_CopyText(grid->entry->key, strlen(grid->entry->key));
-    int complete = BuildFields(entry->fields, grid);
-    if (complete && entry->key)
-        return entry;
-    Bib_FreeEntry(entry);
-    return nullptr;
-}
-
-int Grid_Replace(BibFile *file, BibEntry *old, BibEntry *entry)
-{
-    BibEntry **link = Bib_FindLink(file, old);
-    if (!link)
-        return 0;
-    Outside_MoveEntry(file, old, entry);
-    entry->next = old->next;
-    *link = entry;
-    Bib_FreeEntry(old);
-    return 1;
+    std::vector<BibField> fields = Fields(grid);
+    return Change_MakeEntry(grid->entry, type, fields.data(), static_cast<int>(fields.size()));
 }

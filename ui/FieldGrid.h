@@ -124,7 +124,3 @@ bool Grid_HasRoom(const FieldGrid *grid);
 // The entry as the rows have it now, with hidden fields at the end; not linked yet. Null when
 // memory is out. Grid_HasRoom first.
 BibEntry *Grid_Build(const FieldGrid *grid, int type);
-
-// Puts a new entry in the place of an old one, which is freed. 0 when `old` is not of that file:
-// nothing is changed then.
-int Grid_Replace(BibFile *file, BibEntry *old, BibEntry *entry);

@@ -11,11 +11,11 @@
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/Changes.h"
 #include "session/Values.h"
-#include "ui/Cartulo.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
-#include "ui/QListBox.h"
+#include "ui/Status.h"
 #include "ui/Theme.h"
 
 static const char QuestionCaption[] = "Editing Preamble Question";
@@ -26,10 +26,10 @@ wxBEGIN_EVENT_TABLE(Cartulo_Preamble, wxDialog)
     EVT_BUTTON(wxID_OK, Cartulo_Preamble::OnOK)
 wxEND_EVENT_TABLE()
 
-Cartulo_Preamble::Cartulo_Preamble(Cartulo *panel)
-    : wxDialog(wxGetTopLevelParent(panel), wxID_ANY, "Editing Preamble", wxDefaultPosition,
-               wxDefaultSize, wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
-      m_panel(panel)
+Cartulo_Preamble::Cartulo_Preamble(wxWindow *parent, const BibFileSet *files)
+    : wxDialog(parent, wxID_ANY, "Editing Preamble", wxDefaultPosition, wxDefaultSize,
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
+      m_files(files)
 {
     SetFont(wxFontInfo(10));
     m_file = new wxChoice(this, ID_PREAMBLE_FILE);
@@ -49,15 +49,14 @@ Cartulo_Preamble::Cartulo_Preamble(Cartulo *panel)
 
 void Cartulo_Preamble::FillFiles()
 {
-    const BibFileSet *set = m_panel->Files();
-    if (set->count == 0) {
+    if (m_files->count == 0) {
         TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR);
         ShowEditable(false);
         return;
     }
-    for (int i = 0; i < set->count; ++i)
-        m_file->Append(ShortText(m_file, PathText(set->files[i]->baseName), DIALOG_ITEM));
-    CurrentPreamble = Preamble_FitFile(set, CurrentPreamble);
+    for (int i = 0; i < m_files->count; ++i)
+        m_file->Append(ShortText(m_file, PathText(m_files->files[i]->baseName), DIALOG_ITEM));
+    CurrentPreamble = Preamble_FitFile(m_files, CurrentPreamble);
     m_file->SetSelection(CurrentPreamble);
     UpdatePreamble();
 }
@@ -65,11 +64,10 @@ void Cartulo_Preamble::FillFiles()
 // Of files with one name, the last is shown, and chosen.
 void Cartulo_Preamble::UpdatePreamble()
 {
-    const BibFileSet *set = m_panel->Files();
-    const char *name = set->files[CurrentPreamble]->baseName;
+    const char *name = m_files->files[CurrentPreamble]->baseName;
     TNSMessage("INFO: Cartulo_Preamble::UpdatePreamble ", PathText(name).utf8_str(), TNS_ACTION);
-    CurrentPreamble = Preamble_FindFile(set, name);
-    const BibFile *file = set->files[CurrentPreamble];
+    CurrentPreamble = Preamble_FindFile(m_files, name);
+    const BibFile *file = m_files->files[CurrentPreamble];
     m_file->SetSelection(CurrentPreamble);
     m_file->SetToolTip(FileTip(file));
     m_filled = StoreText(file->preamble, Bib_Encoding(file));
@@ -89,14 +87,13 @@ void Cartulo_Preamble::ShowEditable(bool editable)
 
 const EncodingRecord *Cartulo_Preamble::Encoding() const
 {
-    return Bib_Encoding(m_panel->Files()->files[CurrentPreamble]);
+    return Bib_Encoding(m_files->files[CurrentPreamble]);
 }
 
 // The file that is shown; null when its preamble can't be changed.
 BibFile *Cartulo_Preamble::WritableFile() const
 {
-    const BibFileSet *set = m_panel->Files();
-    return set->count > 0 && m_text->IsEditable() ? set->files[CurrentPreamble] : nullptr;
+    return m_files->count > 0 && m_text->IsEditable() ? m_files->files[CurrentPreamble] : nullptr;
 }
 
 PreambleEdit Cartulo_Preamble::ReadEdit(const BibFile *file) const
@@ -130,10 +127,10 @@ bool Cartulo_Preamble::Allow(const std::string &reason)
     return reason.empty();
 }
 
-void Cartulo_Preamble::Store(BibFile *file, const PreambleEdit &edit)
+bool Cartulo_Preamble::Store(BibFile *file, const PreambleEdit &edit)
 {
-    Preamble_Store(file, edit);
-    m_panel->SetModified(CurrentPreamble);
+    return Change_SetPreamble(m_files, file, edit.text.c_str(), edit.places.data(),
+                              int(edit.places.size())) != 0;
 }
 
 // False when the user wants to stay, or has to.
@@ -150,17 +147,13 @@ bool Cartulo_Preamble::LeaveFile()
                               QuestionCaption, wxYES_NO | wxICON_QUESTION, this);
     if (answer != wxYES)
         return answer == wxNO;
-    bool stored = MayStore(edit) && Allow(Preamble_CheckMarks(edit.text));
-    if (stored)
-        Store(file, edit);
-    return stored;
+    return MayStore(edit) && Allow(Preamble_CheckMarks(edit.text)) && Store(file, edit);
 }
 
 // While it asks, the choice shows the file that it asks about.
 void Cartulo_Preamble::OnFile(wxCommandEvent &)
 {
-    const BibFileSet *set = m_panel->Files();
-    int chosen = Preamble_FindFile(set, set->files[m_file->GetSelection()]->baseName);
+    int chosen = Preamble_FindFile(m_files, m_files->files[m_file->GetSelection()]->baseName);
     m_file->SetSelection(CurrentPreamble);
     if (chosen == CurrentPreamble || !LeaveFile())
         return;
@@ -208,7 +201,7 @@ bool Cartulo_Preamble::Refuse(const std::vector<PreambleFault> &faults)
                  "What you typed can't be copied to the clipboard, so it stays here.");
         return false;
     }
-    ShowStatus(m_panel, "The preamble is as it was; what you typed is in the clipboard.");
+    ShowStatus(GetParent(), "The preamble is as it was; what you typed is in the clipboard.");
     return true;
 }
 
@@ -229,8 +222,7 @@ bool Cartulo_Preamble::Accept()
     std::vector<PreambleFault> faults = Preamble_Check(edit.text);
     if (!faults.empty())
         return Refuse(faults);
-    Store(file, edit);
-    return true;
+    return Store(file, edit);
 }
 
 void Cartulo_Preamble::OnOK(wxCommandEvent &event)

@@ -8,7 +8,6 @@
 
 #include "ui/PreambleText.h"
 
-class Cartulo;
 class wxChoice;
 class wxClipboardTextEvent;
 class wxTextCtrl;
@@ -18,7 +17,7 @@ enum { ID_PREAMBLE_FILE = 6001, ID_PREAMBLE_TEXT };
 class Cartulo_Preamble : public wxDialog
 {
 public:
-    explicit Cartulo_Preamble(Cartulo *panel); // outlives the dialog
+    Cartulo_Preamble(wxWindow *parent, const BibFileSet *files); // they outlive the dialog
 
 private:
     void FillFiles();
@@ -30,7 +29,7 @@ private:
     bool IsChanged(const BibFile *file, const PreambleEdit &edit) const;
     bool Allow(const std::string &reason);
     bool MayStore(const PreambleEdit &edit);
-    void Store(BibFile *file, const PreambleEdit &edit);
+    bool Store(BibFile *file, const PreambleEdit &edit);
     bool LeaveFile();
     bool Refuse(const std::vector<PreambleFault> &faults);
     bool Accept();
@@ -38,7 +37,7 @@ private:
     void OnPaste(wxClipboardTextEvent &event);
     void OnOK(wxCommandEvent &event);
 
-    Cartulo *m_panel;
+    const BibFileSet *m_files;
     wxChoice *m_file; // child windows
     wxTextCtrl *m_text;
     wxString m_filled; // what m_text was filled with

@@ -4,7 +4,6 @@
 #include <cstring>
 
 #include "session/Values.h"
-#include "store/BibOutside.h"
 
 int CurrentPreamble = 0;
 
@@ -148,7 +147,7 @@ PreambleEdit Preamble_Read(const std::wstring &typed, const char *stored,
     return edit;
 }
 
-// --- Checking and storing ---
+// --- Checking ---
 
 std::string Preamble_CheckSize(const std::string &text)
 {
@@ -177,10 +176,4 @@ std::string Preamble_CheckMarks(const std::string &text)
         return "";
     return "The marks of an abbreviation must be a pair around the name of one.\n"
            "Else the file could not be read any more.\n\nFix it to continue.";
-}
-
-void Preamble_Store(BibFile *file, const PreambleEdit &edit)
-{
-    Outside_MovePieces(file, edit.places.data(), static_cast<int>(edit.places.size()));
-    memcpy(file->preamble, edit.text.c_str(), edit.text.size() + 1);
 }

@@ -46,6 +46,3 @@ struct PreambleFault {
     const char *reason; // static text
 };
 std::vector<PreambleFault> Preamble_Check(const std::string &text);
-
-// The text is of an allowed size, and was read from what the file has.
-void Preamble_Store(BibFile *file, const PreambleEdit &edit);

@@ -10,7 +10,7 @@
 #include "base/Log.h"
 #include "base/Sys.h"
 #include "encoding/Encoding.h"
-#include "ui/Cartulo.h"
+#include "session/FileSet.h"
 #include "ui/DisplayText.h"
 
 wxBEGIN_EVENT_TABLE(QListBox, wxVListBox)
@@ -52,12 +52,12 @@ void QListBox::MeasureLineHeight()
 
 BibFile *const *QListBox::Files() const
 {
-    return m_owner ? m_owner->Files()->files : nullptr;
+    return m_files ? m_files->files : nullptr;
 }
 
 int QListBox::FileCount() const
 {
-    return m_owner ? m_owner->Files()->count : 0;
+    return m_files ? m_files->count : 0;
 }
 
 int QListBox::RowCount() const

@@ -10,6 +10,7 @@
 #include "ui/Status.h" // ShowStatus, ShowStatusError
 
 class Cartulo;
+struct BibFileSet;
 
 class QListBox : public wxVListBox
 {
@@ -19,6 +20,9 @@ public:
              const wxPoint &position = wxDefaultPosition, const wxSize &size = wxDefaultSize,
              long style = 0);
     ~QListBox() override;
+
+    // Whose entries the list shows: those of the panel. It outlives the list.
+    void SetFiles(const BibFileSet *files) { m_files = files; }
 
     // Rebuilds the rows and selects that of `select`, else the first; raises no event. Call after
     // every change of entries or of the filter (store text). Returns 1, or 0 when no file is open
@@ -46,8 +50,9 @@ private:
 
     int m_lineHeight = 12;
     int m_itemCount = 0;
-    Cartulo *m_owner = nullptr;   // the panel; outlives the list
-    IndexItem *m_index = nullptr; // ours, malloc'd
+    Cartulo *m_owner = nullptr;          // the panel; outlives the list
+    const BibFileSet *m_files = nullptr; // of the panel
+    IndexItem *m_index = nullptr;        // ours, malloc'd
     TypeAhead m_typeAhead;
 
     wxDECLARE_EVENT_TABLE();

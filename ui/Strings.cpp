@@ -10,13 +10,13 @@
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/Changes.h"
 #include "session/Values.h"
-#include "ui/Cartulo.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/Icons.h"
 #include "ui/Native.h"
-#include "ui/QListBox.h"
+#include "ui/Status.h"
 
 static const char Caption[] = "Editing Strings"; // also of the boxes
 
@@ -32,10 +32,11 @@ wxBEGIN_EVENT_TABLE(Cartulo_Strings, wxDialog)
     EVT_CHAR_HOOK(Cartulo_Strings::OnCharHook)
 wxEND_EVENT_TABLE()
 
-Cartulo_Strings::Cartulo_Strings(Cartulo *panel, wxTextCtrl *target)
-    : wxDialog(wxGetTopLevelParent(panel), wxID_ANY, Caption, wxDefaultPosition, wxDefaultSize,
+Cartulo_Strings::Cartulo_Strings(wxWindow *parent, const BibFileSet *files, const std::string &ini,
+                                 wxTextCtrl *target)
+    : wxDialog(parent, wxID_ANY, Caption, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER),
-      m_panel(panel), m_target(target), m_sources(Strings_Sources(panel->Files(), panel->Ini()))
+      m_target(target), m_sources(Strings_Sources(files, ini))
 {
     TNSMessage("INFO: Cartulo_Strings::Cartulo_Strings ", "Initialize", TNS_LIFECYCLE);
     SetFont(wxFontInfo(10));
@@ -201,9 +202,8 @@ void Cartulo_Strings::OnAdd(wxCommandEvent &)
     if (dialog.ShowModal() != wxID_OK)
         return;
     UpdateStrings();
-    m_panel->SetModified(CurrentStringSource);
     Select(int(m_lines.size()) - 1);
-    ShowStatus(m_panel, "");
+    ShowStatus(GetParent(), "");
 }
 
 void Cartulo_Strings::OnEdit(wxCommandEvent &)
@@ -218,8 +218,7 @@ void Cartulo_Strings::OnEdit(wxCommandEvent &)
     UpdateStrings();
     if (!dialog.IsChanged())
         return;
-    m_panel->SetModified(CurrentStringSource);
-    ShowStatus(m_panel, "");
+    ShowStatus(GetParent(), "");
 }
 
 void Cartulo_Strings::OnRemove(wxCommandEvent &)
@@ -229,10 +228,10 @@ void Cartulo_Strings::OnRemove(wxCommandEvent &)
     if (!string)
         return;
     wxString line = m_list->GetStringSelection();
-    String_Remove(WritableFile(), string);
+    if (!Change_RemoveString(m_sources.set, WritableFile(), string))
+        return;
     UpdateStrings();
-    m_panel->SetModified(CurrentStringSource);
-    ShowStatus(m_panel, "The string is deleted: " + line);
+    ShowStatus(GetParent(), "The string is deleted: " + line);
 }
 
 void Cartulo_Strings::OnActivate(wxCommandEvent &)
@@ -268,7 +267,7 @@ void Cartulo_Strings::OnOK(wxCommandEvent &event)
         return;
     }
     TNSMessage("WARNING: ", "Cartulo_Strings::OnOK has no selection.", TNS_WARNING);
-    ShowStatus(m_panel, "Nothing was inserted, as no string was selected.");
+    ShowStatus(GetParent(), "Nothing was inserted, as no string was selected.");
 }
 
 // On keyboards with other letters, the Latin one of the key.
@@ -290,7 +289,7 @@ void Cartulo_Strings::OnKeyUp(wxKeyEvent &event)
 bool Cartulo_Strings::MayChange()
 {
     if (!WritableFile())
-        ShowStatusError(m_panel, "Choose a file that can be written to change its strings.");
+        ShowStatusError(GetParent(), "Choose a file that can be written to change its strings.");
     return WritableFile() != nullptr;
 }
 
@@ -429,7 +428,7 @@ bool Cartulo_Strings_Edit::Add()
     std::string value = Value_Read(m_value->GetValue().ToStdWstring(), m_encoding);
     if (!AcceptValue(value))
         return false;
-    m_isChanged = String_Add(m_file, key.text.c_str(), value.c_str()) != 0;
+    m_isChanged = Change_AddString(m_sources->set, m_file, key.text.c_str(), value.c_str()) != 0;
     return m_isChanged || RefuseForMemory();
 }
 
@@ -440,7 +439,7 @@ bool Cartulo_Strings_Edit::Edit()
         return true;
     if (!AcceptValue(value))
         return false;
-    m_isChanged = String_SetValue(m_string, value.c_str()) != 0;
+    m_isChanged = Change_SetString(m_sources->set, m_file, m_string, value.c_str()) != 0;
     return m_isChanged || RefuseForMemory();
 }
 

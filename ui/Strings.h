@@ -8,7 +8,6 @@
 
 #include "ui/StringRules.h"
 
-class Cartulo;
 class wxChoice;
 class wxListBox;
 class wxTextCtrl;
@@ -16,9 +15,11 @@ class wxTextCtrl;
 class Cartulo_Strings : public wxDialog
 {
 public:
-    // "Insert" puts the selected abbreviation into `target`, at its cursor; null: there is nothing
-    // to insert into. Both outlive the dialog.
-    Cartulo_Strings(Cartulo *panel, wxTextCtrl *target);
+    // For the abbreviations of the files and of the lists in the INI file. "Insert" puts the
+    // selected one into `target`, at its cursor; null: there is nothing to insert into. All outlive
+    // the dialog.
+    Cartulo_Strings(wxWindow *parent, const BibFileSet *files, const std::string &ini,
+                    wxTextCtrl *target);
 
     BibFile *WritableFile() const; // of the list, where that can be changed; null for none
     const StringSources *Sources() const { return &m_sources; }
@@ -44,7 +45,6 @@ private:
     bool MayChange();
     void OnKeyUp(wxKeyEvent &event);
 
-    Cartulo *m_panel;
     wxTextCtrl *m_target;
     StringSources m_sources;
     std::vector<StringLine> m_lines; // of the list

@@ -19,7 +19,6 @@
 #include <wx/timer.h>
 
 #include "app/Ipc.h"
-#include "app/IpcConnection.h"
 #include "app/IpcMessage.h"
 #include "app/IpcServer.h"
 #include "base/Companion.h"
