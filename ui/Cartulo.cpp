@@ -25,6 +25,7 @@
 #include "session/Values.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
+#include "ui/EntryPane.h"
 #include "ui/Icons.h"
 #include "ui/Ids.h"
 #include "ui/Messages.h"
@@ -36,11 +37,9 @@
 #include "ui/Strings.h"
 #include "ui/Theme.h"
 
-enum { SASH_POSITION = 300, SMALLEST_PANE = 20, HELP_HEIGHT = 40 };
-enum { SMALLEST_VALUE = 60 };                         // width that is left in the narrowest window
+enum { SASH_POSITION = 300, SMALLEST_PANE = 20, BLANK_BORDER = 8 };
 static const char SashKey[] = "/MainWindow/Splitter"; // in the toolkit's configuration
 static const double LIST_SHARE = 0.35;                // of what the window grows or shrinks
-static const Colour HeadingColour = {0, 0, 100};
 
 // Every command comes from a button or as a tool, key or menu.
 #define ON_COMMAND(id, handler) EVT_BUTTON(id, handler) EVT_MENU(id, handler)
@@ -88,13 +87,22 @@ static wxWindow *AddButton(wxWindow *parent)
     return button;
 }
 
+// As soon as what goes on now is done.
+static void ForceMessages(wxWindow *panel)
+{
+    TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
+    panel->GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, ID_MESSAGES));
+}
+
 Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     : wxSplitterWindow(parent, ID_SPLITTER, wxDefaultPosition, parent->GetClientSize(),
                        wxSP_3D | wxSP_LIVE_UPDATE, "splitter"),
       m_state(state)
 {
-    m_set.box = ShowBox;
-    m_set.changed = OnChanged;
+    m_set.box = [](void *owner, const char *caption, const char *text) {
+        Box_Warn(static_cast<Cartulo *>(owner), caption, PathText(text));
+    };
+    m_set.changed = [](void *owner) { static_cast<Cartulo *>(owner)->UpdateSaveTool(); };
     m_set.owner = this;
     ReadSchema();
     AppLog("IFNO: Cartulo::Cartulo ", "Parse_Command_Line");
@@ -105,7 +113,7 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     m_list = new QListBox(this, this, ID_INDEX, wxDefaultPosition, wxDefaultSize, wxBORDER_STATIC);
     m_list->SetFiles(&m_set);
     m_list->Update_Index(nullptr, m_search.c_str());
-    CreateEntryPane();
+    m_entryPane = new EntryPane(this, &m_grid, [this] { FocusForMode(); });
     Arrange();
     ClearEntry();
     if (m_list->Item(0))
@@ -130,158 +138,54 @@ void Cartulo::ReadSchema()
 {
     m_ini = Schema_FindIni();
     if (!Schema_SelectEncoding(m_ini.c_str(), &m_set))
-        ForceMessages();
+        ForceMessages(this);
     m_name = Schema_ApplicationName(m_ini.c_str());
     Bib_Initialize();
     Schema_RegisterTypes(m_ini.c_str());
 }
 
-wxStaticText *Cartulo::CreateHeading(wxWindow *parent, const wxString &text)
-{
-    wxStaticText *heading =
-        new wxStaticText(parent, wxID_ANY, text, wxDefaultPosition, wxDefaultSize,
-                         wxALIGN_CENTRE_HORIZONTAL | wxST_ELLIPSIZE_END);
-    heading->SetFont(heading->GetFont().Bold());
-    Theme_SetTextColour(heading, HeadingColour);
-    return heading;
-}
-
-// File, type, and the rows of the fields, as they are needed.
-wxSizer *Cartulo::CreateFieldGrid()
-{
-    wxFlexGridSizer *grid = new wxFlexGridSizer(3, wxSize(FromDIP(COLUMN_GAP), 0));
-    m_fields = grid;
-    grid->AddGrowableCol(1);
-    wxSizerFlags labelPlace = wxSizerFlags().CentreVertical();
-    grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "BIB File:"), labelPlace);
-    m_fileName = new wxStaticText(m_entryPane, wxID_ANY, "file-name.bib", wxDefaultPosition,
-                                  wxDefaultSize, wxST_ELLIPSIZE_START | wxST_NO_AUTORESIZE);
-    m_fileName->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
-    grid->Add(m_fileName, wxSizerFlags().Expand().Border(wxTOP | wxBOTTOM, FromDIP(4)));
-    grid->AddSpacer(0);
-    grid->Add(new wxStaticText(m_entryPane, wxID_ANY, "Entry Type:"), labelPlace);
-    m_type = new wxChoice(m_entryPane, ID_TYPE);
-    m_type->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
-    m_type->Disable();
-    grid->Add(m_type, wxSizerFlags().Expand());
-    grid->AddSpacer(0);
-    return grid;
-}
-
-void Cartulo::CreateRow(int index)
-{
-    FieldRow &row = m_rows[index];
-    row.label = new wxStaticText(m_entryPane, wxID_ANY, "Field:", wxDefaultPosition, wxDefaultSize,
-                                 wxST_ELLIPSIZE_END | wxST_NO_AUTORESIZE);
-    row.value = new wxTextCtrl(m_entryPane, wxID_ANY, "FieldValue");
-    row.value->SetForegroundColour(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
-    row.value->SetMinSize(FromDIP(wxSize(SMALLEST_VALUE, -1)));
-    row.remove = new xBitmapButton(m_entryPane, ID_REMOVE_ROW + index, "&Delete", "list-remove");
-    row.remove->SetToolTip("Delete the field");
-    wxWindow *before = m_type;
-    if (index > 0)
-        before = m_rows[index - 1].remove;
-    row.label->MoveAfterInTabOrder(before);
-    row.value->MoveAfterInTabOrder(row.label);
-    row.remove->MoveAfterInTabOrder(row.value);
-    m_fields->Add(row.label, wxSizerFlags().CentreVertical());
-    m_fields->Add(row.value, wxSizerFlags().Expand());
-    m_fields->Add(row.remove, wxSizerFlags().CentreVertical());
-}
-
-// Most entries have few fields, and controls take their time. GTK animates a button that is made in
-// a window on the screen into its shape, and tells sizes from amid that: all get that of the first,
-// which is made before.
-void Cartulo::CreateRows(int count)
-{
-    if (m_rowCount >= count)
-        return;
-    for (; m_rowCount < count; ++m_rowCount) {
-        CreateRow(m_rowCount);
-        m_rows[m_rowCount].remove->SetMinSize(m_rows[0].remove->GetBestSize());
-    }
-    // Tab has to know the rows at once, not when there is nothing else to do.
-    m_entryPane->OnInternalIdle();
-}
-
-void Cartulo::CreateEntryPane()
-{
-    m_entryPane = new wxScrolledWindow(this, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                                       wxBORDER_STATIC | wxTAB_TRAVERSAL | wxVSCROLL);
-    wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
-    wxSizerFlags place = wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER));
-    column->Add(CreateHeading(m_entryPane, "Records of currently selected bibliography entry"),
-                place);
-    column->Add(CreateFieldGrid(), place);
-    CreateRows(1);
-    m_moreFields = new wxStaticText(m_entryPane, wxID_ANY, "");
-    column->Add(m_moreFields, place);
-    column->Add(CreateNewFieldRow(), place);
-    m_noteLine = new wxBoxSizer(wxVERTICAL);
-    column->Add(m_noteLine, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, FromDIP(PANE_BORDER)));
-    m_help = new wxTextCtrl(m_entryPane, wxID_ANY, "Ctrl+F1 to help", wxDefaultPosition,
-                            wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY | wxTE_NO_VSCROLL);
-    m_help->SetMinSize(FromDIP(wxSize(-1, HELP_HEIGHT)));
-    column->Add(m_help, wxSizerFlags(place).Proportion(1));
-    m_entryPane->SetSizer(column);
-    m_entryPane->SetScrollRate(0, FromDIP(16));
-    Native_KeepScrollBars(m_entryPane);
-    m_entryPane->Bind(wxEVT_SIZE, &Cartulo::OnEntrySize, this);
-    m_type->Bind(wxEVT_MOUSEWHEEL, &Cartulo::OnWheel, this);
-    m_newFieldKey->Bind(wxEVT_MOUSEWHEEL, &Cartulo::OnWheel, this);
-    m_entryPane->Hide();
-}
+// --- Panes ---
 
 // A pane with a text above a button, in the middle.
-wxPanel *Cartulo::CreateBlankPane(const wxString &text, wxWindow *(*createButton)(wxWindow *parent))
+static wxPanel *CreateBlankPane(wxWindow *parent, const wxString &text,
+                                wxWindow *(*createButton)(wxWindow *parent))
 {
-    wxPanel *pane = new wxPanel(this, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+    wxPanel *pane = new wxPanel(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                                 wxBORDER_NONE | wxTAB_TRAVERSAL);
+    const int border = parent->FromDIP(BLANK_BORDER);
     wxBoxSizer *column = new wxBoxSizer(wxVERTICAL);
     column->AddStretchSpacer();
-    column->Add(CreateHeading(pane, text),
-                wxSizerFlags().Expand().Border(wxALL, FromDIP(PANE_BORDER)));
-    column->Add(createButton(pane), wxSizerFlags().Centre().Border(wxALL, FromDIP(PANE_BORDER)));
+    column->Add(Theme_CreateHeading(pane, text), wxSizerFlags().Expand().Border(wxALL, border));
+    column->Add(createButton(pane), wxSizerFlags().Centre().Border(wxALL, border));
     column->AddStretchSpacer();
     pane->SetSizer(column);
     pane->Hide();
     return pane;
 }
 
-// --- Panes ---
-
-wxWindow *Cartulo::OpenPane()
+// PANE_OPEN or PANE_NEW.
+wxWindow *Cartulo::BlankPane(int pane)
 {
-    if (!m_openPane)
-        m_openPane =
-            CreateBlankPane("To open TeX Bibliography file (BIB) click the button:", OpenButton);
-    return m_openPane;
-}
-
-wxWindow *Cartulo::NewPane()
-{
-    if (!m_newPane)
-        m_newPane = CreateBlankPane("To add new enrty click the button:", AddButton);
-    return m_newPane;
+    if (pane == PANE_OPEN && !m_openPane)
+        m_openPane = CreateBlankPane(
+            this, "To open TeX Bibliography file (BIB) click the button:", OpenButton);
+    if (pane == PANE_NEW && !m_newPane)
+        m_newPane = CreateBlankPane(this, "To add new enrty click the button:", AddButton);
+    return pane == PANE_OPEN ? m_openPane : m_newPane;
 }
 
 // The panes that fit what is open.
 void Cartulo::Arrange()
 {
     int pane = Panel_Pane(m_set.count, int(m_list->GetItemCount()));
+    wxWindow *window = pane == PANE_ENTRY ? m_entryPane : BlankPane(pane);
     if (pane == PANE_OPEN)
-        ShowAlone(OpenPane());
+        ShowAlone(window);
     else if (IsSplit())
-        ReplacePane(pane == PANE_NEW ? NewPane() : m_entryPane);
+        ReplacePane(window);
     else
-        Split(pane == PANE_NEW ? NewPane() : m_entryPane);
+        Split(window);
     Layout();
-}
-
-void Cartulo::RefreshPane()
-{
-    if (IsSplit() && m_set.count > 0)
-        Arrange();
 }
 
 void Cartulo::ShowAlone(wxWindow *pane)
@@ -305,7 +209,7 @@ void Cartulo::Split(wxWindow *pane)
     if (m_openPane)
         m_openPane->Hide();
     pane->Show();
-    SplitVertically(m_list, pane, FromDIP(SashPosition()));
+    SplitVertically(m_list, pane, FromDIP(m_sashPosition > 0 ? m_sashPosition : SASH_POSITION));
 }
 
 void Cartulo::ReplacePane(wxWindow *pane)
@@ -324,11 +228,6 @@ void Cartulo::ReplacePane(wxWindow *pane)
 void Cartulo::HoldSash(bool hold)
 {
     SetSashGravity(hold ? 0 : LIST_SHARE);
-}
-
-int Cartulo::SashPosition() const
-{
-    return m_sashPosition > 0 ? m_sashPosition : SASH_POSITION;
 }
 
 void Cartulo::KeepSashPosition()
@@ -355,21 +254,6 @@ bool Cartulo::TryBefore(wxEvent &event)
         return wxSplitterWindow::TryBefore(event);
     ShowStatus(this, "Cartulo waits for an answer, or is busy with the files: please try again.");
     return true;
-}
-
-void Cartulo::ShowBox(void *owner, const char *caption, const char *text)
-{
-    static_cast<Cartulo *>(owner)->ShowWarning(caption, PathText(text));
-}
-
-void Cartulo::OnChanged(void *owner)
-{
-    static_cast<Cartulo *>(owner)->UpdateSaveTool();
-}
-
-void Cartulo::ShowWarning(const wxString &caption, const wxString &text)
-{
-    Box_Warn(wxGetTopLevelParent(this), caption, text);
 }
 
 // 1 when the record, which was at `path`, is still in the set; it may have been freed.
@@ -405,14 +289,8 @@ int Cartulo::ProcessCommand(const char *commandLine, const char *)
     if (m_messages)
         m_messages->Fill(&m_set);
     if (result.errors != 0)
-        ForceMessages();
+        ForceMessages(this);
     return 0;
-}
-
-void Cartulo::ForceMessages()
-{
-    TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
-    GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, ID_MESSAGES));
 }
 
 void Cartulo::ShowOpenFiles()
@@ -439,8 +317,9 @@ void Cartulo::OpenFile(const std::string &path)
 {
     std::string commandLine = Command_Quote(path.c_str());
     if (commandLine.empty()) {
-        ShowWarning("Open BIB file", "A file whose path holds both ' and \" can't be opened:\n\n" +
-                                         PathText(path.c_str()));
+        Box_Warn(this, "Open BIB file",
+                 "A file whose path holds both ' and \" can't be opened:\n\n" +
+                     PathText(path.c_str()));
         return;
     }
     ProcessCommand(commandLine.c_str(), "OnOpen");
@@ -479,13 +358,13 @@ void Cartulo::OnShowMessages(wxCommandEvent &)
 // A field that can be edited gets what is chosen.
 void Cartulo::OnEditStrings(wxCommandEvent &)
 {
-    int row = RowWithFocus(m_grid.count);
+    int row = m_entryPane->RowWithFocus(m_grid.count);
     TNSMessage("INFO: Cartulo::OnEditStrings, mode=", row < 0 ? "Edit" : "Insert", TNS_ACTION);
     Cartulo_Strings dialog(wxGetTopLevelParent(this), &m_set, m_ini,
-                           row < 0 ? nullptr : m_rows[row].value);
+                           row < 0 ? nullptr : m_entryPane->Value(row));
     dialog.ShowModal();
     if (row >= 0)
-        FocusRow(row);
+        m_entryPane->FocusRow(row);
 }
 
 void Cartulo::OnEditPreamble(wxCommandEvent &)
@@ -550,23 +429,14 @@ void Cartulo::SetModified(int file)
     UpdateSaveTool();
 }
 
-// wxYES, wxNO or wxCANCEL.
-int Cartulo::AskToSave()
-{
-    m_busy = true; // another program may be activated meanwhile: nothing is saved before the answer
-    int answer = wxMessageBox(PathText(Panel_SaveQuestion(&m_set).c_str()),
-                              "Save Bibliography File - Question",
-                              wxYES_NO | wxCANCEL | wxICON_QUESTION, wxGetTopLevelParent(this));
-    m_busy = false;
-    return answer;
-}
-
 int Cartulo::SaveAll(bool quiet)
 {
     TNSMessage("INFO: Cartulo::SaveAll", "", TNS_ACTION);
     if (m_busy || FileSet_ModifiedCount(&m_set) == 0)
         return 0;
-    int answer = quiet ? wxYES : AskToSave();
+    int answer = quiet ? int(wxYES)
+                       : Ask("Save Bibliography File - Question",
+                             PathText(Panel_SaveQuestion(&m_set).c_str()), wxYES_NO | wxCANCEL);
     if (answer != wxYES)
         return answer == wxNO ? 0 : -1;
     m_busy = true;
@@ -589,8 +459,8 @@ void Cartulo::OnSave(wxCommandEvent &)
 {
     int saved = SaveAll(true);
     if (saved == 0 && FileSet_ModifiedCount(&m_set) != 0)
-        ShowWarning("Save Bibliography File",
-                    "These Bib-files can't be saved:\n\n" + UnsavedText());
+        Box_Warn(this, "Save Bibliography File",
+                 "These Bib-files can't be saved:\n\n" + UnsavedText());
     else if (m_editMode)
         ShowStatus(this, "The entry that you edit is not saved yet: finish it first, with Esc.");
     else if (saved == 1)
@@ -615,7 +485,8 @@ void Cartulo::OnSearch(wxCommandEvent &event)
     ShowStatus(this, found ? "" : "No entry holds this text.");
     if (m_editMode)
         return; // the entry that is edited stays, found or not
-    RefreshPane();
+    if (m_set.count > 0)
+        Arrange();
     ShowSelection();
 }
 

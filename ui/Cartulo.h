@@ -1,8 +1,7 @@
 // ui/Cartulo.h - the editor panel: the entry list at the left, the selected entry at the right.
 #pragma once
 
-#include <wx/scrolwin.h>
-#include <wx/sizer.h>
+#include <wx/panel.h>
 #include <wx/splitter.h>
 
 #include <string>
@@ -12,13 +11,8 @@
 #include "ui/FieldGrid.h"
 
 class Cartulo_Messages;
+class EntryPane;
 class QListBox;
-class xBitmapButton;
-class wxButton;
-class wxChoice;
-class wxComboBox;
-class wxStaticText;
-class wxTextCtrl;
 
 class Cartulo : public wxSplitterWindow
 {
@@ -71,78 +65,35 @@ public:
     void OnIndexActivate(wxCommandEvent &event); // a row was double-clicked
 
 private:
-    enum { COLUMN_GAP = 8, PANE_BORDER = 8 }; // of the entry pane
-
-    struct FieldRow {
-        wxStaticText *label;
-        wxTextCtrl *value;
-        xBitmapButton *remove;
-    };
-
     void ReadSchema();
-    void ForceMessages();
-    void CreateEntryPane();
-    wxSizer *CreateFieldGrid();
-    void CreateRow(int index);
-    void CreateRows(int count);
-    wxSizer *CreateNewFieldRow();
-    wxPanel *CreateBlankPane(const wxString &text, wxWindow *(*createButton)(wxWindow *parent));
-    wxStaticText *CreateHeading(wxWindow *parent, const wxString &text);
-    wxWindow *OpenPane();
-    wxWindow *NewPane();
+    wxWindow *BlankPane(int pane);
     void Split(wxWindow *pane);
     void Arrange();
-    void RefreshPane();
     void ShowAlone(wxWindow *pane);
     void ReplacePane(wxWindow *pane);
-    int SashPosition() const;
     void KeepSashPosition();
     void OpenFile(const std::string &path);
     void ShowSelection();
     void ClearEntry();
-    void FillRow(int row);
-    void FillRows();
-    void FitRow(int row);
-    void ReadRows();
-    void WriteRow(int row);
-    void WriteRows();
-    void HideRow(int row);
-    void ShowMoreFields();
-    void ShowEditControls();
-    void LayOutEntry();
-    wxSizerFlags PlaceInRow() const;
-    int NewFieldRoom() const;
-    void PlaceNote();
     void SetEditMode(bool on);
     void FocusForMode();
-    int FocusedRow() const;
-    int RowWithFocus(int count) const;
-    void KeepFocus(int row);
-    void FocusRow(int row);
     void ToggleEditing();
     void FollowList();
     void CommitEntry();
     bool Commit();
-    int Ask(const wxString &text, int buttons);
+    int Ask(const wxString &caption, const wxString &text, int buttons);
     bool TakeType(int *type);
     bool AcceptLosses();
     bool CheckRows();
     bool ReplaceEntry(int type);
     void AddField(const std::string &key);
-    wxString KeyText(int row) const;
-    void LogRow(const char *prefix, int row) const;
     int RowForCommand(const char *logPrefix);
     void RemoveRow(int row);
     const EncodingRecord *Encoding() const; // of the current entry
-    void SelectInList(BibEntry *entry);
     void ShowChanged(BibEntry *entry);
     void RemoveEntry(int row);
     void UpdateSaveTool();
     void ShowRow(const char *handler);
-    int AskToSave();
-    void ShowWarning(const wxString &caption, const wxString &text);
-    static void ShowBox(void *owner, const char *caption, const char *text);
-    static void OnChanged(void *owner);
 
     void OnOpen(wxCommandEvent &event);
     void OnSave(wxCommandEvent &event);
@@ -160,8 +111,6 @@ private:
     void OnEditField(wxCommandEvent &event);
     void OnRenameField(wxCommandEvent &event);
     void OnRemoveField(wxCommandEvent &event);
-    void OnEntrySize(wxSizeEvent &event);
-    void OnWheel(wxMouseEvent &event);
     void OnSashMove(wxSplitterEvent &event);
     void OnPaint(wxPaintEvent &event);
     bool TryBefore(wxEvent &event) override;
@@ -174,34 +123,19 @@ private:
     std::wstring m_searchText;   // what the search field holds
     std::string m_search;        // the same in the selected encoding
     bool m_isPainted = false;
+    FieldGrid m_grid = {};   // what the entry pane shows
     bool m_editMode = false; // else the list is in use
     bool m_busy = false;     // see IsBusy
     int m_dialogResult = 0;
-    int m_wheelRest = 0; // of a line that the mouse wheel has not turned yet
-    std::string m_ini;   // path of the INI file with the entry types
-    std::string m_name;  // of the application, from there
-    int m_sashPosition;  // of the split window, kept while it is not split
+    std::string m_ini;  // path of the INI file with the entry types
+    std::string m_name; // of the application, from there
+    int m_sashPosition; // of the split window, kept while it is not split
 
     QListBox *m_list = nullptr; // child windows, made after the first files are loaded
-    wxScrolledWindow *m_entryPane = nullptr;
+    EntryPane *m_entryPane = nullptr;
     wxPanel *m_openPane = nullptr; // these two when they are needed
     wxPanel *m_newPane = nullptr;
     Cartulo_Messages *m_messages = nullptr; // while it is open
-    wxStaticText *m_fileName = nullptr;
-    wxChoice *m_type = nullptr;
-    wxSizer *m_fields = nullptr; // of the rows
-    FieldRow m_rows[GRID_ROWS] = {};
-    int m_rowCount = 0;                   // of those that are made
-    FieldGrid m_grid = {};                // what they show
-    wxStaticText *m_moreFields = nullptr; // how many fields found no row
-    wxStaticText *m_newFieldLabel = nullptr;
-    wxComboBox *m_newFieldKey = nullptr;
-    xBitmapButton *m_newField = nullptr;
-    wxStaticText *m_missingFields = nullptr;
-    wxButton *m_done = nullptr;
-    wxTextCtrl *m_help = nullptr;
-    wxSizer *m_newFieldRow = nullptr; // sizers of the entry pane
-    wxSizer *m_noteLine = nullptr;    // below it, for a long note on missing fields
 
     wxDECLARE_EVENT_TABLE();
 };

@@ -7,6 +7,7 @@
 #include "base/Log.h"
 #include "session/Changes.h"
 #include "session/EntryRules.h"
+#include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/EntryDialogs.h"
 #include "ui/QListBox.h"
@@ -43,18 +44,13 @@ void Cartulo::OnRenameEntry(wxCommandEvent &)
     ShowChanged(dialog.Changed());
 }
 
+// Brings the list up to date. Where it has not got this entry, the first row is selected.
 void Cartulo::ShowChanged(BibEntry *entry)
 {
-    SelectInList(entry);
+    m_list->Update_Index(entry, m_search.c_str());
+    Arrange();
     ShowSelection();
     FocusList();
-}
-
-// Brings the list up to date. Where it has not got this entry, the first row is selected.
-void Cartulo::SelectInList(BibEntry *entry)
-{
-    m_list->Update_Index(entry, m_search.c_str());
-    RefreshPane();
 }
 
 void Cartulo::OnRemoveEntry(wxCommandEvent &)
@@ -93,11 +89,11 @@ void Cartulo::RemoveEntry(int row)
     AppLog("Delete Entry: ", m_entry->key);
     std::string referrers = Entry_Referrers(file, m_entry);
     if (!referrers.empty()) {
-        ShowWarning("Removing Bibliography Entry",
-                    "The entry `" + StoreText(m_entry->key, Encoding()) +
-                        "' can't be removed, because following entries:\n\n" +
-                        StoreText(referrers.c_str(), Encoding()) +
-                        ".\n\nrefer it in `crossref' field.");
+        Box_Warn(this, "Removing Bibliography Entry",
+                 "The entry `" + StoreText(m_entry->key, Encoding()) +
+                     "' can't be removed, because following entries:\n\n" +
+                     StoreText(referrers.c_str(), Encoding()) +
+                     ".\n\nrefer it in `crossref' field.");
         return;
     }
     BibEntry *next = EntryIndex_Next(m_list->Item(0), int(m_list->GetItemCount()), row);
@@ -105,8 +101,5 @@ void Cartulo::RemoveEntry(int row)
     if (!Change_RemoveEntry(&m_set, file, m_entry))
         return;
     m_entry = nullptr;
-    SelectInList(next);
-    ShowSelection();
-    m_list->Refresh();
-    FocusList();
+    ShowChanged(next);
 }

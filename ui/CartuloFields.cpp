@@ -12,6 +12,7 @@
 #include "session/Names.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
+#include "ui/EntryPane.h"
 #include "ui/FieldDialogs.h"
 #include "ui/Ids.h"
 #include "ui/PanelRules.h"
@@ -20,29 +21,9 @@
 static const char AddTitle[] = "Adding New Field";
 static_assert(ID_REMOVE_ROW_END - ID_REMOVE_ROW == GRID_ROWS);
 
-// The row whose value has the focus; -1 for none, and for rows that the stored entry does not have.
-int Cartulo::FocusedRow() const
+static void LogRow(const char *prefix, int row, const wxString &key)
 {
-    return RowWithFocus(std::min(Grid_StoredRows(&m_grid), m_grid.count));
-}
-
-// Among the first `count` ones; -1 for none.
-int Cartulo::RowWithFocus(int count) const
-{
-    for (int i = 0; i < count; ++i)
-        if (m_rows[i].value->HasFocus())
-            return i;
-    return -1;
-}
-
-wxString Cartulo::KeyText(int row) const
-{
-    return StoreText(m_grid.rows[row].key.c_str(), m_grid.encoding);
-}
-
-void Cartulo::LogRow(const char *prefix, int row) const
-{
-    wxString text = wxString::Format("k=%d, name=", row) + KeyText(row);
+    wxString text = wxString::Format("k=%d, name=", row) + key;
     TNSMessage(prefix, text.utf8_str(), TNS_ACTION);
 }
 
@@ -53,50 +34,52 @@ void Cartulo::OnNewField(wxCommandEvent &)
     TNSMessage("INFO: Cartulo::OnNewField", "", TNS_ACTION);
     if (!m_editMode || !m_entry)
         return;
-    TypedName key = Name_Read(m_newFieldKey->GetValue().ToStdWstring().c_str(), m_grid.encoding);
+    TypedName key =
+        Name_Read(m_entryPane->NewKey()->GetValue().ToStdWstring().c_str(), m_grid.encoding);
     switch (Name_Check(key)) {
     case NAME_EMPTY:
-        ShowWarning(AddTitle, "Field key is undefined.\nPlease enter key name or choose some "
-                              "standard value in list of combo box.");
+        Box_Warn(this, AddTitle,
+                 "Field key is undefined.\nPlease enter key name or choose some "
+                 "standard value in list of combo box.");
         break;
     case NAME_BAD_CHARS: // only the window for another name removes them
-        Box_WarnOrCancel(wxGetTopLevelParent(this), AddTitle, FieldKey_BadCharsText);
+        Box_WarnOrCancel(this, AddTitle, FieldKey_BadCharsText);
         break;
     case NAME_MISFIT:
-        ShowWarning(AddTitle, Name_MisfitText(key));
+        Box_Warn(this, AddTitle, Name_MisfitText(key));
         break;
     case NAME_UNWRITABLE:
-        ShowWarning(AddTitle, FieldKey_UnwritableText);
+        Box_Warn(this, AddTitle, FieldKey_UnwritableText);
         break;
     case NAME_OK:
     case NAME_TAKEN: // told when it is added
         AddField(key.text);
         return;
     }
-    m_newFieldKey->SetFocus();
+    m_entryPane->NewKey()->SetFocus();
 }
 
 void Cartulo::AddField(const std::string &key)
 {
     AppLog("Adding field: ", key.c_str());
     int row = 0;
-    ReadRows();
+    m_entryPane->ReadRows();
     switch (Grid_Add(&m_grid, key.c_str(), &row)) {
     case GRID_FULL:
-        ShowWarning(AddTitle, "Sorry, you can't add more fields because of limitation");
+        Box_Warn(this, AddTitle, "Sorry, you can't add more fields because of limitation");
         return;
     case GRID_EXISTS:
-        ShowWarning(AddTitle, FieldKey_TakenText);
+        Box_Warn(this, AddTitle, FieldKey_TakenText);
         return;
     case GRID_ADDED:
     case GRID_OVERRIDDEN:
         break;
     }
-    WriteRows();
+    m_entryPane->WriteRows();
     CheckMandatoryFields(m_grid.count - 1);
-    LayOutEntry();
-    if (m_rows[row].value->IsEnabled())
-        m_rows[row].value->SetFocus();
+    m_entryPane->LayOut();
+    if (m_entryPane->Value(row)->IsEnabled())
+        m_entryPane->Value(row)->SetFocus();
 }
 
 // --- Changing ---
@@ -105,9 +88,9 @@ void Cartulo::AddField(const std::string &key)
 // when there is none.
 int Cartulo::RowForCommand(const char *logPrefix)
 {
-    int row = m_editMode ? FocusedRow() : -1;
+    int row = m_editMode ? m_entryPane->FocusedRow() : -1;
     if (row >= 0)
-        LogRow(logPrefix, row);
+        LogRow(logPrefix, row, m_entryPane->KeyText(row));
     else if (m_editMode)
         ShowStatus(this,
                    "Put the cursor into a field first, one that was there before the editing.");
@@ -119,18 +102,18 @@ void Cartulo::OnEditField(wxCommandEvent &)
     int row = RowForCommand("INFO: Editing Field: ");
     if (row < 0)
         return;
-    wxString key = KeyText(row);
-    wxString text = m_rows[row].value->GetValue();
+    wxString key = m_entryPane->KeyText(row);
+    wxString text = m_entryPane->Value(row)->GetValue();
     for (bool taken = false; !taken;) {
         Cartulo_EditField dialog(wxGetTopLevelParent(this), key, text);
         if (dialog.ShowModal() != wxID_OK)
             break;
         text = dialog.Value();
-        taken = Text_Take(m_rows[row].value, text);
+        taken = Text_Take(m_entryPane->Value(row), text);
         if (!taken)
-            ShowWarning(dialog.GetTitle(), Text_TooLong);
+            Box_Warn(this, dialog.GetTitle(), Text_TooLong);
     }
-    FocusRow(row);
+    m_entryPane->FocusRow(row);
 }
 
 void Cartulo::OnRenameField(wxCommandEvent &)
@@ -138,18 +121,19 @@ void Cartulo::OnRenameField(wxCommandEvent &)
     int row = RowForCommand("INFO: Renaming Field: ");
     if (row < 0)
         return;
-    wxString key = KeyText(row);
-    ReadRows();
-    Cartulo_RenameField dialog(wxGetTopLevelParent(this), &m_grid, key, m_newFieldKey->GetStrings(),
-                               m_newFieldKey->GetValue());
+    wxString key = m_entryPane->KeyText(row);
+    m_entryPane->ReadRows();
+    Cartulo_RenameField dialog(wxGetTopLevelParent(this), &m_grid, key,
+                               m_entryPane->NewKey()->GetStrings(),
+                               m_entryPane->NewKey()->GetValue());
     if (dialog.ShowModal() == wxID_OK && !dialog.NewName().empty()) {
         Grid_Rename(&m_grid, row, dialog.NewName().c_str());
-        WriteRows();
+        m_entryPane->WriteRows();
         CheckMandatoryFields(m_entry->fieldCount - 1);
-        LayOutEntry();
+        m_entryPane->LayOut();
     }
-    if (m_rows[row].value->IsEnabled())
-        FocusRow(row);
+    if (m_entryPane->Value(row)->IsEnabled())
+        m_entryPane->FocusRow(row);
 }
 
 // --- Removing ---
@@ -162,7 +146,8 @@ void Cartulo::OnRemoveField(wxCommandEvent &event)
     TNSMessage("INFO: Cartulo::OnRemoveField ", text.utf8_str(), TNS_ACTION);
     if (!m_editMode || !m_entry)
         return;
-    int stored = Grid_StoredRows(&m_grid), row = Panel_RowToRemove(id, FocusedRow(), stored);
+    int stored = Grid_StoredRows(&m_grid),
+        row = Panel_RowToRemove(id, m_entryPane->FocusedRow(), stored);
     if (row < 0) {
         TNSMessage("INFO: Cartulo::OnRemoveField ", "unknown target", TNS_ACTION);
     } else if (row >= stored) {
@@ -180,34 +165,24 @@ void Cartulo::RemoveRow(int row)
     if (row >= m_grid.count || m_grid.rows[row].inherited)
         return;
     std::string key = m_grid.rows[row].key;
-    LogRow("INFO: Cartulo::OnRemoveField ", row);
-    int focused = RowWithFocus(m_grid.count);
-    ReadRows();
+    LogRow("INFO: Cartulo::OnRemoveField ", row, m_entryPane->KeyText(row));
+    int focused = m_entryPane->RowWithFocus(m_grid.count);
+    m_entryPane->ReadRows();
     GridRemove result = Grid_Remove(&m_grid, row);
     if (result == GRID_NO_ROW)
         return;
     if (result == GRID_REMOVED)
         AppLog("WARNING, removing the field: ", key.c_str());
     else
-        FillRow(row);
-    WriteRows();
+        m_entryPane->FillRow(row);
+    m_entryPane->WriteRows();
     if (result == GRID_INHERITED) {
-        m_newFieldKey->Append(StoreText(key.c_str(), m_grid.encoding));
+        m_entryPane->NewKey()->Append(StoreText(key.c_str(), m_grid.encoding));
         return;
     }
     CheckMandatoryFields(m_grid.count - 1);
-    m_newFieldKey->SetValue(StoreText(key.c_str(), m_grid.encoding)); // adding brings it back
-    LayOutEntry();
-    KeepFocus(focused > row ? focused - 1 : focused);
-}
-
-// In the row that moved up, or else somewhere.
-void Cartulo::KeepFocus(int row)
-{
-    if (row < 0)
-        return;
-    if (row < m_grid.count && m_rows[row].value->IsEnabled())
-        FocusRow(row);
-    else
-        FocusForMode();
+    m_entryPane->NewKey()->SetValue(
+        StoreText(key.c_str(), m_grid.encoding)); // adding brings it back
+    m_entryPane->LayOut();
+    m_entryPane->KeepFocus(focused > row ? focused - 1 : focused);
 }

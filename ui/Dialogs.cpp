@@ -69,17 +69,19 @@ void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus)
 
 void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text)
 {
-    wxMessageBox(text, caption, wxOK | wxICON_WARNING, parent);
+    wxMessageBox(text, caption, wxOK | wxICON_WARNING, wxGetTopLevelParent(parent));
 }
 
 bool Box_WarnOrCancel(wxWindow *parent, const wxString &caption, const wxString &text)
 {
-    return wxMessageBox(text, caption, wxOK | wxCANCEL | wxICON_WARNING, parent) == wxOK;
+    return wxMessageBox(text, caption, wxOK | wxCANCEL | wxICON_WARNING,
+                        wxGetTopLevelParent(parent)) == wxOK;
 }
 
 bool Box_Ask(wxWindow *parent, const wxString &caption, const wxString &text, long style)
 {
-    return wxMessageBox(text, caption, wxYES_NO | wxICON_QUESTION | style, parent) == wxYES;
+    return wxMessageBox(text, caption, wxYES_NO | wxICON_QUESTION | style,
+                        wxGetTopLevelParent(parent)) == wxYES;
 }
 
 void Box_OfferStripped(wxWindow *parent, const wxString &caption, const wxString &text,

@@ -29,6 +29,7 @@ wxSizerFlags Dialog_ButtonPlace(const wxWindow *dialog);
 // in a field of one line is OK at once, and Ctrl+Enter everywhere.
 void Dialog_Finish(wxDialog *dialog, wxSizer *content, wxWindow *focus);
 
+// The boxes belong to the top-level window of `parent`.
 void Box_Warn(wxWindow *parent, const wxString &caption, const wxString &text);
 
 // A warning that may be cancelled; true for OK.

@@ -1,6 +1,9 @@
 #include "ui/Theme.h"
 
 #include <wx/settings.h>
+#include <wx/stattext.h>
+
+static const Colour HeadingColour = {0, 0, 100};
 
 void Theme_SetTextColour(wxWindow *window, Colour colour)
 {
@@ -8,6 +11,16 @@ void Theme_SetTextColour(wxWindow *window, Colour colour)
     Colour shown = Colour_ForText(colour, {back.Red(), back.Green(), back.Blue()},
                                   wxSystemSettings::GetAppearance().IsUsingDarkBackground());
     window->SetForegroundColour(wxColour(shown.red, shown.green, shown.blue));
+}
+
+wxStaticText *Theme_CreateHeading(wxWindow *parent, const wxString &text)
+{
+    wxStaticText *heading =
+        new wxStaticText(parent, wxID_ANY, text, wxDefaultPosition, wxDefaultSize,
+                         wxALIGN_CENTRE_HORIZONTAL | wxST_ELLIPSIZE_END);
+    heading->SetFont(heading->GetFont().Bold());
+    Theme_SetTextColour(heading, HeadingColour);
+    return heading;
 }
 
 // Between the colour of a window's text and that of its background.
