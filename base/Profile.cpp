@@ -138,20 +138,37 @@ static Text WithoutQuotes(Text value)
     return quoted ? value.substr(1, value.size() - 2) : value;
 }
 
-size_t Profile_GetString(const char *section, const char *key, const char *fallback, char *buffer,
-                         size_t size, const char *path)
+static size_t CopyValue(Text section, const char *key, const char *fallback, char *buffer,
+                        size_t size)
 {
-    if (size == 0)
-        return 0;
-    std::string text = ReadProfile(path);
     Text value;
-    if (FindValue(FindSection(text, section), key, &value))
+    if (FindValue(section, key, &value))
         value = WithoutQuotes(value);
     else
         value = fallback ? fallback : "";
     size_t length = value.copy(buffer, size - 1);
     buffer[length] = 0;
     return length;
+}
+
+size_t Profile_GetString(const char *section, const char *key, const char *fallback, char *buffer,
+                         size_t size, const char *path)
+{
+    if (size == 0)
+        return 0;
+    std::string text = ReadProfile(path);
+    return CopyValue(FindSection(text, section), key, fallback, buffer, size);
+}
+
+void Profile_GetStrings(const char *section, const char *const *keys, int count,
+                        const char *fallback, char *buffers, size_t size, const char *path)
+{
+    if (size == 0)
+        return;
+    std::string text = ReadProfile(path);
+    Text lines = FindSection(text, section);
+    for (int i = 0; i < count; ++i)
+        CopyValue(lines, keys[i], fallback, buffers + static_cast<size_t>(i) * size, size);
 }
 
 // The last byte of the buffer is kept for the end of the list.

@@ -15,6 +15,11 @@
 size_t Profile_GetString(const char *section, const char *key, const char *fallback, char *buffer,
                          size_t size, const char *path);
 
+// The same for several keys of one section, with one look at the file: the value of keys[i] goes to
+// buffers + i * size.
+void Profile_GetStrings(const char *section, const char *const *keys, int count,
+                        const char *fallback, char *buffers, size_t size, const char *path);
+
 // The lines of a section as "key=value", quotes and lines without '=' as they stand, each ended by
 // a 0, the last by two. Returns the length without the last 0; size - 2 when it had to be cut.
 size_t Profile_GetSection(const char *section, char *buffer, size_t size, const char *path);

@@ -86,12 +86,10 @@ void Schema_RegisterTypes(const char *ini)
 
 // --- Fields ---
 
-FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key)
+static FieldClass ClassOf(const char *key, const char *value)
 {
     if (Ascii_Compare(key, "crossref") == 0)
         return FIELD_CROSSREF;
-    char value[VALUE_SIZE];
-    Profile_GetString(type, key, "#", value, sizeof value, ini);
     switch (*value) {
     case '!':
         return FIELD_CROSSREF;
@@ -102,6 +100,23 @@ FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key)
     default:
         return FIELD_OPTIONAL;
     }
+}
+
+std::vector<FieldClass> Schema_FieldClasses(const char *ini, const char *type,
+                                            const std::vector<const char *> &keys)
+{
+    std::vector<char> values(keys.size() * VALUE_SIZE);
+    Profile_GetStrings(type, keys.data(), static_cast<int>(keys.size()), "#", values.data(),
+                       VALUE_SIZE, ini);
+    std::vector<FieldClass> classes;
+    for (size_t i = 0; i < keys.size(); ++i)
+        classes.push_back(ClassOf(keys[i], &values[i * VALUE_SIZE]));
+    return classes;
+}
+
+FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key)
+{
+    return Schema_FieldClasses(ini, type, {key})[0];
 }
 
 std::string Schema_Description(const char *ini, const char *type)

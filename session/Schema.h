@@ -36,6 +36,8 @@ enum FieldClass {
     FIELD_OPTIONAL
 };
 FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key);
+std::vector<FieldClass> Schema_FieldClasses(const char *ini, const char *type,
+                                            const std::vector<const char *> &keys);
 
 // "Custom Entry Type" for a type without a section or description.
 std::string Schema_Description(const char *ini, const char *type);

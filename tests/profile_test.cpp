@@ -104,6 +104,18 @@ TEST_F(ProfileString, IsTheFallbackWhereThereIsNone)
     EXPECT_EQ(4u, m_result);
 }
 
+TEST_F(ProfileString, MayBeThatOfSeveralKeys)
+{
+    Write("[one]\na=1\nb=\"long value\"\n[two]\nc=3\n");
+    const char *keys[] = {"b", "c", "A"};
+    char values[3][5];
+    memset(values, 'x', sizeof values);
+    Profile_GetStrings("one", keys, 3, "none at all", values[0], sizeof values[0], m_path.c_str());
+    EXPECT_STREQ("long", values[0]);
+    EXPECT_STREQ("none", values[1]);
+    EXPECT_STREQ("1", values[2]);
+}
+
 TEST_F(ProfileString, IgnoresLetterCaseOfNames)
 {
     Write("[One]\nKey=Value\n");

@@ -189,6 +189,13 @@ TEST_F(SchemaFieldClass, CountsAtOnceWhenTheFileChanges)
     EXPECT_EQ(FIELD_OPTIONAL, Of("note"));
 }
 
+TEST_F(SchemaFieldClass, IsToldOfSeveralFieldsAtOnce)
+{
+    EXPECT_THAT(Schema_FieldClasses(ini.c_str(), "article", {"doi", "note", "Author", "crossref"}),
+                ElementsAre(FIELD_OPTIONAL, FIELD_UNKNOWN, FIELD_MANDATORY, FIELD_CROSSREF));
+    EXPECT_THAT(Schema_FieldClasses(ini.c_str(), "article", {}), IsEmpty());
+}
+
 TEST_F(SchemaFile, DescribesTypes)
 {
     std::string ini = folder.Write("a.ini", Types);

@@ -3,18 +3,13 @@
 #include <cstdlib>
 
 #include <wx/button.h>
-#include <wx/choice.h>
-#include <wx/combobox.h>
 #include <wx/config.h>
 #include <wx/filedlg.h>
 #include <wx/frame.h>
 #include <wx/msgdlg.h>
 #include <wx/panel.h>
-#include <wx/settings.h>
 #include <wx/sizer.h>
 #include <wx/srchctrl.h>
-#include <wx/stattext.h>
-#include <wx/textctrl.h>
 #include <wx/toolbar.h>
 
 #include "base/Companion.h"
@@ -500,11 +495,12 @@ void Cartulo::FocusList()
 void Cartulo::ShowSelection()
 {
     const IndexItem *item = m_list->Item(m_list->GetSelection());
-    if (item)
+    if (item) {
         ShowEntry(item->entry, item->file);
-    else
-        ClearEntry();
-    ShowEncoding(this, EncodingText());
+        return;
+    }
+    ClearEntry();
+    ShowEncoding(this, "");
 }
 
 // Shows the selected row. `handler` names the caller in the log.

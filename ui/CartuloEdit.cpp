@@ -1,17 +1,9 @@
 // ui/CartuloEdit.cpp - the entry pane: showing an entry, editing it, committing what was edited.
 #include "ui/Cartulo.h"
 
-#include <algorithm>
-#include <initializer_list>
 #include <vector>
 
-#include <wx/button.h>
-#include <wx/choice.h>
-#include <wx/combobox.h>
 #include <wx/msgdlg.h>
-#include <wx/settings.h>
-#include <wx/sizer.h>
-#include <wx/stattext.h>
 #include <wx/textctrl.h>
 
 #include "base/Companion.h"
@@ -25,12 +17,8 @@
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
 #include "ui/EntryPane.h"
-#include "ui/Icons.h"
 #include "ui/Ids.h"
-#include "ui/Native.h"
 #include "ui/QListBox.h"
-#include "ui/Theme.h"
-#include "ui/TypeChoice.h"
 
 static const char CommitTitle[] = "Commit of Bibliography Entry - Question";
 

@@ -1,8 +1,6 @@
 // ui/CartuloFields.cpp - the commands on the fields of the entry that is edited.
 #include "ui/Cartulo.h"
 
-#include <algorithm>
-
 #include <wx/combobox.h>
 #include <wx/msgdlg.h>
 #include <wx/textctrl.h>

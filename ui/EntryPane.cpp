@@ -3,6 +3,7 @@
 
 #include <algorithm>
 #include <initializer_list>
+#include <vector>
 
 #include <wx/button.h>
 #include <wx/choice.h>
@@ -290,10 +291,12 @@ void EntryPane::ShowMoreFields()
 
 void EntryPane::ColourRows(const char *ini, const char *type)
 {
-    for (int i = 0; i < m_grid->count; ++i) {
-        FieldClass fieldClass = Schema_FieldClass(ini, type, m_grid->rows[i].key.c_str());
-        Theme_SetTextColour(m_rows[i].label, Colour_OfField(fieldClass));
-    }
+    std::vector<const char *> keys;
+    for (int i = 0; i < m_grid->count; ++i)
+        keys.push_back(m_grid->rows[i].key.c_str());
+    std::vector<FieldClass> classes = Schema_FieldClasses(ini, type, keys);
+    for (int i = 0; i < m_grid->count; ++i)
+        Theme_SetTextColour(m_rows[i].label, Colour_OfField(classes[i]));
 }
 
 wxString EntryPane::KeyText(int row) const
