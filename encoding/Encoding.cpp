@@ -251,6 +251,13 @@ std::string Enc_Recode(const char *text, const EncodingRecord *from, const Encod
     return from == to ? text : Enc_Encode(Enc_Decode(text, from).c_str(), to);
 }
 
+int Enc_TryRecode(const char *text, const EncodingRecord *from, const EncodingRecord *to,
+                  std::string *recoded)
+{
+    *recoded = Enc_Recode(text, from, to);
+    return Enc_Recode(recoded->c_str(), to, from) == text;
+}
+
 // --- UTF-8 ---
 
 // How many ASCII characters the text begins with.

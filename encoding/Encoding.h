@@ -77,6 +77,10 @@ int Enc_Holds(wchar_t character, const EncodingRecord *encoding);
 // Store text in another encoding; see Enc_Encode for what that lacks.
 std::string Enc_Recode(const char *text, const EncodingRecord *from, const EncodingRecord *to);
 
+// The same, with 0 when that lacks a character: `recoded` does not come back as it was.
+int Enc_TryRecode(const char *text, const EncodingRecord *from, const EncodingRecord *to,
+                  std::string *recoded);
+
 // --- UTF-8 ---
 
 // How much of the text is valid: without surrogates. ASCII is.

@@ -71,8 +71,8 @@ static KeyVerdict CheckForm(const TypedName &key)
 static bool HasKeyOf(const BibFile *other, const char *key, const BibFile *file)
 {
     const EncodingRecord *from = Bib_Encoding(file), *to = Bib_Encoding(other);
-    std::string recoded = Enc_Recode(key, from, to);
-    return HasKey(other, recoded.c_str()) && Enc_Recode(recoded.c_str(), to, from) == key;
+    std::string recoded;
+    return Enc_TryRecode(key, from, to, &recoded) && HasKey(other, recoded.c_str());
 }
 
 static KeyVerdict CheckFree(const BibFileSet *set, const BibFile *file, const char *key)
@@ -111,8 +111,7 @@ KeyVerdict Entry_CheckRename(const BibFileSet *set, const BibFile *file, const B
 static bool Recode(const BibFile *file, const char *name, std::string *recoded)
 {
     const EncodingRecord *from = Enc_OfText(name), *to = Bib_Encoding(file);
-    *recoded = Enc_Recode(name, from, to);
-    return Enc_Recode(recoded->c_str(), to, from) == name;
+    return Enc_TryRecode(name, from, to, recoded) != 0;
 }
 
 static std::vector<std::string> MandatoryFields(const char *specs)

@@ -553,6 +553,25 @@ TEST_F(EncUtf8, IsRecodedToAndFromTheDefaultPage)
     EXPECT_EQ("\xC2\xAB", Enc_Recode("\xC2\xAB", &EncodingUtf8, &EncodingUtf8)); // untouched
 }
 
+TEST_F(EncUtf8, IsRecodedWithAWordOnWhatDoesNotComeBack)
+{
+    const EncodingRecord *page = Row("CP1252");
+    std::string recoded = "old";
+    EXPECT_TRUE(Enc_TryRecode("M\xC3\xBCller \x02", &EncodingUtf8, page, &recoded));
+    EXPECT_EQ("M\xFCller \x02", recoded);
+    EXPECT_TRUE(Enc_TryRecode("M\xFCller \x02", page, &EncodingUtf8, &recoded));
+    EXPECT_EQ("M\xC3\xBCller \x02", recoded);
+    EXPECT_FALSE(Enc_TryRecode("a\xD0\x96", &EncodingUtf8, page, &recoded));
+    EXPECT_EQ("a\xFF", recoded);
+    EXPECT_FALSE(Enc_TryRecode("\xC2\xAB", &EncodingUtf8, page, &recoded)); // a mark there
+    EXPECT_EQ("\x02", recoded);
+    EXPECT_FALSE(Enc_TryRecode("\xFC", &EncodingUtf8, page, &recoded)); // no text in UTF-8
+    EXPECT_TRUE(Enc_TryRecode("\xFC", page, page, &recoded));
+    EXPECT_EQ("\xFC", recoded);
+    EXPECT_TRUE(Enc_TryRecode("", &EncodingUtf8, page, &recoded));
+    EXPECT_EQ("", recoded);
+}
+
 TEST_F(EncUtf8, IsSearchedWithoutTheCaseOfAnyLetter)
 {
     auto contains = [](const char *text, const char *search) {

@@ -11,8 +11,7 @@ SearchText Search_For(const char *text, const BibFile *file)
     if (search.isEmpty)
         return search;
     const EncodingRecord *from = Enc_Current(), *to = Bib_Encoding(file);
-    search.bytes = Enc_Recode(text, from, to);
-    search.isForeign = Enc_Recode(search.bytes.c_str(), to, from) != text;
+    search.isForeign = !Enc_TryRecode(text, from, to, &search.bytes);
     if (Enc_NeedsFolding(search.bytes.c_str(), to))
         search.folded = Enc_FoldUtf8(search.bytes.c_str());
     return search;
