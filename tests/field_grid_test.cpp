@@ -6,7 +6,6 @@
 
 #include <cctype>
 #include <cstdlib>
-#include <cstring>
 #include <fstream>
 #include <sstream>
 #include <string>
@@ -30,18 +29,13 @@ using Lines = std::vector<std::string>;
 // Of what a test types and expects: UTF-8, with \n, \t and \xNN for characters.
 std::wstring Wide(const std::string &text)
 {
-    std::wstring wide;
-    for (size_t i = 0; i < text.size(); ++i) {
-        unsigned char c = static_cast<unsigned char>(text[i]);
-        if (c == '\\' && strchr("nt", text[i + 1]))
-            wide += text[++i] == 'n' ? L'\n' : L'\t';
-        else if (c == '\\' && text[i + 1] == 'x') {
-            wide += static_cast<wchar_t>(std::stoi(text.substr(i + 2, 2), nullptr, 16));
-            i += 3;
-        } else if (c >= 0x80 && c < 0xC0)
-            wide.back() = (wide.back() << 6) + (c & 0x3F);
-        else
-            wide += c < 0x80 ? c : c & (c < 0xE0 ? 0x1F : 0x0F);
+    std::wstring wide = Enc_Decode(text.c_str(), &EncodingUtf8);
+    for (size_t at = 0; (at = wide.find(L'\\', at)) != wide.npos; ++at) {
+        wchar_t next = wide[at + 1];
+        if (next == L'n' || next == L't')
+            wide.replace(at, 2, 1, next == L'n' ? L'\n' : L'\t');
+        else if (next == L'x')
+            wide.replace(at, 4, 1, std::stoi(wide.substr(at + 2, 2), nullptr, 16));
     }
     return wide;
 }
@@ -49,13 +43,9 @@ std::wstring Wide(const std::string &text)
 std::string Utf8(const std::wstring &wide)
 {
     std::string text;
-    for (wchar_t c : wide) {
-        if (c >= 0x800)
-            text += static_cast<char>(0xE0 | c >> 12);
-        if (c >= 0x80)
-            text += static_cast<char>(c >= 0x800 ? 0x80 | (c >> 6 & 0x3F) : 0xC0 | c >> 6);
-        text += static_cast<char>(c >= 0x80 ? 0x80 | (c & 0x3F) : c);
-    }
+    char bytes[ENC_LONGEST];
+    for (wchar_t c : wide)
+        text.append(bytes, Enc_PutUtf8(bytes, static_cast<uint32_t>(c)));
     return text;
 }
 
