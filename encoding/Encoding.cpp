@@ -6,6 +6,7 @@
 #include <cwchar>
 
 #include <unicode/uchar.h>
+#include <unicode/utf16.h>
 #include <unicode/utf8.h>
 
 #include "base/Ascii.h"
@@ -95,9 +96,43 @@ const EncodingRecord *Enc_OfText(const char *text)
     return Enc_For(Enc_IsUtf8(text, strlen(text)));
 }
 
+// --- Characters of display text ---
+
+static const bool HAS_PAIRS = sizeof(wchar_t) == 2;
+
+uint32_t Enc_JoinSurrogates(uint32_t first, uint32_t second)
+{
+    bool isPair = U16_IS_LEAD(first) && U16_IS_TRAIL(second);
+    return isPair ? static_cast<uint32_t>(U16_GET_SUPPLEMENTARY(first, second)) : 0;
+}
+
+uint32_t Enc_NextWide(const wchar_t **at)
+{
+    uint32_t c = static_cast<uint32_t>(*(*at)++);
+    uint32_t joined = HAS_PAIRS ? Enc_JoinSurrogates(c, static_cast<uint32_t>(**at)) : 0;
+    if (joined == 0)
+        return c;
+    ++*at;
+    return joined;
+}
+
+void Enc_AppendWide(std::wstring *text, uint32_t character)
+{
+    if (HAS_PAIRS && character > 0xFFFF) {
+        *text += static_cast<wchar_t>(U16_LEAD(character));
+        character = U16_TRAIL(character);
+    }
+    *text += static_cast<wchar_t>(character);
+}
+
+int Enc_IsCharacter(uint32_t character)
+{
+    return character <= 0x10FFFF && !U_IS_SURROGATE(character);
+}
+
 // --- To Unicode ---
 
-static wchar_t ToCharacter(const uint32_t *map, unsigned char byte)
+static uint32_t ToCharacter(const uint32_t *map, unsigned char byte)
 {
     switch (byte) {
     case ENC_OPEN_MARK:
@@ -105,7 +140,7 @@ static wchar_t ToCharacter(const uint32_t *map, unsigned char byte)
     case ENC_CLOSE_MARK:
         return ENC_SHOWN_CLOSE;
     default:
-        return static_cast<wchar_t>(map[byte]);
+        return map[byte];
     }
 }
 
@@ -113,7 +148,7 @@ static void DecodePage(std::wstring *out, const char *text, const uint32_t *map)
 {
     out->reserve(strlen(text));
     for (; *text; ++text)
-        *out += ToCharacter(map, static_cast<unsigned char>(*text));
+        Enc_AppendWide(out, ToCharacter(map, static_cast<unsigned char>(*text)));
 }
 
 // The next character of UTF-8 text that ends with a NUL; U+FFFD for bytes that are none.
@@ -131,9 +166,9 @@ static void DecodeUtf8(std::wstring *out, const char *text)
     out->reserve(strlen(text));
     while (*text) {
         uint32_t c = NextCharacter(&text);
-        *out += c == ENC_OPEN_MARK    ? ENC_SHOWN_OPEN
-                : c == ENC_CLOSE_MARK ? ENC_SHOWN_CLOSE
-                                      : static_cast<wchar_t>(c);
+        Enc_AppendWide(out, c == ENC_OPEN_MARK    ? ENC_SHOWN_OPEN
+                            : c == ENC_CLOSE_MARK ? ENC_SHOWN_CLOSE
+                                                  : c);
     }
 }
 
@@ -162,15 +197,14 @@ static unsigned char FindByte(const uint32_t *map, uint32_t c)
     return static_cast<unsigned char>(std::find(map, end, c) - map);
 }
 
-static unsigned char ToByte(wchar_t character, const EncodingRecord *encoding)
+static unsigned char ToByte(uint32_t c, const EncodingRecord *encoding)
 {
-    switch (character) {
+    switch (c) {
     case ENC_SHOWN_OPEN:
         return ENC_OPEN_MARK;
     case ENC_SHOWN_CLOSE:
         return ENC_CLOSE_MARK;
     }
-    uint32_t c = static_cast<uint32_t>(character);
     if (encoding != page)
         return FindByte(encoding->map, c);
     return c < CODE_POINTS ? pageBytes[c] : NO_BYTE;
@@ -178,7 +212,7 @@ static unsigned char ToByte(wchar_t character, const EncodingRecord *encoding)
 
 size_t Enc_PutUtf8(char *out, uint32_t character)
 {
-    if (character > 0x10FFFF || U_IS_SURROGATE(character))
+    if (!Enc_IsCharacter(character))
         character = REPLACEMENT;
     size_t length = 0;
     U8_APPEND_UNSAFE(out, length, character);
@@ -190,8 +224,8 @@ static void LogInput(const wchar_t *text)
 {
     char line[512];
     size_t length = 0;
-    for (; *text && length + 4 < sizeof line; ++text)
-        length += Enc_PutUtf8(line + length, static_cast<uint32_t>(*text));
+    while (*text && length + ENC_LONGEST < sizeof line)
+        length += Enc_PutUtf8(line + length, Enc_NextWide(&text));
     line[length] = 0;
     AppLog("strconv in: ", line);
 }
@@ -206,17 +240,17 @@ char *Enc_FromUnicode(char *buffer, const wchar_t *text)
 {
     const EncodingRecord *current = CurrentPage();
     char *out = buffer;
-    for (const wchar_t *at = text; *at; ++at)
-        *out++ = static_cast<char>(ToByte(*at, current));
+    for (const wchar_t *at = text; *at;)
+        *out++ = static_cast<char>(ToByte(Enc_NextWide(&at), current));
     *out = 0;
     Enc_LogConversion(text, buffer);
     return buffer;
 }
 
-static size_t PutCharacter(char *out, wchar_t c, const EncodingRecord *encoding)
+static size_t PutCharacter(char *out, uint32_t c, const EncodingRecord *encoding)
 {
     if (!encoding->map && c != ENC_SHOWN_OPEN && c != ENC_SHOWN_CLOSE)
-        return Enc_PutUtf8(out, static_cast<uint32_t>(c));
+        return Enc_PutUtf8(out, c);
     *out = static_cast<char>(ToByte(c, encoding));
     return 1;
 }
@@ -224,8 +258,8 @@ static size_t PutCharacter(char *out, wchar_t c, const EncodingRecord *encoding)
 char *Enc_EncodeTo(char *buffer, const wchar_t *text, const EncodingRecord *encoding)
 {
     char *out = buffer;
-    for (; *text; ++text)
-        out += PutCharacter(out, *text, encoding);
+    while (*text)
+        out += PutCharacter(out, Enc_NextWide(&text), encoding);
     *out = 0;
     return buffer;
 }
@@ -237,13 +271,12 @@ std::string Enc_Encode(const wchar_t *text, const EncodingRecord *encoding)
     return bytes;
 }
 
-int Enc_Holds(wchar_t character, const EncodingRecord *encoding)
+int Enc_Holds(uint32_t character, const EncodingRecord *encoding)
 {
     if (encoding->map)
         return ToCharacter(encoding->map, ToByte(character, encoding)) == character;
-    uint32_t c = static_cast<uint32_t>(character);
-    bool isMark = c == ENC_OPEN_MARK || c == ENC_CLOSE_MARK;
-    return c <= 0x10FFFF && !U_IS_SURROGATE(c) && !isMark;
+    bool isMark = character == ENC_OPEN_MARK || character == ENC_CLOSE_MARK;
+    return Enc_IsCharacter(character) && !isMark;
 }
 
 std::string Enc_Recode(const char *text, const EncodingRecord *from, const EncodingRecord *to)

@@ -41,12 +41,30 @@ const EncodingRecord *Enc_Current();
 // For people: "CP1252", "UTF-8".
 const char *Enc_Label(const EncodingRecord *encoding);
 
+// --- Characters of display text ---
+//
+// A character beyond U+FFFF takes two wchar_t where these have 16 bits: a pair of surrogates. What
+// looks at single characters takes them with the first two functions.
+
+// The character that begins at `*at`, and a step behind it. Not at the end of a text. A surrogate
+// without its other half is what it is.
+uint32_t Enc_NextWide(const wchar_t **at);
+
+// Puts a character behind the text.
+void Enc_AppendWide(std::wstring *text, uint32_t character);
+
+// The character that a pair of surrogates stands for; 0 when the two are none.
+uint32_t Enc_JoinSurrogates(uint32_t first, uint32_t second);
+
+// 1 when it can be one: neither a surrogate nor beyond U+10FFFF.
+int Enc_IsCharacter(uint32_t character);
+
 // --- In the selected code page; in CP1252 while UTF-8 is selected ---
 
 // Store text to display text. Returns `out`.
 std::wstring &Enc_ToUnicode(std::wstring &out, const char *text);
 
-// Display text to store text, into a buffer of at least one byte per character and a NUL. A
+// Display text to store text, into a buffer of at least one byte per wchar_t and a NUL. A
 // character outside the code page becomes byte 0xFF. Returns `buffer`.
 char *Enc_FromUnicode(char *buffer, const wchar_t *text);
 
@@ -68,11 +86,11 @@ std::wstring Enc_Decode(const char *text, const EncodingRecord *encoding);
 // and U+FFFD in UTF-8.
 std::string Enc_Encode(const wchar_t *text, const EncodingRecord *encoding);
 
-// The same, into a buffer of ENC_LONGEST bytes per character and a NUL. Returns `buffer`.
+// The same, into a buffer of ENC_LONGEST bytes per wchar_t and a NUL. Returns `buffer`.
 char *Enc_EncodeTo(char *buffer, const wchar_t *text, const EncodingRecord *encoding);
 
 // 1 when the store gives a character back as it was put there.
-int Enc_Holds(wchar_t character, const EncodingRecord *encoding);
+int Enc_Holds(uint32_t character, const EncodingRecord *encoding);
 
 // Store text in another encoding; see Enc_Encode for what that lacks.
 std::string Enc_Recode(const char *text, const EncodingRecord *from, const EncodingRecord *to);

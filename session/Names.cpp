@@ -1,13 +1,12 @@
 #include "session/Names.h"
 
 #include <algorithm>
-#include <cwchar>
 
 #include "encoding/Encoding.h"
 #include "session/Values.h"
 #include "store/BibStore.h"
 
-static bool Fits(wchar_t c, const EncodingRecord *encoding)
+static bool Fits(uint32_t c, const EncodingRecord *encoding)
 {
     bool isMark = c == ENC_SHOWN_OPEN || c == ENC_SHOWN_CLOSE;
     return c <= 32 || (Enc_Holds(c, encoding) && !isMark);
@@ -18,8 +17,9 @@ TypedName Name_Read(const wchar_t *typed, const EncodingRecord *encoding)
     std::string text = Value_Read(typed, encoding);
     text.erase(std::remove_if(text.begin(), text.end(), [](unsigned char c) { return c <= 32; }),
                text.end());
-    bool fits = std::all_of(typed, typed + wcslen(typed),
-                            [encoding](wchar_t c) { return Fits(c, encoding); });
+    bool fits = true;
+    while (*typed)
+        fits = Fits(Enc_NextWide(&typed), encoding) && fits;
     return {text, fits, encoding};
 }
 

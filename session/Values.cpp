@@ -1,8 +1,7 @@
 #include "session/Values.h"
 
 #include <algorithm>
-#include <cstring>
-#include <cwchar>
+#include <cstdio>
 
 #include "encoding/Encoding.h"
 #include "store/BibStore.h"
@@ -79,27 +78,36 @@ bool Value_HoldsGuillemets(const char *value, const EncodingRecord *encoding)
 }
 
 // The characters that would not come back, each once, in their order.
-static std::wstring LostCharacters(const std::wstring &text, const EncodingRecord *encoding)
+static std::u32string LostCharacters(const std::wstring &text, const EncodingRecord *encoding)
 {
-    std::wstring lost;
-    for (wchar_t c : text)
+    std::u32string lost;
+    for (const wchar_t *at = text.data(), *end = at + text.size(); at < end;) {
+        char32_t c = Enc_NextWide(&at);
         if (!Enc_Holds(c, encoding) && lost.find(c) == lost.npos)
             lost += c;
+    }
     return lost;
 }
 
-static std::wstring Visible(wchar_t c)
+static std::wstring Text(char32_t c)
+{
+    std::wstring text;
+    Enc_AppendWide(&text, c);
+    return text;
+}
+
+static std::wstring Visible(char32_t c)
 {
     bool isControl = c < 32 || (c >= 127 && c < 160);
     if (!isControl)
-        return std::wstring(1, c);
-    wchar_t name[16];
-    swprintf(name, sizeof name / sizeof *name, L"U+%04X", static_cast<unsigned>(c));
-    return name;
+        return Text(c);
+    char name[16];
+    int length = snprintf(name, sizeof name, "U+%04X", static_cast<unsigned>(c));
+    return std::wstring(name, name + length);
 }
 
 // The first twenty, with blanks between.
-static std::wstring ListCharacters(const std::wstring &characters)
+static std::wstring ListCharacters(const std::u32string &characters)
 {
     static const size_t most = 20;
     std::wstring list;
@@ -109,18 +117,17 @@ static std::wstring ListCharacters(const std::wstring &characters)
 }
 
 // What the store makes of it.
-static std::wstring Stored(wchar_t c, const EncodingRecord *encoding)
+static std::wstring Stored(char32_t c, const EncodingRecord *encoding)
 {
-    const wchar_t text[] = {c, 0};
-    return Enc_Decode(Enc_Encode(text, encoding).c_str(), encoding);
+    return Enc_Decode(Enc_Encode(Text(c).c_str(), encoding).c_str(), encoding);
 }
 
 // The characters of the text that stand for other bytes of the stored value than they will become.
 // Guillemets are a case of their own: the only one in UTF-8.
-static std::wstring ReplacedCharacters(const std::wstring &text, const std::string &stored,
-                                       const EncodingRecord *encoding)
+static std::u32string ReplacedCharacters(const std::wstring &text, const std::string &stored,
+                                         const EncodingRecord *encoding)
 {
-    std::wstring replaced;
+    std::u32string replaced;
     if (encoding == &EncodingUtf8)
         return replaced;
     std::wstring shown = Enc_Decode(stored.c_str(), encoding);
@@ -139,11 +146,11 @@ std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
                           const EncodingRecord *encoding)
 {
     std::wstring label = Enc_Decode(Enc_Label(encoding), encoding), losses;
-    std::wstring lost = LostCharacters(text, encoding);
+    std::u32string lost = LostCharacters(text, encoding);
     if (!lost.empty())
         losses += L"`" + name + L"': " + ListCharacters(lost) + L" can't be stored in " + label +
                   L" and would become " + Stored(lost[0], encoding) + L".\n";
-    std::wstring replaced = ReplacedCharacters(text, stored, encoding);
+    std::u32string replaced = ReplacedCharacters(text, stored, encoding);
     if (!replaced.empty())
         losses += L"`" + name + L"': " + label + L" shows bytes of the old value as " +
                   ListCharacters(replaced) + L", and they would become just that.\n";

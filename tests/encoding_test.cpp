@@ -421,6 +421,43 @@ TEST(EncToUnicode, LogsNothing)
     EXPECT_EQ("", LogOf("1", [] { ToUnicode("a\x81\xFF"); }));
 }
 
+// --- Single characters ---
+
+TEST(EncWide, IsTakenAndPutCharacterByCharacter)
+{
+    const std::u32string characters = U"a\u00AB\u20AC\uFFFF\U00010000\U0001F600\U0010FFFF";
+    std::wstring text;
+    for (char32_t c : characters)
+        Enc_AppendWide(&text, c);
+    EXPECT_EQ(L"a\u00AB\u20AC\uFFFF\U00010000\U0001F600\U0010FFFF", text);
+    std::u32string taken;
+    for (const wchar_t *at = text.c_str(); *at;)
+        taken += Enc_NextWide(&at);
+    EXPECT_EQ(characters, taken);
+}
+
+TEST(EncJoinSurrogates, JoinsPairsOnly)
+{
+    EXPECT_EQ(0x10000u, Enc_JoinSurrogates(0xD800, 0xDC00));
+    EXPECT_EQ(0x1F600u, Enc_JoinSurrogates(0xD83D, 0xDE00));
+    EXPECT_EQ(0x10FFFFu, Enc_JoinSurrogates(0xDBFF, 0xDFFF));
+    for (auto [first, second] : {std::pair(0xDE00u, 0xD83Du),
+                                 {0xD83Du, 0xD83Du},
+                                 {0xD83Du, 0u},
+                                 {0xD83Du, 0xE000u},
+                                 {0xD7FFu, 0xDC00u},
+                                 {0x1D83Du, 0xDE00u}})
+        EXPECT_EQ(0u, Enc_JoinSurrogates(first, second)) << first << " " << second;
+}
+
+TEST(EncIsCharacter, LeavesOutSurrogatesAndWhatIsBeyond)
+{
+    for (uint32_t c : {0u, 0x41u, 0xD7FFu, 0xE000u, 0xFFFFu, 0x1F600u, 0x10FFFFu})
+        EXPECT_TRUE(Enc_IsCharacter(c)) << c;
+    for (uint32_t c : {0xD800u, 0xDFFFu, 0x110000u, 0xFFFFFFFFu})
+        EXPECT_FALSE(Enc_IsCharacter(c)) << c;
+}
+
 // --- UTF-8 ---
 
 namespace
@@ -507,7 +544,7 @@ TEST_F(EncUtf8, HoldsAllCharactersButMarks)
     for (wchar_t c : {L'a', L'\u0436', L'\U0001F600', L'\uE000', L'\u00AB', L'\t'})
         EXPECT_TRUE(Enc_Holds(c, &EncodingUtf8)) << int(c);
     for (int c : {0x02, 0x05, 0xD800, 0xDFFF, 0x110000})
-        EXPECT_FALSE(Enc_Holds(wchar_t(c), &EncodingUtf8)) << c;
+        EXPECT_FALSE(Enc_Holds(c, &EncodingUtf8)) << c;
 }
 
 TEST_F(EncUtf8, IsFoundInValidTextOnly)

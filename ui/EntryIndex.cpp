@@ -4,7 +4,6 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
-#include <cwchar>
 
 #include "base/Ascii.h"
 #include "encoding/Encoding.h"
@@ -132,7 +131,7 @@ static bool RowBeginsWith(const IndexItem *item, BibFile *const *files, int file
 
 static void StartOver(TypeAhead *state)
 {
-    state->prefix[0] = 0;
+    state->prefix.clear();
     state->lastFound = -1;
 }
 
@@ -162,8 +161,8 @@ struct Prefix {
 static Prefix PrefixIn(const wchar_t *text, const EncodingRecord *encoding)
 {
     Prefix prefix = {encoding, false, Enc_Encode(text, encoding), {}};
-    for (; *text; ++text)
-        prefix.isForeign |= !Enc_Holds(*text, encoding);
+    while (*text)
+        prefix.isForeign |= !Enc_Holds(Enc_NextWide(&text), encoding);
     if (Enc_NeedsFolding(prefix.bytes.c_str(), encoding))
         prefix.folded = Enc_FoldUtf8(prefix.bytes.c_str());
     return prefix;
@@ -193,24 +192,31 @@ static int FindByPrefix(const wchar_t *prefix, const IndexItem *index, int count
     return -1;
 }
 
+static int CountCharacters(const wchar_t *text)
+{
+    int count = 0;
+    for (; *text; Enc_NextWide(&text))
+        ++count;
+    return count;
+}
+
 TypeAheadVerdict TypeAhead_Key(TypeAhead *state, uint32_t key, bool modified, int32_t now,
                                int selection, const IndexItem *index, int count,
                                BibFile *const *files, int fileCount)
 {
-    if (state->prefix[0] != 0 && !Continues(state, key, modified, now, selection))
+    if (!state->prefix.empty() && !Continues(state, key, modified, now, selection))
         StartOver(state);
     if (key == 0 || modified)
         return TYPE_AHEAD_SKIP;
-    if (wcslen(state->prefix) >= TYPE_AHEAD_LIMIT)
+    if (CountCharacters(state->prefix.c_str()) >= TYPE_AHEAD_LIMIT)
         StartOver(state);
     state->lastKeyTime = now;
 
-    size_t length = wcslen(state->prefix);
-    state->prefix[length] = static_cast<wchar_t>(key);
-    state->prefix[length + 1] = 0;
-    int row = FindByPrefix(state->prefix, index, count, files, fileCount);
+    size_t length = state->prefix.size();
+    Enc_AppendWide(&state->prefix, key);
+    int row = FindByPrefix(state->prefix.c_str(), index, count, files, fileCount);
     if (row < 0) {
-        state->prefix[length] = 0;
+        state->prefix.resize(length);
         return TYPE_AHEAD_NO_ROW;
     }
     state->lastFound = row;

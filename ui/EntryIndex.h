@@ -42,7 +42,7 @@ enum { TYPE_AHEAD_PAUSE = 1000, TYPE_AHEAD_LIMIT = 30 }; // milliseconds; charac
 struct TypeAhead {
     int32_t lastKeyTime = 0;
     int lastFound = -1; // row selected by the last letter that matched
-    wchar_t prefix[TYPE_AHEAD_LIMIT + 2] = L"";
+    std::wstring prefix;
 };
 
 enum TypeAheadVerdict {
