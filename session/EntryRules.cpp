@@ -6,6 +6,7 @@
 #include "base/Ascii.h"
 #include "base/Log.h"
 #include "encoding/Encoding.h"
+#include "session/FieldCheck.h"
 
 // --- Fields ---
 
@@ -134,7 +135,10 @@ std::string Entry_CheckType(const char *typeName, const char *specs)
                "' can't be written to a BIB file.";
     int newNames = 0;
     for (const std::string &name : MandatoryFields(specs)) {
-        if (!Bib_IsName(name.c_str()))
+        FieldFacts field = {};
+        field.name = name;
+        field.isNew = true;
+        if (FieldCheck_Refusal(field))
             return std::string("The type `") + typeName + "' asks for the field `" + name +
                    "', which can't be written to a BIB file.";
         newNames += !Bib_IsFieldKnown(name.c_str());

@@ -37,7 +37,7 @@ std::vector<StringLine> Strings_Lines(const StringSources *sources, int source);
 
 std::string Strings_KeyOf(const StringLine &line); // its text up to the first blank
 
-// A line for a question (Value_LossesQuestion) about the abbreviations that were typed for `name`:
+// A line for a question (FieldCheck_Question) about the abbreviations that were typed for `name`:
 // those in the text that were not in the text `before`, and of which nobody knows: no open file, no
 // list, and not BibTeX's styles, which define the months. "" for none.
 std::wstring Strings_UnknownIn(const StringSources *sources, const std::wstring &name,

@@ -6,8 +6,6 @@
 #include "encoding/Encoding.h"
 #include "store/BibStore.h"
 
-const wchar_t Value_LossesQuestion[] = L"\nDo you want to accept these changes anyway ?";
-
 std::string Value_Read(const std::wstring &typed, const EncodingRecord *encoding)
 {
     std::string value = Enc_Encode(typed.c_str(), encoding);
@@ -41,15 +39,6 @@ bool Value_HasBadMarks(const std::string &value)
         open = FindMark(value, close + 1);
     }
     return false;
-}
-
-const char *Value_Check(const char *value)
-{
-    const char *reason = Bib_CheckValue(value);
-    if (!reason && Value_HasBadMarks(value))
-        reason = "The name of an abbreviation is missing, begins with a digit, or holds a "
-                 "backslash or a control character";
-    return reason;
 }
 
 // --- Losses ---
@@ -141,20 +130,34 @@ static std::u32string ReplacedCharacters(const std::wstring &text, const std::st
     return replaced;
 }
 
-std::wstring Value_Losses(const std::wstring &name, const std::wstring &text,
-                          const std::string &stored, bool textGuillemets,
-                          const EncodingRecord *encoding)
+static std::wstring Label(const EncodingRecord *encoding)
 {
-    std::wstring label = Enc_Decode(Enc_Label(encoding), encoding), losses;
+    return Enc_Decode(Enc_Label(encoding), encoding);
+}
+
+std::wstring Value_LostText(const std::wstring &name, const std::wstring &text,
+                            const EncodingRecord *encoding)
+{
     std::u32string lost = LostCharacters(text, encoding);
-    if (!lost.empty())
-        losses += L"`" + name + L"': " + ListCharacters(lost) + L" can't be stored in " + label +
-                  L" and would become " + Stored(lost[0], encoding) + L".\n";
+    if (lost.empty())
+        return L"";
+    return L"`" + name + L"': " + ListCharacters(lost) + L" can't be stored in " + Label(encoding) +
+           L" and would become " + Stored(lost[0], encoding) + L".\n";
+}
+
+std::wstring Value_ReplacedText(const std::wstring &name, const std::wstring &text,
+                                const std::string &stored, const EncodingRecord *encoding)
+{
     std::u32string replaced = ReplacedCharacters(text, stored, encoding);
-    if (!replaced.empty())
-        losses += L"`" + name + L"': " + label + L" shows bytes of the old value as " +
-                  ListCharacters(replaced) + L", and they would become just that.\n";
-    if (textGuillemets && HoldsGuillemets(text))
-        losses += L"`" + name + L"': \xAB and \xBB will mark an abbreviation, not stand as text.\n";
-    return losses;
+    if (replaced.empty())
+        return L"";
+    return L"`" + name + L"': " + Label(encoding) + L" shows bytes of the old value as " +
+           ListCharacters(replaced) + L", and they would become just that.\n";
+}
+
+std::wstring Value_GuillemetText(const std::wstring &name, const std::wstring &text)
+{
+    if (!HoldsGuillemets(text))
+        return L"";
+    return L"`" + name + L"': \xAB and \xBB will mark an abbreviation, not stand as text.\n";
 }

@@ -10,6 +10,7 @@
 #include <wx/panel.h>
 #include <wx/sizer.h>
 #include <wx/srchctrl.h>
+#include <wx/stattext.h>
 #include <wx/toolbar.h>
 
 #include "base/Companion.h"

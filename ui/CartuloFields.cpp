@@ -7,6 +7,7 @@
 
 #include "base/Companion.h"
 #include "base/Log.h"
+#include "session/FieldCheck.h"
 #include "session/Names.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
@@ -47,7 +48,7 @@ void Cartulo::OnNewField(wxCommandEvent &)
         Box_Warn(this, AddTitle, Name_MisfitText(key));
         break;
     case NAME_UNWRITABLE:
-        Box_Warn(this, AddTitle, FieldKey_UnwritableText);
+        Box_Warn(this, AddTitle, FieldCheck_NameText);
         break;
     case NAME_OK:
     case NAME_TAKEN: // told when it is added

@@ -6,6 +6,7 @@
 #include <wx/textctrl.h>
 
 #include "base/Companion.h"
+#include "session/FieldCheck.h"
 #include "session/Names.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
@@ -13,9 +14,6 @@
 
 const char FieldKey_BadCharsText[] = "Specified field key includes wrong characters.\n"
                                      "We will remove them from key and continue.";
-const char FieldKey_UnwritableText[] = "A field of this name can't be written to a BIB file.\n"
-                                       "It must not begin with a digit, and hold no backslash "
-                                       "or control character.";
 const char FieldKey_TakenText[] = "Field with specified key is already exists.";
 
 // --- The value ---
@@ -94,7 +92,7 @@ bool Cartulo_RenameField::Accept(const TypedName &name)
         Box_Warn(this, GetTitle(), Name_MisfitText(name));
         return false;
     case NAME_UNWRITABLE:
-        Box_Warn(this, GetTitle(), FieldKey_UnwritableText);
+        Box_Warn(this, GetTitle(), FieldCheck_NameText);
         return false;
     case NAME_TAKEN:
         Box_Warn(this, GetTitle(), FieldKey_TakenText);

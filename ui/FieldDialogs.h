@@ -15,7 +15,6 @@ enum { ID_FIELD_KEY = 6001, ID_FIELD_VALUE = 6002, ID_FIELD_NEW_NAME = 6002 };
 
 // What is wrong with the name of a field, for the user.
 extern const char FieldKey_BadCharsText[];
-extern const char FieldKey_UnwritableText[];
 extern const char FieldKey_TakenText[];
 
 class Cartulo_EditField : public wxDialog

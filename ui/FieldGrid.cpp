@@ -9,7 +9,7 @@
 #include "base/Ascii.h"
 #include "encoding/Encoding.h"
 #include "session/Changes.h"
-#include "session/KnownStrings.h"
+#include "session/FieldCheck.h"
 #include "session/Values.h"
 
 static bool SameName(const char *a, const char *b)
@@ -353,34 +353,49 @@ static bool HoldsGuillemets(const BibEntry *entry, const EncodingRecord *encodin
         [encoding](const BibField &field) { return Value_HoldsGuillemets(field.value, encoding); });
 }
 
-static std::wstring RowLosses(const FieldGrid *grid, const GridRow *row, bool textGuillemets,
-                              const StringSources *sources)
+static bool HasTextGuillemets(const FieldGrid *grid)
 {
-    std::wstring key = Enc_Decode(row->key.c_str(), grid->encoding);
-    std::wstring losses = Value_Losses(key, row->text, row->stored, textGuillemets, grid->encoding);
-    return sources ? losses + Strings_UnknownIn(sources, key, row->text, row->filled) : losses;
+    return HoldsGuillemets(grid->entry, grid->encoding) ||
+           (grid->parent && HoldsGuillemets(grid->parent, grid->encoding));
+}
+
+// --- Checking ---
+
+// But for the value itself: reading that is logged.
+static FieldFacts Facts(const FieldGrid *grid, const GridRow *row)
+{
+    FieldFacts field = {};
+    field.name = row->key;
+    field.isChanged = IsChanged(row);
+    field.label = Enc_Decode(row->key.c_str(), grid->encoding);
+    field.text = row->text;
+    field.filled = row->filled;
+    field.stored = row->stored;
+    field.encoding = grid->encoding;
+    return field;
 }
 
 std::wstring Grid_Losses(const FieldGrid *grid, const StringSources *sources)
 {
-    bool textGuillemets = HoldsGuillemets(grid->entry, grid->encoding) ||
-                          (grid->parent && HoldsGuillemets(grid->parent, grid->encoding));
+    bool textGuillemets = HasTextGuillemets(grid);
     std::wstring text;
-    for (int i = 0; i < grid->count; ++i)
-        if (IsChanged(&grid->rows[i]))
-            text += RowLosses(grid, &grid->rows[i], textGuillemets, sources);
-    return text.empty() ? text : text + Value_LossesQuestion;
+    for (int i = 0; i < grid->count; ++i) {
+        FieldFacts field = Facts(grid, &grid->rows[i]);
+        field.textGuillemets = textGuillemets;
+        field.sources = sources;
+        text += FieldCheck_Warnings(field);
+    }
+    return text.empty() ? text : text + FieldCheck_Question;
 }
-
-// --- Checking ---
 
 const char *Grid_CheckRow(const FieldGrid *grid, int index)
 {
     const GridRow *row = &grid->rows[index];
     if (row->inherited)
         return nullptr;
-    std::string value = ValueOf(grid, row);
-    return IsChanged(row) ? Value_Check(value.c_str()) : Bib_CheckValue(value.c_str());
+    FieldFacts field = Facts(grid, row);
+    field.value = ValueOf(grid, row);
+    return FieldCheck_Refusal(field);
 }
 
 // Whether the key of row i is neither in the table already nor brought there by an earlier row.

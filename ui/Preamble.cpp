@@ -12,6 +12,7 @@
 #include "base/Log.h"
 #include "encoding/Encoding.h"
 #include "session/Changes.h"
+#include "session/FieldCheck.h"
 #include "session/Values.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
@@ -111,12 +112,16 @@ bool Cartulo_Preamble::MayStore(const PreambleEdit &edit)
 {
     if (!Allow(Preamble_CheckSize(edit.text)))
         return false;
-    const EncodingRecord *encoding = Encoding();
-    std::wstring losses =
-        Value_Losses(L"PREAMBLE", edit.touched, edit.replaced,
-                     Value_HoldsGuillemets(edit.replaced.c_str(), encoding), encoding);
+    FieldFacts field = {};
+    field.isChanged = true;
+    field.label = L"PREAMBLE";
+    field.text = edit.touched;
+    field.stored = edit.replaced;
+    field.encoding = Encoding();
+    field.textGuillemets = Value_HoldsGuillemets(edit.replaced.c_str(), field.encoding);
+    std::wstring losses = FieldCheck_Warnings(field);
     return losses.empty() ||
-           Box_Ask(this, QuestionCaption, losses + Value_LossesQuestion, wxNO_DEFAULT);
+           Box_Ask(this, QuestionCaption, losses + FieldCheck_Question, wxNO_DEFAULT);
 }
 
 // Shows a reason against the text, if there is one.

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
+#include "session/FieldCheck.h"
 #include "session/Values.h"
 
 int CurrentPreamble = 0;
@@ -163,9 +164,13 @@ std::string Preamble_CheckSize(const std::string &text)
 std::vector<PreambleFault> Preamble_Check(const std::string &text)
 {
     std::vector<PreambleFault> faults;
-    for (const std::string &piece : SplitPieces(text))
-        if (const char *reason = Value_Check(piece.c_str()))
+    for (const std::string &piece : SplitPieces(text)) {
+        FieldFacts field = {};
+        field.value = piece;
+        field.isChanged = true;
+        if (const char *reason = FieldCheck_Refusal(field))
             faults.push_back({piece, reason});
+    }
     return faults;
 }
 

@@ -11,6 +11,7 @@
 #include "base/Log.h"
 #include "encoding/Encoding.h"
 #include "session/Changes.h"
+#include "session/FieldCheck.h"
 #include "session/Values.h"
 #include "ui/Dialogs.h"
 #include "ui/DisplayText.h"
@@ -392,23 +393,29 @@ bool Cartulo_Strings_Edit::AcceptKey(const TypedName &key, NameVerdict verdict)
 
 bool Cartulo_Strings_Edit::AcceptValue(const std::string &value)
 {
-    if (!AcceptLosses())
+    const std::string stored = m_string ? m_string->value : "";
+    FieldFacts field = {};
+    field.value = value;
+    field.isChanged = true;
+    field.label = m_key->GetValue().ToStdWstring();
+    field.text = m_value->GetValue().ToStdWstring();
+    field.filled = m_filled.ToStdWstring();
+    field.stored = stored;
+    field.textGuillemets = Value_HoldsGuillemets(stored.c_str(), m_encoding);
+    field.encoding = m_encoding;
+    field.sources = m_sources;
+    if (!AcceptLosses(FieldCheck_Warnings(field)))
         return false;
-    const char *reason = Value_Check(value.c_str());
+    const char *reason = FieldCheck_Refusal(field);
     if (reason)
         Refuse(wxString("Wrong string syntax:\n\n") + reason + "\n\nFix the problem to continue.",
                m_value);
     return !reason;
 }
 
-bool Cartulo_Strings_Edit::AcceptLosses()
+bool Cartulo_Strings_Edit::AcceptLosses(const std::wstring &losses)
 {
-    const char *stored = m_string ? m_string->value : "";
-    std::wstring key = m_key->GetValue().ToStdWstring(), text = m_value->GetValue().ToStdWstring();
-    std::wstring losses =
-        Value_Losses(key, text, stored, Value_HoldsGuillemets(stored, m_encoding), m_encoding) +
-        Strings_UnknownIn(m_sources, key, text, m_filled.ToStdWstring());
-    if (losses.empty() || Box_Ask(this, Caption, losses + Value_LossesQuestion, wxNO_DEFAULT))
+    if (losses.empty() || Box_Ask(this, Caption, losses + FieldCheck_Question, wxNO_DEFAULT))
         return true;
     Text_Focus(m_value);
     return false;

@@ -68,7 +68,7 @@ private:
     void Refuse(const wxString &text, wxTextCtrl *at);
     bool AcceptKey(const TypedName &key, NameVerdict verdict);
     bool AcceptValue(const std::string &value);
-    bool AcceptLosses();
+    bool AcceptLosses(const std::wstring &losses);
     bool RefuseForMemory();
     bool Add();
     bool Edit();

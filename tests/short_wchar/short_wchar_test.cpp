@@ -175,15 +175,15 @@ TEST(Utf16Value, NamesEachLostCharacterOnce)
     const std::wstring text = L"\U0001F600a\U0001F601\U0001F600\u0416\U00020000\x85";
     EXPECT_EQ(u"`a': \U0001F600 \U0001F601 \u0416 \U00020000 U+0085 can't be stored in CP1252 and "
               u"would become \u00FF.\n",
-              Units(Value_Losses(L"a", text, "", false, Cp1252())));
+              Units(Value_LostText(L"a", text, Cp1252())));
 }
 
 TEST(Utf16Value, LosesNothingInUtf8ButHalfAPair)
 {
-    EXPECT_EQ(u"", Units(Value_Losses(L"a", L"\U0001F600\U0002A6D6", "", false, &EncodingUtf8)));
-    EXPECT_EQ(
-        u"`a': "s + char16_t(0xD83D) + u" can't be stored in UTF-8 and would become \uFFFD.\n",
-        Units(Value_Losses(L"a", Wide({'x', 0xD83D, 'y', 0xD83D}), "", false, &EncodingUtf8)));
+    EXPECT_EQ(u"", Units(Value_LostText(L"a", L"\U0001F600\U0002A6D6", &EncodingUtf8)));
+    EXPECT_EQ(u"`a': "s + char16_t(0xD83D) +
+                  u" can't be stored in UTF-8 and would become \uFFFD.\n",
+              Units(Value_LostText(L"a", Wide({'x', 0xD83D, 'y', 0xD83D}), &EncodingUtf8)));
 }
 
 TEST(Utf16Value, NamesTwentyLostCharacters)
@@ -195,7 +195,7 @@ TEST(Utf16Value, NamesTwentyLostCharacters)
             named += (i > 0 ? u" "s : u""s) + text.substr(2 * i, 2);
     }
     EXPECT_EQ(u"`a': " + named + u" ... can't be stored in CP1252 and would become \u00FF.\n",
-              Units(Value_Losses(L"a", Wide(text), "", false, Cp1252())));
+              Units(Value_LostText(L"a", Wide(text), Cp1252())));
 }
 
 TEST(Utf16Name, IsReadAndChecked)
