@@ -1,3 +1,4 @@
+// bench/Attacks.cpp - clients of the command channel that do what they can to keep a program busy.
 #include "bench/Attacks.h"
 
 #include <csignal>

@@ -1,3 +1,4 @@
+// bench/Library.cpp - a large BIB file, always the same.
 #include "bench/Library.h"
 
 #include <cstdint>

@@ -1,3 +1,4 @@
+// bench/Ratios.cpp - measured times by name, and what they are against each other.
 #include "bench/Ratios.h"
 
 #include <algorithm>

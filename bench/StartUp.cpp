@@ -1,3 +1,4 @@
+// bench/StartUp.cpp - how long a program takes to show its window.
 #include "bench/StartUp.h"
 
 #include <chrono>

@@ -1,3 +1,4 @@
+// session/EntryRules.cpp - what may be added, renamed and removed.
 #include "session/EntryRules.h"
 
 #include <algorithm>

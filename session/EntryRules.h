@@ -1,4 +1,4 @@
-// session/EntryRules.h - what may be added, renamed and removed, and what that changes in the
+// session/EntryRules.h - what may be added, renamed and removed; Changes.h does it.
 // store.
 #pragma once
 

@@ -1,3 +1,4 @@
+// session/KnownStrings.cpp - the abbreviations that are known.
 #include "session/KnownStrings.h"
 
 #include <cstring>

@@ -1,4 +1,5 @@
-// session/KnownStrings.h - the abbreviations that the strings window shows and changes.
+// session/KnownStrings.h - the abbreviations that are known: of open files, and of lists in the INI
+// file.
 //
 // A source tells whose they are: the index of a file, STRINGS_OF_ALL_FILES, or, below that, a list
 // of the INI file (-2 is the last list). So the lists, all files and each file stand in this order

@@ -1,3 +1,4 @@
+// session/MessagesText.cpp - what the loading-messages window says.
 #include "session/MessagesText.h"
 
 #include "encoding/Encoding.h"

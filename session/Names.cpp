@@ -1,3 +1,5 @@
+// session/Names.cpp - what users type for the key of an entry, or the name of a field or an
+// abbreviation.
 #include "session/Names.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// session/Schema.cpp - the INI file that describes the entry types and their fields.
 #include "session/Schema.h"
 
 #include <algorithm>

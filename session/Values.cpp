@@ -1,3 +1,5 @@
+// session/Values.cpp - what users type for a value: of a field, an abbreviation, a preamble, a
+// search.
 #include "session/Values.h"
 
 #include <algorithm>

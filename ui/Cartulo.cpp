@@ -1,3 +1,4 @@
+// ui/Cartulo.cpp - the editor panel: the entry list at the left, the selected entry at the right.
 #include "ui/Cartulo.h"
 
 #include <cstdlib>

@@ -1,3 +1,4 @@
+// ui/Dialogs.cpp - what the program's windows and boxes have in common.
 #include "ui/Dialogs.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// ui/DisplayText.cpp - 8-bit texts for the controls of the toolkit.
 #include "ui/DisplayText.h"
 
 #include <wx/control.h>

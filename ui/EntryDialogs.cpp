@@ -1,3 +1,4 @@
+// ui/EntryDialogs.cpp - the windows that add an entry and rename one.
 #include "ui/EntryDialogs.h"
 
 #include <wx/checkbox.h>

@@ -1,3 +1,4 @@
+// ui/FieldDialogs.cpp - the windows for a field of the entry that is edited: its value, its name.
 #include "ui/FieldDialogs.h"
 
 #include <wx/combobox.h>

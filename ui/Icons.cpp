@@ -1,3 +1,4 @@
+// ui/Icons.cpp - pictures of the tools and of the program, and buttons that show them.
 #include "ui/Icons.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// ui/Messages.cpp - the window with the errors and warnings of loading.
 #include "ui/Messages.h"
 
 #include <wx/sizer.h>

@@ -1,3 +1,4 @@
+// ui/Native-gtk.cpp - what only the window system can answer.
 #include "ui/Native.h"
 
 #include <cstring>

@@ -1,3 +1,4 @@
+// ui/PanelRules.cpp - decisions of the editor panel that need no window.
 #include "ui/PanelRules.h"
 
 #include "ui/Ids.h"

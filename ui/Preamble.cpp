@@ -1,3 +1,4 @@
+// ui/Preamble.cpp - the window for the preambles of the open files.
 #include "ui/Preamble.h"
 
 #include <wx/choice.h>

@@ -1,3 +1,4 @@
+// ui/PreambleText.cpp - the preamble of a file, as the text of a control and back.
 #include "ui/PreambleText.h"
 
 #include <algorithm>

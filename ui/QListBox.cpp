@@ -1,3 +1,4 @@
+// ui/QListBox.cpp - the entry list: one row per entry of all open files.
 #include "ui/QListBox.h"
 
 #include <cstdlib>

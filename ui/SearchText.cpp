@@ -1,3 +1,4 @@
+// ui/SearchText.cpp - the text of the search field, as the entries of one file are searched for it.
 #include "ui/SearchText.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// ui/Strings.cpp - the windows for abbreviations: the list of a source, and one of them.
 #include "ui/Strings.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// ui/Theme.cpp - texts in colour on light and dark desktops.
 #include "ui/Theme.h"
 
 #include <wx/settings.h>

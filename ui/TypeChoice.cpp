@@ -1,3 +1,5 @@
+// ui/TypeChoice.cpp - choosing the type of an entry: all of the store's but the fixed ones, which
+// no entry has.
 #include "ui/TypeChoice.h"
 
 #include <algorithm>

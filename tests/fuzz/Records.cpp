@@ -1,3 +1,4 @@
+// tests/fuzz/Records.cpp - BIB files out of bytes, and their records as text.
 #include "tests/fuzz/Records.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// tests/gui/GuiTest.cpp - tests of the windows, inside the running event loop.
 #include "tests/gui/GuiTest.h"
 
 #include <chrono>
