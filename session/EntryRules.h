@@ -1,5 +1,4 @@
 // session/EntryRules.h - what may be added, renamed and removed; Changes.h does it.
-// store.
 #pragma once
 
 #include <string>
