@@ -74,9 +74,10 @@ MyServer::~MyServer()
 
 bool MyServer::Listen(const std::string &path)
 {
-    int socket = Sys_ListenLocal(path.c_str());
+    SysReason why = {};
+    int socket = Sys_ListenLocal(path.c_str(), &why);
     if (!socket) {
-        std::string text = "can't listen at " + path + ": " + Sys_LastErrorText();
+        std::string text = "can't listen at " + path + ": " + why.text;
         TNSMessage("INFO: DDE server ", text.c_str(), TNS_LIFECYCLE);
         return false;
     }

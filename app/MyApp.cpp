@@ -87,13 +87,13 @@ const char *MyApp::BuildLine()
 // ends, so nothing is left to be cleaned up. Where it can't be made, the program runs alone.
 bool MyApp::TakeInstance(const std::string &name)
 {
-    char *path = Sys_PrivatePath(name.c_str(), ".lock");
-    m_instanceLock = path ? Sys_LockFile(path) : 0;
-    bool othersHoldIt = path && m_instanceLock == 0 && Sys_IsLockTaken();
-    if (m_instanceLock == 0 && !othersHoldIt)
-        AppLog("ERROR: No instance lock: ", Sys_LastErrorText());
+    SysReason why = {};
+    char *path = Sys_PrivatePath(name.c_str(), ".lock", &why);
+    m_instanceLock = path ? Sys_LockFile(path, &why) : 0;
     free(path);
-    return !othersHoldIt;
+    if (m_instanceLock == 0 && !why.isTaken)
+        AppLog("ERROR: No instance lock: ", why.text);
+    return m_instanceLock != 0 || !why.isTaken;
 }
 
 bool MyApp::IsFirst()

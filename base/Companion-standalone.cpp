@@ -231,22 +231,23 @@ const char *TNSFind(const char *)
 
 // --- Windows ---
 
-static char *FramePath(const char *instance)
+static char *FramePath(const char *instance, SysReason *why)
 {
-    return Sys_PrivatePath(instance, ".frame");
+    return Sys_PrivatePath(instance, ".frame", why);
 }
 
 void RegisterFrame(const char *instance, long window)
 {
-    char *path = FramePath(instance);
-    if (!path || !Sys_PostNote(path, std::to_string(window).c_str()))
-        TNSMessage("WARNING: RegisterFrame ", Sys_LastErrorText(), TNS_WARNING);
+    SysReason why = {};
+    char *path = FramePath(instance, &why);
+    if (!path || !Sys_PostNote(path, std::to_string(window).c_str(), &why))
+        TNSMessage("WARNING: RegisterFrame ", why.text, TNS_WARNING);
     free(path);
 }
 
 long FindFrame(const char *instance)
 {
-    char *path = FramePath(instance);
+    char *path = FramePath(instance, nullptr);
     std::string text = TakeText(path ? Sys_ReadNote(path) : nullptr);
     free(path);
     char *end;

@@ -1,6 +1,11 @@
 // base/Sys-posix.h - shared by the files that implement Sys.h on POSIX systems.
 #pragma once
 
+struct SysReason;
+
+// Puts what errno says into the reason, when somebody wants to know; errno stays as it is. 0.
+int Sys_TellWhy(SysReason *why);
+
 int Sys_FailWith(int error);     // leaves the reason in errno; 0
 void Sys_CloseQuietly(int file); // leaves errno alone
 

@@ -12,13 +12,15 @@
 // --- Errors and the executable ---
 
 // Why a call failed. Functions that can fail for many reasons take one as their last argument and
-// fill it when they fail; null: nobody wants to know.
+// fill it when they fail, and only then; null: nobody wants to know. What is called later leaves it
+// alone.
 struct SysReason {
     char text[256]; // in the system's words, for the user
-    int isTaken;    // somebody else holds the lock
+    int isTaken;    // somebody else holds the lock (Sys_LockFile)
 };
 
-const char *Sys_LastErrorText();     // the system's text for the last error; static buffer
+const char *Sys_LastErrorText();     // the system's text for the last error, to be asked right
+                                     // after it; static buffer. Our own code uses SysReason
 char *Sys_ToBackslashes(char *path); // every '/' becomes '\', in place; null stays null
 const char *Sys_ModulePath();        // full path of the executable, at most 260 characters
 
@@ -34,26 +36,28 @@ uint64_t Sys_FileStamp(const char *path);
 uint64_t Sys_StreamStamp(FILE *stream);
 
 // Opens a regular file for reading; anything else (folder, device, pipe) fails without waiting.
-// Null on failure, with the reason in Sys_LastErrorText().
-FILE *Sys_OpenRegular(const char *path);
+// Null on failure.
+FILE *Sys_OpenRegular(const char *path, SysReason *why = nullptr);
 
 // Reads the rest of a stream. A malloc'd buffer with one spare byte behind `*length` bytes, or
 // null when reading fails or memory is out.
-char *Sys_ReadAll(FILE *stream, size_t *length);
+char *Sys_ReadAll(FILE *stream, size_t *length, SysReason *why = nullptr);
+
+// Writes to a stream, which may keep a part in its buffer. 1, or 0 when something is lost.
+int Sys_WriteStream(FILE *stream, const void *data, size_t size, SysReason *why = nullptr);
 
 // Opens `path` (created when missing) and shuts other writers out; readers stay welcome.
-// Returns a handle, never 0; on failure 0, with the reason in Sys_LastErrorText().
-int Sys_LockFile(const char *path);
-int Sys_IsLockTaken(); // 1 when the last Sys_LockFile failed because somebody else holds the lock
+// Returns a handle, never 0; on failure 0.
+int Sys_LockFile(const char *path, SysReason *why = nullptr);
 void Sys_UnlockFile(int handle);        // 0 is ignored
 int Sys_IsLockedHere(const char *path); // 1 when this process holds the lock of that file
 
 // Keeps the contents of `path`, which will be replaced, under a second name: by a link, or by a
 // copy where the file system has no links or `copy` is on another one. Of a symbolic link the
 // target is kept. Never replaces anything: fails when `copy` exists. 1 or 0.
-int Sys_KeepCopy(const char *path, const char *copy);
+int Sys_KeepCopy(const char *path, const char *copy, SysReason *why = nullptr);
 
-int Sys_RemoveFile(const char *path); // 1 or 0
+int Sys_RemoveFile(const char *path, SysReason *why = nullptr); // 1 or 0
 
 // Writing to a closed pipe or beyond a size limit fails like any other write from now on, instead
 // of ending the process with all that is not saved. Call once, at the start.
@@ -72,9 +76,15 @@ struct SysReplace {
     char *target;    // heap: the file that will be replaced
     char *temporary; // heap
 };
-int Sys_StartReplace(SysReplace *replace, const char *path); // 0: nothing to clean up
-int Sys_CommitReplace(SysReplace *replace);                  // frees; 0: the path is untouched
-void Sys_CancelReplace(SysReplace *replace);                 // frees; removes the temporary file
+
+// 1, or 0 with nothing to clean up.
+int Sys_StartReplace(SysReplace *replace, const char *path, SysReason *why = nullptr);
+
+// Frees. 1, or 0 with the path untouched: also for an earlier write that failed, but why it did was
+// known then only (Sys_WriteStream).
+int Sys_CommitReplace(SysReplace *replace, SysReason *why = nullptr);
+
+void Sys_CancelReplace(SysReplace *replace); // frees; removes the temporary file
 
 // --- Time and places ---
 
@@ -88,14 +98,14 @@ char *Sys_DataFolder();   // $XDG_DATA_HOME, else ~/.local/share
 
 // The path by which the user's processes meet under `name`, a text of any form: a file named by a
 // number made of it, with `ending`, in a folder that nobody else can enter
-// ($XDG_RUNTIME_DIR/quarlo, else one in the temporary folder). malloc'd; null, with the reason in
-// Sys_LastErrorText(), when there is no such folder and none can be made.
-char *Sys_PrivatePath(const char *name, const char *ending);
+// ($XDG_RUNTIME_DIR/quarlo, else one in the temporary folder). malloc'd; null when there is no such
+// folder and none can be made.
+char *Sys_PrivatePath(const char *name, const char *ending, SysReason *why = nullptr);
 
 // Leaves a text for the user's other processes at `path`; it stands while this process lives,
 // however that ends, and not for children that outlive it. It takes the place of an older text in
-// one step, also of another process's. 1, or 0 with the reason in Sys_LastErrorText().
-int Sys_PostNote(const char *path, const char *text);
+// one step, also of another process's. 1 or 0.
+int Sys_PostNote(const char *path, const char *text, SysReason *why = nullptr);
 
 // The text there; malloc'd, at most 4 KiB. Null for none, or when its process has ended.
 char *Sys_ReadNote(const char *path);
@@ -125,15 +135,15 @@ char *Sys_FindFile(const char *folder, const char *name, int deep);
 
 // Listens at `path` (mode 0600). A socket file that nobody serves is replaced; any other file is
 // left alone. Some 250 peers may wait to be accepted; further ones try again until their deadline.
-// 0 on failure, with the reason in Sys_LastErrorText().
-int Sys_ListenLocal(const char *path);
+// 0 on failure.
+int Sys_ListenLocal(const char *path, SysReason *why = nullptr);
 
 // The next peer that waits; 0 for none. A peer of another user is turned away.
 int Sys_AcceptLocal(int listener);
 
-// Connects to who serves `path`, within `milliseconds`. 0 on failure, with the reason in
-// Sys_LastErrorText(). A server of another user is not trusted.
-int Sys_ConnectLocal(const char *path, int milliseconds);
+// Connects to who serves `path`, within `milliseconds`. 0 on failure. A server of another user is
+// not trusted.
+int Sys_ConnectLocal(const char *path, int milliseconds, SysReason *why = nullptr);
 
 // The count of bytes; 0 when nothing can be read or written now, -1 when the other side is gone.
 long Sys_Receive(int socket, void *buffer, size_t size);

@@ -52,13 +52,23 @@ static void RemoveQuietly(const char *path)
 
 // --- Errors and places ---
 
+int Sys_TellWhy(SysReason *why)
+{
+    int error = errno;
+    if (why) {
+        const char *text =
+            error == ETXTBSY ? "The file is in use by another program" : strerror(error);
+        snprintf(why->text, sizeof why->text, "%s", text);
+        why->isTaken = 0;
+    }
+    return Sys_FailWith(error);
+}
+
 const char *Sys_LastErrorText()
 {
-    static char text[256];
-    const char *reason =
-        errno == ETXTBSY ? "The file is in use by another program" : strerror(errno);
-    snprintf(text, sizeof text, "%s", reason);
-    return text;
+    static SysReason last;
+    Sys_TellWhy(&last);
+    return last.text;
 }
 
 char *Sys_ToBackslashes(char *path)
@@ -128,9 +138,9 @@ static int IsOpenAt(int fd, const char *path)
     return fstat(fd, &opened) == 0 && stat(path, &named) == 0 && IsSame(&opened, &named);
 }
 
-int Sys_RemoveFile(const char *path)
+int Sys_RemoveFile(const char *path, SysReason *why)
 {
-    return unlink(path) == 0;
+    return unlink(path) == 0 || Sys_TellWhy(why);
 }
 
 static uint64_t Stamp(const struct stat *status)
@@ -181,13 +191,13 @@ static int OpenRegular(const char *path, int flags)
     return -1;
 }
 
-FILE *Sys_OpenRegular(const char *path)
+FILE *Sys_OpenRegular(const char *path, SysReason *why)
 {
     int fd = OpenRegular(path, O_RDONLY);
-    if (fd < 0)
-        return nullptr;
-    FILE *stream = fdopen(fd, "r");
+    FILE *stream = fd < 0 ? nullptr : fdopen(fd, "r");
     if (!stream)
+        Sys_TellWhy(why);
+    if (!stream && fd >= 0)
         Sys_CloseQuietly(fd);
     return stream;
 }
@@ -202,11 +212,13 @@ static size_t ExpectedLength(FILE *stream)
     return static_cast<size_t>(status.st_size - position);
 }
 
-char *Sys_ReadAll(FILE *stream, size_t *length)
+// Null, with the reason in errno, on failure.
+static char *ReadAll(FILE *stream, size_t *length)
 {
     size_t size = ExpectedLength(stream) + 1; // one more, so that the first read meets the end
     size_t used = 0;
     char *text = static_cast<char *>(malloc(size + 1));
+    errno = text ? EIO : ENOMEM; // where the stream has failed before and says nothing now
     while (text) {
         used += fread(text + used, 1, size - used, stream);
         if (used < size)
@@ -222,6 +234,14 @@ char *Sys_ReadAll(FILE *stream, size_t *length)
         return nullptr;
     }
     *length = used;
+    return text;
+}
+
+char *Sys_ReadAll(FILE *stream, size_t *length, SysReason *why)
+{
+    char *text = ReadAll(stream, length);
+    if (!text)
+        Sys_TellWhy(why);
     return text;
 }
 
@@ -250,7 +270,7 @@ static int LockDescriptor(int fd)
     return 0;
 }
 
-int Sys_LockFile(const char *path)
+static int LockFile(const char *path)
 {
     // A file that another program replaced between opening and locking is the wrong one.
     for (int attempt = 0; attempt < 10; ++attempt) {
@@ -270,9 +290,14 @@ int Sys_LockFile(const char *path)
     return Sys_FailWith(ETXTBSY);
 }
 
-int Sys_IsLockTaken()
+int Sys_LockFile(const char *path, SysReason *why)
 {
-    return errno == ETXTBSY;
+    int handle = LockFile(path);
+    if (handle == 0)
+        Sys_TellWhy(why);
+    if (handle == 0 && why)
+        why->isTaken = errno == ETXTBSY;
+    return handle;
 }
 
 void Sys_UnlockFile(int handle)
@@ -415,11 +440,11 @@ static int IsLinkRefused(int error)
            error == EXDEV;
 }
 
-int Sys_KeepCopy(const char *path, const char *copy)
+int Sys_KeepCopy(const char *path, const char *copy, SysReason *why)
 {
     if (linkat(AT_FDCWD, path, AT_FDCWD, copy, AT_SYMLINK_FOLLOW) != 0 &&
         (!IsLinkRefused(errno) || !CopyFile(path, copy)))
-        return 0;
+        return Sys_TellWhy(why);
     SyncFolder(copy);
     return 1;
 }
@@ -476,7 +501,7 @@ static int OpenTemporary(const char *target, mode_t mode, std::string *name)
     return -1;
 }
 
-int Sys_StartReplace(SysReplace *replace, const char *path)
+static int StartReplace(SysReplace *replace, const char *path)
 {
     *replace = {};
     mode_t mode;
@@ -499,24 +524,43 @@ int Sys_StartReplace(SysReplace *replace, const char *path)
     return 0;
 }
 
+int Sys_StartReplace(SysReplace *replace, const char *path, SysReason *why)
+{
+    return StartReplace(replace, path) || Sys_TellWhy(why);
+}
+
+int Sys_WriteStream(FILE *stream, const void *data, size_t size, SysReason *why)
+{
+    return fwrite(data, 1, size, stream) == size || Sys_TellWhy(why);
+}
+
+// What is still in the stream's buffer, and what was lost before: nobody knows why by now.
+static int FlushStream(FILE *stream)
+{
+    if (fflush(stream) != 0)
+        return 0;
+    return !ferror(stream) || Sys_FailWith(EIO);
+}
+
 static int FinishTemporary(SysReplace *replace)
 {
     struct stat old;
     int fd = fileno(replace->stream);
-    int ok = fflush(replace->stream) == 0 && !ferror(replace->stream);
+    int ok = FlushStream(replace->stream);
     if (ok && stat(replace->target, &old) == 0)
         KeepPermissions(fd, &old);
     ok = ok && SyncFile(fd);
-    ok = fclose(replace->stream) == 0 && ok;
+    int reason = errno;
+    int closed = fclose(replace->stream) == 0;
     replace->stream = nullptr;
-    return ok;
+    return ok ? closed : Sys_FailWith(reason);
 }
 
-int Sys_CommitReplace(SysReplace *replace)
+int Sys_CommitReplace(SysReplace *replace, SysReason *why)
 {
     if (!FinishTemporary(replace) || rename(replace->temporary, replace->target) != 0) {
         Sys_CancelReplace(replace);
-        return 0;
+        return Sys_TellWhy(why);
     }
     SyncFolder(replace->target);
     free(replace->temporary); // it is the target now

@@ -61,12 +61,14 @@ static int LockAndWrite(int fd, const char *text)
 {
     struct flock lock = WholeFile(F_WRLCK);
     size_t length = strlen(text);
-    if (length > LONGEST_NOTE) {
-        errno = EFBIG;
+    if (length > LONGEST_NOTE)
+        return Sys_FailWith(EFBIG);
+    if (fcntl(fd, F_SETLK, &lock) != 0)
         return 0;
-    }
-    return fcntl(fd, F_SETLK, &lock) == 0 &&
-           write(fd, text, length) == static_cast<ssize_t>(length);
+    ssize_t written = write(fd, text, length);
+    if (written >= 0 && written < static_cast<ssize_t>(length))
+        return Sys_FailWith(ENOSPC); // a part of it has found room
+    return written >= 0;
 }
 
 static void Remember(const char *path, int fd)
@@ -82,23 +84,23 @@ static void Remember(const char *path, int fd)
 }
 
 // The file is complete and locked before it gets its name, so that nobody sees it otherwise.
-int Sys_PostNote(const char *path, const char *text)
+int Sys_PostNote(const char *path, const char *text, SysReason *why)
 {
     std::string temporary = std::string(path) + "." + std::to_string(getpid());
     unlink(temporary.c_str()); // of a process that had our number
     int fd = Sys_MoveOffStandard(
         open(temporary.c_str(), O_RDWR | O_CREAT | O_EXCL | O_CLOEXEC | O_NOFOLLOW, 0600));
     if (fd < 0)
-        return 0;
+        return Sys_TellWhy(why);
     if (LockAndWrite(fd, text) && rename(temporary.c_str(), path) == 0) {
         Remember(path, fd);
         return 1;
     }
+    Sys_TellWhy(why);
     int reason = errno;
     unlink(temporary.c_str());
     close(fd);
-    errno = reason;
-    return 0;
+    return Sys_FailWith(reason);
 }
 
 static char *ReadText(int fd)

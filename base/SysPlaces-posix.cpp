@@ -1,5 +1,6 @@
 // base/SysPlaces-posix.cpp - the user's folders, for POSIX systems.
 
+#include "base/Sys-posix.h"
 #include "base/Sys.h"
 
 #include <cerrno>
@@ -74,11 +75,13 @@ static uint64_t Hash(const char *text)
     return hash;
 }
 
-char *Sys_PrivatePath(const char *name, const char *ending)
+char *Sys_PrivatePath(const char *name, const char *ending, SysReason *why)
 {
     std::string folder = PrivateFolder();
-    if (folder.empty())
+    if (folder.empty()) {
+        Sys_TellWhy(why);
         return nullptr;
+    }
     char number[17];
     snprintf(number, sizeof number, "%016llx", static_cast<unsigned long long>(Hash(name)));
     return strdup((folder + "/" + number + ending).c_str());

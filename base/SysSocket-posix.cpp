@@ -142,7 +142,8 @@ static int Bind(int socket, const sockaddr_un *address)
     return 1;
 }
 
-int Sys_ListenLocal(const char *path)
+// 0, with the reason in errno, on failure.
+static int Listen(const char *path)
 {
     sockaddr_un address;
     if (!MakeAddress(&address, path))
@@ -157,6 +158,12 @@ int Sys_ListenLocal(const char *path)
     }
     UnlockFolder(folder);
     return socket < 0 ? 0 : socket;
+}
+
+int Sys_ListenLocal(const char *path, SysReason *why)
+{
+    int socket = Listen(path);
+    return socket != 0 ? socket : Sys_TellWhy(why);
 }
 
 int Sys_AcceptLocal(int listener)
@@ -214,18 +221,16 @@ static int Connect(int socket, const sockaddr_un *address, int milliseconds)
     return 1;
 }
 
-int Sys_ConnectLocal(const char *path, int milliseconds)
+int Sys_ConnectLocal(const char *path, int milliseconds, SysReason *why)
 {
     sockaddr_un address;
-    if (!MakeAddress(&address, path))
-        return 0;
-    int socket = OpenSocket();
+    int socket = MakeAddress(&address, path) ? OpenSocket() : -1;
     if (socket < 0)
-        return 0;
+        return Sys_TellWhy(why);
     if (Connect(socket, &address, milliseconds) && IsOwnUser(socket))
         return socket;
     Sys_CloseQuietly(socket);
-    return 0;
+    return Sys_TellWhy(why);
 }
 
 // --- Reading and writing ---

@@ -148,11 +148,10 @@ int FileSet_Find(const BibFileSet *set, const char *path)
 
 // --- Opening and locking ---
 
-// What the user reads when the lock of `path` was not to be had. Ask right after the failure.
-static std::string LockFailureText(const char *path)
+// What the user reads when the lock of `path` was not to be had.
+static std::string LockFailureText(const char *path, const SysReason &why)
 {
-    std::string reason = Sys_LastErrorText();
-    return std::string("File: `") + path + "'\n" + reason;
+    return std::string("File: `") + path + "'\n" + why.text;
 }
 
 static void ReportLockFailure(const BibFileSet *set, const char *caption, const std::string &text)
@@ -197,10 +196,11 @@ int FileSet_Open(BibFileSet *set, const char *path)
     // Named a second time in one run: only the first record may be edited.
     if (Sys_IsLockedHere(path))
         return Load(set, path, 0, 1);
-    int lock = Sys_LockFile(path);
+    SysReason why = {};
+    int lock = Sys_LockFile(path, &why);
     if (lock != 0)
         return Load(set, path, lock, 0);
-    std::string text = LockFailureText(path);
+    std::string text = LockFailureText(path, why);
     ReportLockFailure(set, "Openning BIB file", text);
     FileSet_AppendError(set, "ERROR: %s\n", text.c_str());
     return 1;
@@ -219,9 +219,10 @@ static int SaveRecord(BibFileSet *set, BibFile *file, int isLast)
                    "File: `" + std::string(file->path) + "'\n" + Bib_SaveReason() + "\n");
     if (!wasLocked || (saved && isLast))
         return saved;
-    file->lockHandle = Sys_LockFile(file->path);
+    SysReason why = {};
+    file->lockHandle = Sys_LockFile(file->path, &why);
     if (file->lockHandle == 0)
-        ReportLockFailure(set, "ReLocking BIB file", LockFailureText(file->path));
+        ReportLockFailure(set, "ReLocking BIB file", LockFailureText(file->path, why));
     return saved;
 }
 

@@ -13,27 +13,36 @@
 // --- Values ---
 
 // Gathers small pieces, since a call of the stream for each would take most of a save's time.
-// Write errors stay with the stream.
 struct Output {
     FILE *stream;
-    int crlf; // lines end with CR LF
+    int crlf;       // lines end with CR LF
+    int failed;     // something is lost, and nothing more is written
+    SysReason *why; // of that; may be null
     size_t used;
     char block[1024 * 1024];
 };
 
 // Too large for the stack; one serves all, as nothing here runs twice at a time.
-static Output *StartOutput(FILE *stream, int crlf)
+static Output *StartOutput(FILE *stream, int crlf, SysReason *why)
 {
     static Output output;
     output.stream = stream;
     output.crlf = crlf;
+    output.failed = 0;
+    output.why = why;
     output.used = 0;
     return &output;
 }
 
+static void Write(Output *out, const char *text, size_t length)
+{
+    if (!out->failed)
+        out->failed = !Sys_WriteStream(out->stream, text, length, out->why);
+}
+
 static void Flush(Output *out)
 {
-    fwrite(out->block, 1, out->used, out->stream);
+    Write(out, out->block, out->used);
     out->used = 0;
 }
 
@@ -42,7 +51,7 @@ static void PutBytes(Output *out, const char *text, size_t length)
     if (length > sizeof out->block - out->used)
         Flush(out);
     if (length > sizeof out->block) {
-        fwrite(text, 1, length, out->stream);
+        Write(out, text, length);
         return;
     }
     memcpy(out->block + out->used, text, length);
@@ -174,7 +183,7 @@ static void PutValue(Output *out, const char *value)
 
 void Bib_WriteValue(const char *value, FILE *stream)
 {
-    Output *out = StartOutput(stream, 0);
+    Output *out = StartOutput(stream, 0, nullptr);
     PutValue(out, value);
     Flush(out);
 }
@@ -297,9 +306,10 @@ static void PutEntry(Output *out, const BibEntry *entry)
     Put(out, entry->fieldCount > 0 ? "\n}\n" : ",\n}\n");
 }
 
-static void WriteContents(const BibFile *file, FILE *stream)
+// 1, or 0 when something is lost.
+static int WriteContents(const BibFile *file, FILE *stream, SysReason *why)
 {
-    Output *out = StartOutput(stream, file->form & BIB_FORM_CRLF);
+    Output *out = StartOutput(stream, file->form & BIB_FORM_CRLF, why);
     OutsideWriter outside = {out, Outside_First(file)};
     if (file->form & BIB_FORM_MARK)
         Put(out, BIB_BYTE_ORDER_MARK);
@@ -312,6 +322,7 @@ static void WriteContents(const BibFile *file, FILE *stream)
     }
     PutRest(&outside, BIB_AT_END);
     Flush(out);
+    return !out->failed;
 }
 
 // --- Refusals ---
@@ -323,10 +334,9 @@ const char *Bib_SaveReason()
     return Reason;
 }
 
-// Called right after what failed: the system still knows why.
-static void Refuse(const char *message, const char *path)
+static void Refuse(const char *message, const char *path, const SysReason *why)
 {
-    snprintf(Reason, sizeof Reason, "%s", Sys_LastErrorText());
+    snprintf(Reason, sizeof Reason, "%s", why->text);
     AppLog(message, path);
 }
 
@@ -390,9 +400,10 @@ static int MakeRoom(const BibFile *file, Backup *backup)
         backup->older = older;
     else
         free(older);
-    if (Sys_RemoveFile(backup->name))
+    SysReason why = {};
+    if (Sys_RemoveFile(backup->name, &why))
         return 1;
-    Refuse("ERROR: Can't remove backup file: ", backup->name);
+    Refuse("ERROR: Can't remove backup file: ", backup->name, &why);
     return 0;
 }
 
@@ -423,9 +434,10 @@ static int MakeBackup(const BibFile *file, Backup *backup)
     backup->name = dated ? FreeDatedName(file) : CopyName(Bib_BackupName(file, -1));
     if (!dated && !MakeRoom(file, backup))
         return 0;
-    backup->made = Sys_KeepCopy(file->path, backup->name);
+    SysReason why = {};
+    backup->made = Sys_KeepCopy(file->path, backup->name, &why);
     if (!backup->made)
-        Refuse("ERROR: Can't rename to BAK-file the Bib-file: ", file->path);
+        Refuse("ERROR: Can't rename to BAK-file the Bib-file: ", file->path, &why);
     return backup->made;
 }
 
@@ -451,15 +463,23 @@ static void SettleBackup(Backup *backup, int saved)
 
 // --- Saving ---
 
-static int ReplaceContents(const BibFile *file)
+static int TryToReplace(const BibFile *file, SysReason *why)
 {
     SysReplace replace;
-    if (Sys_StartReplace(&replace, file->path)) {
-        WriteContents(file, replace.stream);
-        if (Sys_CommitReplace(&replace))
-            return 1;
-    }
-    Refuse("ERROR: Can't open file: ", file->path);
+    if (!Sys_StartReplace(&replace, file->path, why))
+        return 0;
+    if (WriteContents(file, replace.stream, why))
+        return Sys_CommitReplace(&replace, why);
+    Sys_CancelReplace(&replace);
+    return 0;
+}
+
+static int ReplaceContents(const BibFile *file)
+{
+    SysReason why = {};
+    if (TryToReplace(file, &why))
+        return 1;
+    Refuse("ERROR: Can't open file: ", file->path, &why);
     return 0;
 }
 

@@ -415,6 +415,7 @@ TEST_F(BibSave, ReportsAPlainBackupThatCannotBeRemoved)
     folder.Write("refs.bib", OldText);
     ASSERT_EQ(0, mkdir(folder.Path("refs.bib.Backup").c_str(), 0700));
     ExpectFailedSave("ERROR: Can't remove backup file: ", folder.Path("refs.bib.Backup"));
+    EXPECT_STREQ("Is a directory", Bib_SaveReason());
     EXPECT_EQ(OldText, folder.Read("refs.bib"));
     EXPECT_EQ((Names{"refs.bib", "refs.bib.Backup"}), folder.Names());
 }
@@ -446,6 +447,7 @@ TEST_F(BibSave, FailsWhenAllDatedNamesAreTaken)
     folder.Write("refs.bib", OldText);
     Names before = TakeNames('Z');
     ExpectFailedSave("ERROR: Can't rename to BAK-file the Bib-file: ", file->path);
+    EXPECT_STREQ("File exists", Bib_SaveReason());
     EXPECT_EQ(before, folder.Names());
     for (const std::string &name : before)
         EXPECT_EQ(name == "refs.bib" ? OldText : "taken", folder.Read(name));
@@ -623,10 +625,11 @@ TEST_F(BibSave, LeavesTheOldFileWhenTheDiskIsFull)
 {
     folder.Write("refs.bib", OldText);
     // One that fails when the stream is flushed, one that fails in a write before.
-    for (size_t size : {2000, 500000}) {
+    for (size_t size : {2000, 5000000}) {
         AddEntry("Misc", "k", {{"note", std::string(size, 'v')}});
         DiskFullAt limit(1000);
         ExpectFailedSave("ERROR: Can't open file: ", file->path);
+        EXPECT_STREQ("File too large", Bib_SaveReason());
         EXPECT_EQ(Names{"refs.bib"}, folder.Names());
         EXPECT_EQ(OldText, folder.Read("refs.bib"));
     }

@@ -43,8 +43,9 @@ protected:
     // Listens at the path and gives the first client to `body`.
     void Serve(const std::string &path, const std::function<void(int client)> &body)
     {
-        int listener = Sys_ListenLocal(path.c_str());
-        ASSERT_NE(0, listener) << Sys_LastErrorText();
+        SysReason why = {};
+        int listener = Sys_ListenLocal(path.c_str(), &why);
+        ASSERT_NE(0, listener) << why.text;
         server = fork();
         if (server != 0) {
             Sys_CloseSocket(listener);

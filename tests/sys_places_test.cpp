@@ -17,6 +17,7 @@
 
 #include "store/BibStore.h"
 #include "tests/support/TempFolder.h"
+#include "tests/support/ToldLater.h"
 
 namespace
 {
@@ -50,11 +51,12 @@ protected:
         setenv("TMPDIR", m_folder.Path().c_str(), 1);
     }
 
-    string Private(const char *name) { return TextOf(Sys_PrivatePath(name, ".end")); }
+    string Private(const char *name) { return TextOf(Sys_PrivatePath(name, ".end", &m_why)); }
 
     string TemporaryPrivate() const { return m_folder.Path("quarlo-" + std::to_string(getuid())); }
 
     TempFolder m_folder;
+    SysReason m_why = {}; // that there is no private path
 };
 
 using SysConfigFolder = Places;
@@ -212,7 +214,7 @@ TEST_F(SysPrivatePath, IsNoneWhereOthersCanEnter)
         ASSERT_TRUE(mkdir(folder.c_str(), 0700) == 0 || errno == EEXIST);
         ASSERT_EQ(0, chmod(folder.c_str(), mode));
         EXPECT_EQ(NOTHING, Private("name"));
-        EXPECT_STREQ("Permission denied", Sys_LastErrorText());
+        EXPECT_EQ("Permission denied", ToldLater(m_why));
         EXPECT_EQ(mode, ModeOf(folder)) << "not ours to change";
     }
     chmod(folder.c_str(), 0700);
@@ -249,7 +251,7 @@ TEST_F(SysPrivatePath, IsNoneWhereNoFolderCanBeMade)
 {
     setenv("TMPDIR", m_folder.Path("missing").c_str(), 1);
     EXPECT_EQ(NOTHING, Private("name"));
-    EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
+    EXPECT_EQ("No such file or directory", ToldLater(m_why));
 }
 
 TEST(SysLoginName, IsThatOfTheAccount)
@@ -390,10 +392,14 @@ TEST_F(SysNote, IsAtMostFourKilobytes)
 TEST_F(SysNote, FailsWhereItCannotBeWritten)
 {
     m_path = m_folder.Path("missing/note");
-    EXPECT_EQ(0, Post("text"));
-    EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
+    SysReason why = {};
+    EXPECT_EQ(0, Sys_PostNote(m_path.c_str(), "text", &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
     m_path = m_folder.Path();
-    EXPECT_EQ(0, Post("text"));
+    EXPECT_EQ(0, Sys_PostNote(m_path.c_str(), "text", &why));
+    EXPECT_NE("", ToldLater(why));
+    EXPECT_EQ(0, Sys_PostNote(m_folder.Path("note").c_str(), string(4097, 'y').c_str(), &why));
+    EXPECT_EQ("File too large", ToldLater(why));
 }
 
 } // namespace

@@ -17,6 +17,7 @@
 
 #include "store/BibStore.h"
 #include "tests/support/TempFolder.h"
+#include "tests/support/ToldLater.h"
 
 namespace
 {
@@ -69,10 +70,11 @@ class SysSocket : public testing::Test
 protected:
     void SetUp() override
     {
-        listener = Sys_ListenLocal(path.c_str());
-        ASSERT_NE(0, listener) << Sys_LastErrorText();
-        client = Sys_ConnectLocal(path.c_str(), 1000);
-        ASSERT_NE(0, client) << Sys_LastErrorText();
+        SysReason why = {};
+        listener = Sys_ListenLocal(path.c_str(), &why);
+        ASSERT_NE(0, listener) << why.text;
+        client = Sys_ConnectLocal(path.c_str(), 1000, &why);
+        ASSERT_NE(0, client) << why.text;
         server = Accept(listener);
         ASSERT_NE(0, server);
     }
@@ -197,11 +199,12 @@ TEST(SysListenLocal, MakesAFileForTheUserAlone)
 
 TEST(SysListenLocal, ReplacesADeadSocket)
 {
+    SysReason why = {};
     TempFolder folder;
     std::string path = folder.Path("socket");
     LeaveDeadSocket(path);
-    EXPECT_EQ(0, Sys_ConnectLocal(path.c_str(), 100));
-    EXPECT_STREQ("Connection refused", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_ConnectLocal(path.c_str(), 100, &why));
+    EXPECT_EQ("Connection refused", ToldLater(why));
     int listener = Sys_ListenLocal(path.c_str());
     ASSERT_NE(0, listener);
     int client = Sys_ConnectLocal(path.c_str(), 100);
@@ -212,12 +215,13 @@ TEST(SysListenLocal, ReplacesADeadSocket)
 
 TEST(SysListenLocal, NeverReplacesALiveSocket)
 {
+    SysReason why = {};
     TempFolder folder;
     std::string path = folder.Path("socket");
     int listener = Sys_ListenLocal(path.c_str());
     ASSERT_NE(0, listener);
-    EXPECT_EQ(0, Sys_ListenLocal(path.c_str()));
-    EXPECT_STREQ("Address already in use", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_ListenLocal(path.c_str(), &why));
+    EXPECT_EQ("Address already in use", ToldLater(why));
     EXPECT_TRUE(InAnotherProcess([&] { return Sys_ListenLocal(path.c_str()) == 0; }));
     int client = Sys_ConnectLocal(path.c_str(), 100);
     EXPECT_NE(0, client);
@@ -227,6 +231,7 @@ TEST(SysListenLocal, NeverReplacesALiveSocket)
 
 TEST(SysListenLocal, NeverReplacesASocketWithAFullQueue)
 {
+    SysReason why = {};
     TempFolder folder;
     std::string path = folder.Path("socket");
     int listener = Sys_ListenLocal(path.c_str());
@@ -234,8 +239,8 @@ TEST(SysListenLocal, NeverReplacesASocketWithAFullQueue)
     int waiting = Sys_ConnectLocal(path.c_str(), 100);
     ASSERT_NE(0, waiting);
     int32_t start = Sys_Milliseconds();
-    EXPECT_EQ(0, Sys_ConnectLocal(path.c_str(), 50));
-    EXPECT_STREQ("Connection timed out", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_ConnectLocal(path.c_str(), 50, &why));
+    EXPECT_EQ("Connection timed out", ToldLater(why));
     EXPECT_LE(50, Sys_Milliseconds() - start);
     EXPECT_EQ(0, Sys_ListenLocal(path.c_str()));
     Sys_CloseSocket(waiting);
@@ -245,15 +250,16 @@ TEST(SysListenLocal, NeverReplacesASocketWithAFullQueue)
 // Else thousands that are gone would have to be heard before the next that is there.
 TEST(SysListenLocal, LetsNotTooManyWait)
 {
+    SysReason why = {};
     TempFolder folder;
     std::string path = folder.Path("socket");
     int listener = Sys_ListenLocal(path.c_str());
     int waiting = 0;
-    while (int client = Sys_ConnectLocal(path.c_str(), 0)) {
+    while (int client = Sys_ConnectLocal(path.c_str(), 0, &why)) {
         Sys_CloseSocket(client);
         ++waiting;
     }
-    EXPECT_STREQ("Connection timed out", Sys_LastErrorText());
+    EXPECT_EQ("Connection timed out", ToldLater(why));
     EXPECT_LE(200, waiting);
     EXPECT_GE(300, waiting);
     Sys_CloseListener(listener, path.c_str());
@@ -280,29 +286,31 @@ TEST(SysListenLocal, LeavesEverythingElseAlone)
 
 TEST(SysListenLocal, LeavesTheSocketOfAnotherUserAlone)
 {
+    SysReason why = {};
     if (geteuid() != 0)
         GTEST_SKIP() << "only the superuser can make one";
     TempFolder folder;
     std::string path = folder.Path("socket");
     LeaveDeadSocket(path);
     ASSERT_EQ(0, chown(path.c_str(), NOBODY, NOBODY));
-    EXPECT_EQ(0, Sys_ListenLocal(path.c_str()));
-    EXPECT_STREQ("Permission denied", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_ListenLocal(path.c_str(), &why));
+    EXPECT_EQ("Permission denied", ToldLater(why));
     EXPECT_EQ(1u, folder.Names().size());
 }
 
 TEST(SysListenLocal, RefusesWhatIsNoPathOfASocket)
 {
+    SysReason why = {};
     TempFolder folder;
     std::string longest = folder.Path(std::string(107 - folder.Path("").size(), 'x'));
     EXPECT_EQ(0, Sys_ListenLocal(""));
     EXPECT_EQ(0, Sys_ConnectLocal("", 100));
-    EXPECT_EQ(0, Sys_ListenLocal((longest + "x").c_str()));
-    EXPECT_STREQ("File name too long", Sys_LastErrorText());
-    EXPECT_EQ(0, Sys_ConnectLocal((longest + "x").c_str(), 100));
-    EXPECT_STREQ("File name too long", Sys_LastErrorText());
-    EXPECT_EQ(0, Sys_ListenLocal(folder.Path("missing/socket").c_str()));
-    EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_ListenLocal((longest + "x").c_str(), &why));
+    EXPECT_EQ("File name too long", ToldLater(why));
+    EXPECT_EQ(0, Sys_ConnectLocal((longest + "x").c_str(), 100, &why));
+    EXPECT_EQ("File name too long", ToldLater(why));
+    EXPECT_EQ(0, Sys_ListenLocal(folder.Path("missing/socket").c_str(), &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
     int listener = Sys_ListenLocal(longest.c_str());
     EXPECT_NE(0, listener);
     Sys_CloseListener(listener, longest.c_str());
@@ -406,6 +414,7 @@ TEST(SysCloseListener, LeavesTheFileOfASuccessorAlone)
 
 TEST(SysAcceptLocal, TurnsAwayAnotherUser)
 {
+    SysReason why = {};
     if (geteuid() != 0)
         GTEST_SKIP() << "only the superuser can become one";
     TempFolder folder;
@@ -415,8 +424,8 @@ TEST(SysAcceptLocal, TurnsAwayAnotherUser)
     chmod(path.c_str(), 0666);
     // The connection itself succeeds; its server is not of the same user.
     EXPECT_TRUE(InAnotherProcess([&] {
-        return setuid(NOBODY) == 0 && Sys_ConnectLocal(path.c_str(), 100) == 0 &&
-               strcmp("Permission denied", Sys_LastErrorText()) == 0;
+        return setuid(NOBODY) == 0 && Sys_ConnectLocal(path.c_str(), 100, &why) == 0 &&
+               ToldLater(why) == "Permission denied";
     }));
     EXPECT_EQ(1, Sys_WaitReadable(listener, 1000));
     EXPECT_EQ(0, Sys_AcceptLocal(listener));
@@ -445,9 +454,10 @@ TEST(SysAcceptLocal, TakesTheNextAfterAnotherUser)
 
 TEST(SysConnectLocal, SaysWhyItFails)
 {
+    SysReason why = {};
     TempFolder folder;
-    EXPECT_EQ(0, Sys_ConnectLocal(folder.Path("missing").c_str(), 100));
-    EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_ConnectLocal(folder.Path("missing").c_str(), 100, &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
 }
 
 TEST(SysListenLocal, StaysOffTheStandardStreams)

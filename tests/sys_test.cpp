@@ -17,6 +17,7 @@
 
 #include "store/BibStore.h"
 #include "tests/support/TempFolder.h"
+#include "tests/support/ToldLater.h"
 
 namespace
 {
@@ -48,6 +49,12 @@ TEST(SysLastErrorText, DescribesTheLastError)
     EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
     errno = EACCES;
     EXPECT_STREQ("Permission denied", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_LockFile("/no/such/folder/file"));
+    EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_LockFile("/"));
+    EXPECT_STREQ("Is a directory", Sys_LastErrorText());
+    errno = ETXTBSY;
+    EXPECT_STREQ("The file is in use by another program", Sys_LastErrorText());
 }
 
 TEST(SysToBackslashes, TurnsEverySlash)
@@ -187,25 +194,71 @@ TEST(SysReadAll, ReadsAStreamOfUnknownLength)
 
 TEST(SysReadAll, FailsWhereReadingFails)
 {
+    SysReason why = {};
     FILE *stream = fopen("/", "r");
     ASSERT_TRUE(stream);
     size_t length;
-    EXPECT_EQ(nullptr, Sys_ReadAll(stream, &length));
+    EXPECT_EQ(nullptr, Sys_ReadAll(stream, &length, &why));
     fclose(stream);
+    EXPECT_EQ("Is a directory", ToldLater(why));
+}
+
+TEST(SysReadAll, SaysThatAnEarlierReadFailed)
+{
+    SysReason why = {};
+    FILE *stream = fopen("/", "r");
+    ASSERT_TRUE(stream);
+    EXPECT_EQ(EOF, fgetc(stream));
+    FILE *file = fopen("/dev/null", "r");
+    ASSERT_LE(0, dup2(fileno(file), fileno(stream)));
+    fclose(file);
+    size_t length;
+    errno = EDOM;
+    EXPECT_EQ(nullptr, Sys_ReadAll(stream, &length, &why));
+    fclose(stream);
+    EXPECT_EQ("Input/output error", ToldLater(why));
+}
+
+// --- Writing ---
+
+TEST(SysWriteStream, SaysWhyItFails)
+{
+    SysReason why = {};
+    std::string large(100000, 'x');
+    FILE *stream = fopen("/dev/full", "w");
+    ASSERT_TRUE(stream);
+    EXPECT_EQ(0, Sys_WriteStream(stream, large.data(), large.size(), &why));
+    fclose(stream);
+    EXPECT_EQ("No space left on device", ToldLater(why));
+}
+
+TEST(SysWriteStream, WritesToFiles)
+{
+    SysReason why = {};
+    TempFolder folder;
+    std::string large(100000, 'x');
+    FILE *stream = fopen(folder.Path("file").c_str(), "w");
+    ASSERT_TRUE(stream);
+    EXPECT_EQ(1, Sys_WriteStream(stream, large.data(), large.size(), &why));
+    EXPECT_EQ(1, Sys_WriteStream(stream, "", 0, &why));
+    fclose(stream);
+    EXPECT_TRUE(large == folder.Read("file"));
+    EXPECT_STREQ("", why.text);
 }
 
 TEST(SysOpenRegular, RefusesEverythingElseWithoutWaiting)
 {
+    SysReason why = {};
     TempFolder folder;
     std::string pipe = folder.Path("pipe");
     ASSERT_EQ(0, mkfifo(pipe.c_str(), 0600));
-    EXPECT_EQ(nullptr, Sys_OpenRegular(pipe.c_str()));
-    EXPECT_STREQ("Operation not supported", Sys_LastErrorText());
+    EXPECT_EQ(nullptr, Sys_OpenRegular(pipe.c_str(), &why));
+    EXPECT_EQ("Operation not supported", ToldLater(why));
     EXPECT_EQ(nullptr, Sys_OpenRegular("/dev/null"));
-    EXPECT_EQ(nullptr, Sys_OpenRegular(folder.Path().c_str()));
-    EXPECT_STREQ("Is a directory", Sys_LastErrorText());
-    EXPECT_EQ(nullptr, Sys_OpenRegular(folder.Path("missing").c_str()));
-    EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
+    EXPECT_EQ(nullptr, Sys_OpenRegular(folder.Path().c_str(), &why));
+    EXPECT_EQ("Is a directory", ToldLater(why));
+    EXPECT_EQ(nullptr, Sys_OpenRegular(folder.Path("missing").c_str(), &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
 }
 
 // --- Locks ---
@@ -213,6 +266,7 @@ TEST(SysOpenRegular, RefusesEverythingElseWithoutWaiting)
 struct SysLockFile : testing::Test {
     TempFolder folder;
     std::string path = folder.Write("refs.bib", "text");
+    SysReason why = {};
     int handle = 0;
 
     void Lock() { ASSERT_NE(0, handle = Sys_LockFile(path.c_str())); }
@@ -231,10 +285,12 @@ TEST_F(SysLockFile, ShutsOthersOutUntilItIsReleased)
 TEST_F(SysLockFile, SaysWhyItFails)
 {
     Lock();
-    EXPECT_EQ(0, Sys_LockFile(path.c_str()));
-    EXPECT_STREQ("The file is in use by another program", Sys_LastErrorText());
-    EXPECT_EQ(0, Sys_LockFile(folder.Path("missing/refs.bib").c_str()));
-    EXPECT_STREQ("No such file or directory", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_LockFile(path.c_str(), &why));
+    EXPECT_EQ("The file is in use by another program", ToldLater(why));
+    EXPECT_EQ(1, why.isTaken);
+    EXPECT_EQ(0, Sys_LockFile(folder.Path("missing/refs.bib").c_str(), &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
+    EXPECT_EQ(0, why.isTaken);
 }
 
 TEST_F(SysLockFile, LetsOthersRead)
@@ -308,10 +364,10 @@ TEST_F(SysLockFile, RefusesEverythingButRegularFilesWithoutWaiting)
 {
     std::string pipe = folder.Path("pipe");
     ASSERT_EQ(0, mkfifo(pipe.c_str(), 0600));
-    EXPECT_EQ(0, Sys_LockFile(pipe.c_str()));
-    EXPECT_STREQ("Operation not supported", Sys_LastErrorText());
-    EXPECT_EQ(0, Sys_LockFile(folder.Path().c_str()));
-    EXPECT_STREQ("Is a directory", Sys_LastErrorText());
+    EXPECT_EQ(0, Sys_LockFile(pipe.c_str(), &why));
+    EXPECT_EQ("Operation not supported", ToldLater(why));
+    EXPECT_EQ(0, Sys_LockFile(folder.Path().c_str(), &why));
+    EXPECT_EQ("Is a directory", ToldLater(why));
     EXPECT_EQ(0, Sys_LockFile("/dev/null"));
 }
 
@@ -391,14 +447,40 @@ TEST(SysKeepCopy, NeverReplacesOnAnotherFileSystem)
 
 TEST(SysKeepCopy, FailsWithoutAFile)
 {
+    SysReason why = {};
     TempFolder folder;
-    EXPECT_EQ(0, Sys_KeepCopy(folder.Path("missing").c_str(), folder.Path("copy").c_str()));
+    EXPECT_EQ(0, Sys_KeepCopy(folder.Path("missing").c_str(), folder.Path("copy").c_str(), &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
     EXPECT_EQ(0, Sys_KeepCopy(folder.Path().c_str(), folder.Path("copy").c_str()));
     EXPECT_TRUE(folder.Names().empty());
 }
 
+TEST(SysKeepCopy, SaysWhyACopyToAnotherFileSystemFails)
+{
+    SysReason why = {};
+    TempFolder folder;
+    TempFolder other("/dev/shm");
+    std::string path = folder.Write("file", "text");
+    std::string copy = other.Write("copy", "mine");
+    EXPECT_EQ(0, Sys_KeepCopy(path.c_str(), copy.c_str(), &why));
+    EXPECT_EQ("File exists", ToldLater(why));
+}
+
+TEST(SysRemoveFile, SaysWhyItFails)
+{
+    SysReason why = {};
+    TempFolder folder;
+    std::string path = folder.Write("file", "text");
+    EXPECT_EQ(1, Sys_RemoveFile(path.c_str(), &why));
+    EXPECT_EQ(0, Sys_RemoveFile(path.c_str(), &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
+    EXPECT_EQ(0, Sys_RemoveFile(folder.Path().c_str(), &why));
+    EXPECT_EQ("Is a directory", ToldLater(why));
+}
+
 struct SysReplaceFile : testing::Test {
     TempFolder folder;
+    SysReason why = {};
     std::string path = folder.Write("file", "old");
     SysReplace replace = {};
 
@@ -434,7 +516,8 @@ TEST_F(SysReplaceFile, IsNotCommittedAfterAWriteError)
     int full = open("/dev/full", O_WRONLY);
     ASSERT_LE(0, dup2(full, fileno(replace.stream)));
     close(full);
-    EXPECT_EQ(0, Sys_CommitReplace(&replace));
+    EXPECT_EQ(0, Sys_CommitReplace(&replace, &why));
+    EXPECT_EQ("No space left on device", ToldLater(why));
     EXPECT_EQ("old", folder.Read("file"));
     EXPECT_EQ(Names{"file"}, folder.Names());
 }
@@ -444,8 +527,38 @@ TEST_F(SysReplaceFile, IsNotCommittedWhenTheTargetBecameAFolder)
     Start();
     unlink(path.c_str());
     ASSERT_EQ(0, mkdir(path.c_str(), 0700));
-    EXPECT_EQ(0, Sys_CommitReplace(&replace));
+    EXPECT_EQ(0, Sys_CommitReplace(&replace, &why));
+    EXPECT_EQ("Is a directory", ToldLater(why));
     EXPECT_EQ(Names{"file"}, folder.Names());
+}
+
+TEST_F(SysReplaceFile, IsNotCommittedWhenAnEarlierWriteFailed)
+{
+    Start();
+    int file = dup(fileno(replace.stream));
+    int full = open("/dev/full", O_WRONLY);
+    ASSERT_LE(0, dup2(full, fileno(replace.stream)));
+    EXPECT_EQ(EOF, fflush(replace.stream));
+    // There is room again.
+    ASSERT_LE(0, dup2(file, fileno(replace.stream)));
+    close(file);
+    close(full);
+    errno = EDOM;
+    EXPECT_EQ(0, Sys_CommitReplace(&replace, &why));
+    EXPECT_EQ("Input/output error", ToldLater(why));
+    EXPECT_EQ("old", folder.Read("file"));
+}
+
+TEST_F(SysReplaceFile, SaysWhyItCannotStart)
+{
+    EXPECT_EQ(0, Sys_StartReplace(&replace, folder.Path("missing/file").c_str(), &why));
+    EXPECT_EQ("No such file or directory", ToldLater(why));
+    EXPECT_EQ(0, Sys_StartReplace(&replace, folder.Path().c_str(), &why));
+    EXPECT_EQ("Is a directory", ToldLater(why));
+    std::string link = folder.Path("link");
+    ASSERT_EQ(0, symlink("link", link.c_str()));
+    EXPECT_EQ(0, Sys_StartReplace(&replace, link.c_str(), &why));
+    EXPECT_EQ("Too many levels of symbolic links", ToldLater(why));
 }
 
 TEST_F(SysReplaceFile, DoesNotWriteToAStandardStream)
