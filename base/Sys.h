@@ -26,8 +26,8 @@ const char *Sys_ModulePath();        // full path of the executable, at most 260
 
 // --- Files ---
 
-int Sys_FileExists(const char *path);  // 1 also for folders and devices
-int Sys_WriteAccess(const char *path); // 0 when writable, else -1, as BibFile::readOnly wants it
+int Sys_FileExists(const char *path);           // 1 also for folders and devices
+int Sys_IsWritable(const char *path);           // 1 when it exists and may be written
 int Sys_SameFile(const char *a, const char *b); // 1 when both exist and are one file
 
 // A number that changes when the file is written or replaced; 0 when there is no such file, or

@@ -116,9 +116,9 @@ int Sys_FileExists(const char *path)
     return stat(path, &status) == 0;
 }
 
-int Sys_WriteAccess(const char *path)
+int Sys_IsWritable(const char *path)
 {
-    return access(path, W_OK);
+    return access(path, W_OK) == 0;
 }
 
 static int IsSame(const struct stat *a, const struct stat *b)

@@ -191,7 +191,7 @@ static int Load(BibFileSet *set, const char *path, int lock, int readOnly)
 
 int FileSet_Open(BibFileSet *set, const char *path)
 {
-    if (Sys_WriteAccess(path) != 0)
+    if (!Sys_IsWritable(path))
         return Load(set, path, 0, 0);
     // Named a second time in one run: only the first record may be edited.
     if (Sys_IsLockedHere(path))

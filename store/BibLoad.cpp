@@ -521,7 +521,7 @@ static BibFile *NewFile(const char *path, FILE *stream)
     file->stream = stream;
     file->path = Bib_CopyText(path, strlen(path));
     file->baseName = BaseName(path);
-    file->readOnly = Sys_WriteAccess(path);
+    file->readOnly = Sys_IsWritable(path) ? 0 : -1;
     if (Bib_Origin(file))
         file->origin->stamp = Sys_StreamStamp(stream);
     return file;

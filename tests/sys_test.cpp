@@ -115,16 +115,16 @@ TEST(SysFileExists, LooksThroughLinks)
     EXPECT_EQ(0, Sys_FileExists(""));
 }
 
-TEST(SysWriteAccess, IsMinusOneWhereWritingIsRefused)
+TEST(SysIsWritable, IsFalseWhereWritingIsRefused)
 {
     TempFolder folder;
     std::string path = folder.Write("file", "");
-    EXPECT_EQ(0, Sys_WriteAccess(path.c_str()));
-    EXPECT_EQ(-1, Sys_WriteAccess(folder.Path("missing").c_str()));
+    EXPECT_EQ(1, Sys_IsWritable(path.c_str()));
+    EXPECT_EQ(0, Sys_IsWritable(folder.Path("missing").c_str()));
     chmod(path.c_str(), 0444);
     chmod(folder.Path().c_str(), 0755);
     EXPECT_TRUE(InAnotherProcess([&] {
-        return (geteuid() != 0 || setuid(65534) == 0) && Sys_WriteAccess(path.c_str()) == -1;
+        return (geteuid() != 0 || setuid(65534) == 0) && Sys_IsWritable(path.c_str()) == 0;
     }));
 }
 
