@@ -8,7 +8,7 @@
 #include <string>
 #include <vector>
 
-#include "base/Ascii.h"
+#include "base/Paths.h"
 #include "base/Profile.h"
 #include "base/Sys.h"
 
@@ -53,13 +53,6 @@ static void AppendSetting(Folders *folders, const char *category)
     free(list);
 }
 
-// Without the last part; "" for "/name".
-static std::string ParentOf(const std::string &path)
-{
-    size_t slash = path.rfind('/');
-    return slash == std::string::npos ? std::string() : path.substr(0, slash);
-}
-
 static std::string UserFolder()
 {
     return TakeText(Sys_DataFolder()) + "/cartulo";
@@ -67,7 +60,7 @@ static std::string UserFolder()
 
 static std::string ProgramFolder()
 {
-    return ParentOf(Sys_ModulePath());
+    return Path_Parent(Sys_ModulePath());
 }
 
 static const char HelperFolder[] = "/libexec/cartulo";
@@ -80,7 +73,7 @@ static std::string PrefixFolder()
     if (folder.size() >= length &&
         folder.compare(folder.size() - length, length, HelperFolder) == 0)
         return folder.substr(0, folder.size() - length);
-    return ParentOf(folder);
+    return Path_Parent(folder);
 }
 
 // --- BIB files ---
@@ -112,11 +105,6 @@ static int AskTeX(const char *name, std::string *path)
     return Sys_FileExists(line.c_str());
 }
 
-static int HasBibEnding(const std::string &name)
-{
-    return name.size() > 4 && Ascii_Compare(name.c_str() + name.size() - 4, ".bib") == 0;
-}
-
 // One part of BIBINPUTS: "" is the current folder, and "//" at the end adds the folders below.
 static char *FindInPart(std::string folder, const std::string &name)
 {
@@ -126,7 +114,7 @@ static char *FindInPart(std::string folder, const std::string &name)
     if (folder.empty())
         folder = ".";
     char *path = Sys_FindFile(folder.c_str(), name.c_str(), deep);
-    if (!path && !HasBibEnding(name))
+    if (!path && !Path_HasBibEnding(name))
         path = Sys_FindFile(folder.c_str(), (name + ".bib").c_str(), deep);
     return path;
 }

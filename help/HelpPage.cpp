@@ -3,26 +3,20 @@
 #include <cstring>
 
 #include "base/Ascii.h"
+#include "base/Paths.h"
 #include "base/Sys.h"
 
 static const char MANUAL[] = "manual.html";
 static const char TOPIC[] = ".QRL.Cartulo";
 
-// Without the last part; "" when that is all.
-static std::string ParentOf(const std::string &path)
-{
-    size_t slash = path.rfind('/');
-    return slash == std::string::npos ? std::string() : path.substr(0, slash);
-}
-
 std::string Help_FindManual(const char *program)
 {
-    std::string folder = ParentOf(program);
+    std::string folder = Path_Parent(program);
     std::string path = folder + "/" + MANUAL;
     while (!Sys_FileExists(path.c_str())) {
         if (folder.empty())
             return std::string();
-        folder = ParentOf(folder);
+        folder = Path_Parent(folder);
         path = folder + "/share/doc/cartulo/" + MANUAL;
     }
     return path;

@@ -8,6 +8,7 @@
 #include "base/Ascii.h"
 #include "base/Companion.h"
 #include "base/Log.h"
+#include "base/Paths.h"
 #include "base/Sys.h"
 #include "encoding/Encoding.h"
 
@@ -148,8 +149,7 @@ static bool IsAbsolute(const char *token)
 static int ResolveAbsolute(const char *token, std::string *path)
 {
     *path = token;
-    size_t length = path->size();
-    if (length <= 4 || Ascii_Compare(token + length - 4, ".bib") != 0)
+    if (!Path_HasBibEnding(*path))
         *path += ".bib";
     AppLog("Check: ", path->c_str());
     return Sys_FileExists(path->c_str());
