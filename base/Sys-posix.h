@@ -1,10 +1,19 @@
 // base/Sys-posix.h - shared by the files that implement Sys.h on POSIX systems.
 #pragma once
 
+#include <cstdint>
+
 struct SysReason;
 
 // Puts what errno says into the reason, when somebody wants to know; errno stays as it is. 0.
 int Sys_TellWhy(SysReason *why);
+
+// FNV-1a, 64 bits: the hash of what came before and of `value`, a byte or a larger number.
+const uint64_t SYS_HASH_OF_NOTHING = 14695981039346656037u;
+inline uint64_t Sys_HashMore(uint64_t hash, uint64_t value)
+{
+    return (hash ^ value) * 1099511628211u;
+}
 
 int Sys_FailWith(int error);     // leaves the reason in errno; 0
 void Sys_CloseQuietly(int file); // leaves errno alone

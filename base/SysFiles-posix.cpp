@@ -147,11 +147,11 @@ static uint64_t Stamp(const struct stat *status)
 {
     if (!S_ISREG(status->st_mode))
         return 0;
-    uint64_t stamp = 14695981039346656037u; // FNV-1a over the words
+    uint64_t stamp = SYS_HASH_OF_NOTHING;
     for (uint64_t word :
          {uint64_t(status->st_dev), uint64_t(status->st_ino), uint64_t(status->st_size),
           uint64_t(status->st_mtim.tv_sec), uint64_t(status->st_mtim.tv_nsec)})
-        stamp = (stamp ^ word) * 1099511628211u;
+        stamp = Sys_HashMore(stamp, word);
     return stamp ? stamp : 1;
 }
 

@@ -66,12 +66,11 @@ static std::string PrivateFolder()
     return TakeFolder(folder) ? folder : std::string();
 }
 
-// FNV-1a, 64 bits.
 static uint64_t Hash(const char *text)
 {
-    uint64_t hash = 14695981039346656037ull;
+    uint64_t hash = SYS_HASH_OF_NOTHING;
     for (; *text; ++text)
-        hash = (hash ^ static_cast<unsigned char>(*text)) * 1099511628211ull;
+        hash = Sys_HashMore(hash, static_cast<unsigned char>(*text));
     return hash;
 }
 

@@ -204,6 +204,14 @@ TEST_F(SysPrivatePath, DiffersForDifferentNames)
 
 TEST_F(SysPrivatePath, IsShortForAnyName)
 {
+// Also of another version of the program: they meet there.
+TEST_F(SysPrivatePath, IsNamedByTheFnvHash)
+{
+    EXPECT_EQ("cbf29ce484222325.end", std::filesystem::path(Private("")).filename());
+    EXPECT_EQ("af63dc4c8601ec8c.end", std::filesystem::path(Private("a")).filename());
+    EXPECT_EQ("85944171f73967e8.end", std::filesystem::path(Private("foobar")).filename());
+}
+
     EXPECT_EQ(Private("a").size(), Private(string(100000, '/').c_str()).size());
 }
 

@@ -147,6 +147,32 @@ TEST(SysSameFile, SeesThroughNames)
 
 // --- Reading ---
 
+TEST(SysFileStamp, ChangesWithTheFile)
+{
+    TempFolder folder;
+    std::string path = folder.Write("file", "text");
+    uint64_t first = Sys_FileStamp(path.c_str());
+    EXPECT_EQ(first, Sys_FileStamp(path.c_str()));
+    FILE *stream = Sys_OpenRegular(path.c_str());
+    ASSERT_TRUE(stream);
+    EXPECT_EQ(first, Sys_StreamStamp(stream));
+    fclose(stream);
+    folder.Write("file", "texts");
+    uint64_t written = Sys_FileStamp(path.c_str());
+    EXPECT_NE(first, written);
+    folder.Write("other", "texts");
+    ASSERT_EQ(0, rename(folder.Path("other").c_str(), path.c_str()));
+    EXPECT_NE(written, Sys_FileStamp(path.c_str()));
+}
+
+TEST(SysFileStamp, IsNothingForWhatIsNoRegularFile)
+{
+    TempFolder folder;
+    EXPECT_EQ(0u, Sys_FileStamp(folder.Path("missing").c_str()));
+    EXPECT_EQ(0u, Sys_FileStamp(folder.Path().c_str()));
+    EXPECT_EQ(0u, Sys_FileStamp("/dev/null"));
+}
+
 std::string ReadAll(FILE *stream)
 {
     size_t length = 0;
