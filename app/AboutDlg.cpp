@@ -1,3 +1,5 @@
+// app/AboutDlg.cpp - what the program is, its version and its licence.
+
 #include "app/AboutDlg.h"
 
 #include <cstdlib>

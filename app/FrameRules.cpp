@@ -1,3 +1,5 @@
+// app/FrameRules.cpp - decisions of the main frame that need no window.
+
 #include "app/FrameRules.h"
 
 #include <algorithm>

@@ -1,3 +1,5 @@
+// app/IpcServer.cpp - the server's side of the command channel.
+
 #include "app/IpcServer.h"
 
 #include <algorithm>

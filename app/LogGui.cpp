@@ -1,3 +1,5 @@
+// app/LogGui.cpp - the toolkit's messages and assertions on their way to TNSMessage.
+
 #include "app/LogGui.h"
 
 #include "base/Companion.h"

@@ -1,3 +1,5 @@
+// app/MyApp.cpp - the application object: start-up order and exit.
+
 #include "app/MyApp.h"
 
 #include <cstdio>

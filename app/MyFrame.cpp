@@ -1,3 +1,5 @@
+// app/MyFrame.cpp - the program's only top-level window: tool bar, keyboard, status bar, close.
+
 #include "app/MyFrame.h"
 
 #include <algorithm>

@@ -1,3 +1,5 @@
+// base/Profile.cpp - reading INI files.
+//
 // By hand: the libraries for INI files join sections of one name, let the last line of a key hold,
 // or take '#' for a comment too.
 

@@ -1,3 +1,5 @@
+// base/Usage.cpp - what a program answers on its standard output, without a display.
+
 #include "base/Usage.h"
 
 #include <cstdio>

@@ -1,3 +1,5 @@
+// help/HelpFrame.cpp - the window of the help program.
+
 #include "help/HelpFrame.h"
 
 #include <algorithm>

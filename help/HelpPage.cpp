@@ -1,3 +1,5 @@
+// help/HelpPage.cpp - which manual the help program shows, as what page, and where a text is in it.
+
 #include "help/HelpPage.h"
 
 #include <cstring>

@@ -1,3 +1,5 @@
+// tests/bib_save_test.cpp - what a save writes, what it keeps, and what its failures leave behind.
+
 #include "store/BibStore.h"
 
 #include <gmock/gmock.h>

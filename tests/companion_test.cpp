@@ -1,3 +1,5 @@
+// tests/companion_test.cpp - the services of the TeX environment.
+
 #include "base/Companion.h"
 
 #include <gtest/gtest.h>

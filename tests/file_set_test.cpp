@@ -1,3 +1,5 @@
+// tests/file_set_test.cpp - the open files of a run: locks, saving, questions.
+
 #include "session/FileSet.h"
 #include "ui/PanelRules.h"
 

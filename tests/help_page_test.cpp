@@ -1,3 +1,5 @@
+// tests/help_page_test.cpp - what the help program shows.
+
 #include "help/HelpPage.h"
 
 #include <gtest/gtest.h>

@@ -1,3 +1,5 @@
+// tests/ipc_client_test.cpp - the client's side of the command channel.
+
 #include "app/Ipc.h"
 #include "app/IpcClient.h"
 #include "app/IpcMessage.h"

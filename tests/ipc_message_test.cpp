@@ -1,3 +1,5 @@
+// tests/ipc_message_test.cpp - the messages of the command channel.
+
 #include "app/IpcMessage.h"
 
 #include <gtest/gtest.h>

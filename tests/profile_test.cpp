@@ -1,3 +1,5 @@
+// tests/profile_test.cpp - reading INI files.
+
 #include "base/Profile.h"
 
 #include <gtest/gtest.h>

@@ -1,3 +1,5 @@
+// tests/sys_places_test.cpp - the user's folders, and notes of processes.
+
 #include "base/Sys.h"
 
 #include <gtest/gtest.h>
@@ -202,8 +204,6 @@ TEST_F(SysPrivatePath, DiffersForDifferentNames)
     EXPECT_NE(TextOf(Sys_PrivatePath("a", ".x")), TextOf(Sys_PrivatePath("a", ".y")));
 }
 
-TEST_F(SysPrivatePath, IsShortForAnyName)
-{
 // Also of another version of the program: they meet there.
 TEST_F(SysPrivatePath, IsNamedByTheFnvHash)
 {
@@ -212,6 +212,8 @@ TEST_F(SysPrivatePath, IsNamedByTheFnvHash)
     EXPECT_EQ("85944171f73967e8.end", std::filesystem::path(Private("foobar")).filename());
 }
 
+TEST_F(SysPrivatePath, IsShortForAnyName)
+{
     EXPECT_EQ(Private("a").size(), Private(string(100000, '/').c_str()).size());
 }
 

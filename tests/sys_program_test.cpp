@@ -1,3 +1,5 @@
+// tests/sys_program_test.cpp - other programs, and files in folders.
+
 #include "base/Sys.h"
 
 #include <gtest/gtest.h>

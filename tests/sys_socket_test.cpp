@@ -1,3 +1,5 @@
+// tests/sys_socket_test.cpp - byte streams between the user's processes.
+
 #include "base/Sys.h"
 
 #include <gtest/gtest.h>

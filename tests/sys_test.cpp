@@ -1,3 +1,5 @@
+// tests/sys_test.cpp - files, locks and small questions to the system.
+
 #include "base/Sys.h"
 
 #include <gtest/gtest.h>
@@ -145,8 +147,6 @@ TEST(SysSameFile, SeesThroughNames)
     EXPECT_EQ(0, Sys_SameFile("/missing", "/missing"));
 }
 
-// --- Reading ---
-
 TEST(SysFileStamp, ChangesWithTheFile)
 {
     TempFolder folder;
@@ -172,6 +172,8 @@ TEST(SysFileStamp, IsNothingForWhatIsNoRegularFile)
     EXPECT_EQ(0u, Sys_FileStamp(folder.Path().c_str()));
     EXPECT_EQ(0u, Sys_FileStamp("/dev/null"));
 }
+
+// --- Reading ---
 
 std::string ReadAll(FILE *stream)
 {
