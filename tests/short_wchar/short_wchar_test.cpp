@@ -214,18 +214,32 @@ TEST(Utf16Name, IsReadAndChecked)
 
 // --- Search ---
 
-static bool Finds(const wchar_t *typed, const std::string &value)
+namespace
 {
-    Bib_Initialize();
-    Enc_Select("CP65001");
-    BibFile *file = LoadText("@misc{k, x = {" + value + "}}\n");
-    SearchText search = Search_For(Value_Read(typed, Enc_Current()).c_str(), file);
-    bool found = Search_Finds(&search, file->entries);
-    Bib_FreeFile(file);
-    return found;
-}
 
-TEST(Utf16Search, FindsACharacterOfTwoUnits)
+class Utf16Search : public testing::Test
+{
+protected:
+    Utf16Search()
+    {
+        Bib_Initialize();
+        Enc_Select("CP65001");
+    }
+
+    // In the only value of a file.
+    static bool Finds(const wchar_t *typed, const std::string &value)
+    {
+        BibFile *file = LoadText("@misc{k, x = {" + value + "}}\n");
+        SearchText search = Search_For(Value_Read(typed, Enc_Current()).c_str(), file);
+        bool found = Search_Finds(&search, file->entries);
+        Bib_FreeFile(file);
+        return found;
+    }
+};
+
+} // namespace
+
+TEST_F(Utf16Search, FindsACharacterOfTwoUnits)
 {
     EXPECT_TRUE(Finds(L"\U0001F600", "a \xF0\x9F\x98\x80 b"));
     EXPECT_TRUE(Finds(L"A \U00020000B", "a \xF0\xA0\x80\x80"
@@ -235,7 +249,7 @@ TEST(Utf16Search, FindsACharacterOfTwoUnits)
     EXPECT_TRUE(Finds(L"\u00ABjan\u00BB \U0001F600", "a} # jan # { \xF0\x9F\x98\x80"));
 }
 
-TEST(Utf16Search, FindsNothingInAFileThatCannotHoldTheCharacter)
+TEST_F(Utf16Search, FindsNothingInAFileThatCannotHoldTheCharacter)
 {
     EXPECT_FALSE(Finds(L"\U0001F600", "\xFF\xFF\xFC"));
     EXPECT_TRUE(Finds(L"\u00FC", "\xFF\xFF\xFC"));
@@ -251,16 +265,13 @@ const uint32_t FACE = 0x1F600, HAN = 0x20000;
 class Utf16TypeAhead : public testing::Test
 {
 protected:
-    void Load(const std::string &keys)
+    void Load(const std::vector<std::string> &keys)
     {
         Bib_Initialize();
         Enc_Select("CP65001");
         std::string text;
-        for (size_t at = 0, end; at < keys.size(); at = end + 1) {
-            end = keys.find(' ', at);
-            end = end == keys.npos ? keys.size() : end;
-            text += "@misc{" + keys.substr(at, end - at) + ",}\n";
-        }
+        for (const std::string &key : keys)
+            text += "@misc{" + key + ",}\n";
         file = LoadText(text);
         EXPECT_EQ(0, file->errorCount) << Messages(file);
         count = EntryIndex_Build(&index, &file, 1, nullptr);
@@ -293,9 +304,12 @@ protected:
 
 TEST_F(Utf16TypeAhead, FindsACharacterOfTwoUnits)
 {
-    Load("a x\xF0\x9F\x98\x80"
-         "1 x\xF0\x9F\x98\x81"
-         "1 \xF0\xA0\x80\x80");
+    Load({"a",
+          "x\xF0\x9F\x98\x80"
+          "1",
+          "x\xF0\x9F\x98\x81"
+          "1",
+          "\xF0\xA0\x80\x80"});
     for (uint32_t key : {uint32_t('x'), 0x1F601u, uint32_t('1')})
         EXPECT_EQ(TYPE_AHEAD_ROW, Press(key)) << key;
     EXPECT_EQ("x\xF0\x9F\x98\x81"
@@ -309,7 +323,7 @@ TEST_F(Utf16TypeAhead, FindsACharacterOfTwoUnits)
 
 TEST_F(Utf16TypeAhead, TakesOffBothUnitsOfACharacterThatMatchesNothing)
 {
-    Load("a x\xF0\x9F\x98\x80");
+    Load({"a", "x\xF0\x9F\x98\x80"});
     EXPECT_EQ(TYPE_AHEAD_NO_ROW, Press(HAN));
     EXPECT_EQ(u"", Typed());
     EXPECT_EQ(TYPE_AHEAD_ROW, Press('x'));
@@ -322,7 +336,7 @@ TEST_F(Utf16TypeAhead, TakesOffBothUnitsOfACharacterThatMatchesNothing)
 
 TEST_F(Utf16TypeAhead, MatchesNothingInAFileThatCannotHoldTheCharacter)
 {
-    Load("a \xFF \xF6\xFF");
+    Load({"a", "\xFF", "\xF6\xFF"});
     EXPECT_EQ(TYPE_AHEAD_NO_ROW, Press(FACE));
     EXPECT_EQ(TYPE_AHEAD_ROW, Press(0xF6));
     EXPECT_EQ("\xF6\xFF", Selected());
@@ -333,7 +347,7 @@ TEST_F(Utf16TypeAhead, CountsCharactersForItsLimit)
     std::string key;
     for (int i = 0; i < 40; ++i)
         key += "\xF0\x9F\x98\x80";
-    Load(key);
+    Load({key});
     for (int i = 0; i < TYPE_AHEAD_LIMIT; ++i)
         ASSERT_EQ(TYPE_AHEAD_ROW, Press(FACE)) << i;
     EXPECT_EQ(2u * TYPE_AHEAD_LIMIT, state.prefix.size());
