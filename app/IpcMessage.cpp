@@ -4,6 +4,8 @@
 #include <cstdint>
 #include <cstring>
 
+#include "encoding/Encoding.h"
+
 namespace
 {
 
@@ -114,20 +116,14 @@ IpcResult Ipc_Decode(IpcSide from, const char *bytes, size_t length, IpcMessage 
 
 // --- Text ---
 
-static int IsCharacter(uint32_t character)
+// 0 when the value is no character.
+static int AppendCharacter(std::string *text, uint32_t character)
 {
-    return character < 0xD800 || (character > 0xDFFF && character < 0x110000);
-}
-
-static void AppendUtf8(std::string *text, uint32_t character)
-{
-    static const unsigned char Marks[] = {0, 0, 0xC0, 0xE0, 0xF0};
-    int length = character < 0x80 ? 1 : character < 0x800 ? 2 : character < 0x10000 ? 3 : 4;
-    size_t start = text->size();
-    text->resize(start + length);
-    for (int i = length - 1; i > 0; --i, character >>= 6)
-        (*text)[start + i] = static_cast<char>(0x80 | (character & 0x3F));
-    (*text)[start] = static_cast<char>(length == 1 ? character : Marks[length] | character);
+    if (!Enc_IsCharacter(character))
+        return 0;
+    char bytes[ENC_LONGEST];
+    text->append(bytes, Enc_PutUtf8(bytes, character));
+    return 1;
 }
 
 // Senders write these in the order of their machine, which is this one.
@@ -152,12 +148,9 @@ static int TextFromUtf32(const std::string &data, std::string *text)
     if (data.size() % 4 != 0)
         return 0;
     size_t count = CountUnits<uint32_t>(data);
-    for (size_t i = 0; i < count; ++i) {
-        uint32_t character = UnitAt<uint32_t>(data, i);
-        if (!IsCharacter(character))
+    for (size_t i = 0; i < count; ++i)
+        if (!AppendCharacter(text, UnitAt<uint32_t>(data, i)))
             return 0;
-        AppendUtf8(text, character);
-    }
     return 1;
 }
 
@@ -167,15 +160,12 @@ static int TextFromUtf16(const std::string &data, std::string *text)
         return 0;
     size_t count = CountUnits<uint16_t>(data);
     for (size_t i = 0; i < count; ++i) {
-        uint32_t character = UnitAt<uint16_t>(data, i);
+        uint32_t unit = UnitAt<uint16_t>(data, i);
         uint32_t next = i + 1 < count ? UnitAt<uint16_t>(data, i + 1) : 0;
-        if (character >> 10 == 0xD800 >> 10 && next >> 10 == 0xDC00 >> 10) {
-            character = 0x10000 + ((character & 0x3FF) << 10 | (next & 0x3FF));
-            ++i;
-        }
-        if (!IsCharacter(character))
+        uint32_t joined = Enc_JoinSurrogates(unit, next);
+        if (!AppendCharacter(text, joined ? joined : unit))
             return 0;
-        AppendUtf8(text, character);
+        i += joined != 0;
     }
     return 1;
 }
@@ -199,38 +189,6 @@ int Ipc_CommandText(const IpcMessage *message, std::string *text)
 
 // --- Writing ---
 
-// How many bytes follow the first byte of a character; -1 when none starts so.
-static int FollowerCount(unsigned char first)
-{
-    if (first < 0x80)
-        return 0;
-    if (first >= 0xC2 && first < 0xE0)
-        return 1;
-    if (first >= 0xE0 && first < 0xF0)
-        return 2;
-    return first >= 0xF0 && first < 0xF5 ? 3 : -1;
-}
-
-static int IsUtf8(const char *text)
-{
-    while (*text) {
-        unsigned char first = static_cast<unsigned char>(*text++);
-        int followers = FollowerCount(first);
-        if (followers < 0)
-            return 0;
-        uint32_t character = followers ? first & (0x3F >> followers) : first;
-        for (int i = 0; i < followers; ++i, ++text) {
-            if ((*text & 0xC0) != 0x80)
-                return 0;
-            character = character << 6 | (*text & 0x3F);
-        }
-        static const uint32_t Smallest[] = {0, 0x80, 0x800, 0x10000};
-        if (character < Smallest[followers] || !IsCharacter(character))
-            return 0;
-    }
-    return 1;
-}
-
 static std::string Block(const char *bytes, size_t size)
 {
     std::string block;
@@ -247,7 +205,7 @@ static std::string Name(const char *name)
 // Format and data.
 static std::string Text(const char *text)
 {
-    char format = IsUtf8(text) ? IPC_UTF8_TEXT : IPC_TEXT;
+    char format = Enc_IsUtf8(text, strlen(text)) ? IPC_UTF8_TEXT : IPC_TEXT;
     return format + Block(text, strlen(text) + 1);
 }
 
