@@ -57,20 +57,20 @@ static void Reserve(BibItems *items, size_t size)
     items->room = room;
 }
 
-static void Append(BibItems *items, const void *bytes, size_t size)
+void BibItems_Append(BibItems *items, const void *bytes, size_t size)
 {
     Reserve(items, size);
     memcpy(items->bytes + items->length, bytes, size);
     items->length += size;
 }
 
-static void BeginItem(BibItems *items, BibItemKind kind, int line, int number)
+void BibItems_Begin(BibItems *items, BibItemKind kind, int line, int number)
 {
     BibItemHeader header = {0, kind, line, number};
-    Append(items, &header, sizeof header);
+    BibItems_Append(items, &header, sizeof header);
 }
 
-static void SetNumber(BibItems *items, int number)
+void BibItems_SetNumber(BibItems *items, int number)
 {
     BibItemHeader header;
     memcpy(&header, items->bytes + items->whole, sizeof header);
@@ -78,7 +78,7 @@ static void SetNumber(BibItems *items, int number)
     memcpy(items->bytes + items->whole, &header, sizeof header);
 }
 
-static void EndItem(BibItems *items)
+void BibItems_End(BibItems *items)
 {
     if (items->length - items->whole > UINT32_MAX)
         abort(); // as for lack of memory
@@ -87,41 +87,41 @@ static void EndItem(BibItems *items)
     items->whole = items->length;
 }
 
-static size_t BeginText(BibItems *items)
+size_t BibItems_BeginText(BibItems *items)
 {
     uint32_t length = 0;
-    Append(items, &length, sizeof length);
+    BibItems_Append(items, &length, sizeof length);
     return items->length;
 }
 
-static void EndText(BibItems *items, size_t start)
+void BibItems_EndText(BibItems *items, size_t start)
 {
     uint32_t length = static_cast<uint32_t>(items->length - start);
     memcpy(items->bytes + start - sizeof length, &length, sizeof length);
-    Append(items, "", 1);
+    BibItems_Append(items, "", 1);
 }
 
-static void PackText(BibItems *items, const char *text)
+void BibItems_PackText(BibItems *items, const char *text)
 {
-    size_t start = BeginText(items);
+    size_t start = BibItems_BeginText(items);
     if (text)
-        Append(items, text, strlen(text));
-    EndText(items, start);
+        BibItems_Append(items, text, strlen(text));
+    BibItems_EndText(items, start);
 }
 
 // --- The parser's trees ---
 
 static void PackMessage(BibItems *items, int errorClass, int line, const char *message)
 {
-    BeginItem(items, BIB_ITEM_MESSAGE, line, errorClass);
-    PackText(items, message);
-    EndItem(items);
+    BibItems_Begin(items, BIB_ITEM_MESSAGE, line, errorClass);
+    BibItems_PackText(items, message);
+    BibItems_End(items);
 }
 
 static size_t PackValue(BibItems *items, AST *field)
 {
     size_t pieces = 0;
-    size_t start = BeginText(items);
+    size_t start = BibItems_BeginText(items);
     bt_nodetype kind;
     char *text;
     for (AST *piece = bt_next_value(field, nullptr, &kind, &text); piece;
@@ -131,12 +131,12 @@ static size_t PackValue(BibItems *items, AST *field)
             continue;
         static const char open = BIB_OPEN_ABBREVIATION, close = BIB_CLOSE_ABBREVIATION;
         if (kind == BTAST_MACRO)
-            Append(items, &open, 1);
-        Append(items, text, strlen(text));
+            BibItems_Append(items, &open, 1);
+        BibItems_Append(items, text, strlen(text));
         if (kind == BTAST_MACRO)
-            Append(items, &close, 1);
+            BibItems_Append(items, &close, 1);
     }
-    EndText(items, start);
+    BibItems_EndText(items, start);
     return pieces;
 }
 
@@ -147,11 +147,11 @@ static size_t PackFields(BibItems *items, AST *ast)
     char *name;
     for (AST *field = bt_next_field(ast, nullptr, &name); field;
          field = bt_next_field(ast, field, &name)) {
-        PackText(items, name);
+        BibItems_PackText(items, name);
         pieces += PackValue(items, field) + 1;
         ++count;
     }
-    SetNumber(items, count);
+    BibItems_SetNumber(items, count);
     return pieces;
 }
 
@@ -162,10 +162,10 @@ static size_t PackPieces(BibItems *items, AST *ast)
     for (AST *piece = ast->down; piece; piece = piece->right) {
         if (!piece->text)
             continue;
-        PackText(items, piece->text);
+        BibItems_PackText(items, piece->text);
         ++count;
     }
-    SetNumber(items, count);
+    BibItems_SetNumber(items, count);
     return static_cast<size_t>(count);
 }
 
@@ -174,29 +174,29 @@ size_t BibItems_PackAst(BibItems *items, AST *ast)
     size_t pieces = 0;
     switch (bt_entry_metatype(ast)) {
     case BTE_REGULAR:
-        BeginItem(items, BIB_ITEM_ENTRY, ast->line, 0);
-        PackText(items, bt_entry_type(ast));
-        PackText(items, bt_entry_key(ast));
+        BibItems_Begin(items, BIB_ITEM_ENTRY, ast->line, 0);
+        BibItems_PackText(items, bt_entry_type(ast));
+        BibItems_PackText(items, bt_entry_key(ast));
         pieces = PackFields(items, ast);
         break;
     case BTE_MACRODEF:
-        BeginItem(items, BIB_ITEM_STRINGS, ast->line, 0);
+        BibItems_Begin(items, BIB_ITEM_STRINGS, ast->line, 0);
         pieces = PackFields(items, ast);
         break;
     case BTE_PREAMBLE:
-        BeginItem(items, BIB_ITEM_PREAMBLE, ast->line, 0);
-        PackText(items, bt_entry_type(ast));
+        BibItems_Begin(items, BIB_ITEM_PREAMBLE, ast->line, 0);
+        BibItems_PackText(items, bt_entry_type(ast));
         pieces = PackPieces(items, ast);
         break;
     case BTE_COMMENT:
-        BeginItem(items, BIB_ITEM_COMMENT, ast->line, 0);
+        BibItems_Begin(items, BIB_ITEM_COMMENT, ast->line, 0);
         pieces = PackPieces(items, ast);
         break;
     default:
-        BeginItem(items, BIB_ITEM_STRANGE, ast->line, bt_entry_metatype(ast));
+        BibItems_Begin(items, BIB_ITEM_STRANGE, ast->line, bt_entry_metatype(ast));
         break;
     }
-    EndItem(items);
+    BibItems_End(items);
     return pieces;
 }
 
@@ -318,11 +318,11 @@ static void PackOutside(BibItems *items, size_t offset)
 {
     auto next = Source.kept.begin();
     for (; next != Source.kept.end() && next->end <= offset; ++next) {
-        BeginItem(items, BIB_ITEM_OUTSIDE, 0, 0);
-        size_t start = BeginText(items);
-        Append(items, Source.text + next->start, next->end - next->start);
-        EndText(items, start);
-        EndItem(items);
+        BibItems_Begin(items, BIB_ITEM_OUTSIDE, 0, 0);
+        size_t start = BibItems_BeginText(items);
+        BibItems_Append(items, Source.text + next->start, next->end - next->start);
+        BibItems_EndText(items, start);
+        BibItems_End(items);
     }
     Source.kept.erase(Source.kept.begin(), next);
 }
@@ -397,8 +397,8 @@ static BibEnd ParseAll(FILE *stream, const char *path)
 
 static void SendForm(int form)
 {
-    BeginItem(Sending, BIB_ITEM_FORM, 0, form);
-    EndItem(Sending);
+    BibItems_Begin(Sending, BIB_ITEM_FORM, 0, form);
+    BibItems_End(Sending);
 }
 
 // A file that only begins as UTF-8 would be hard to read without a word on why.
@@ -539,8 +539,8 @@ REPLACES_LIBRARY void zzmode(int mode) noexcept
 REPLACES_LIBRARY void comment()
 {
     if (Sending && Source.mode != LEXER_TOP) {
-        BeginItem(Sending, BIB_ITEM_DROPPED, zzline, 0);
-        EndItem(Sending);
+        BibItems_Begin(Sending, BIB_ITEM_DROPPED, zzline, 0);
+        BibItems_End(Sending);
     }
     OriginalComment();
 }

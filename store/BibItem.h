@@ -1,7 +1,7 @@
 // store/BibItem.h - parsed items as bytes: what the loading child sends to the editor's process.
 //
 // A stream of items, each a BibItemHeader and its texts one after the other. A text is its length
-// (32 bits), its bytes, and a NUL. Private to BibLoad.cpp and BibChild.cpp.
+// (32 bits), its bytes, and a NUL. Private to the loader.
 #pragma once
 
 #include <cstddef>
@@ -38,7 +38,10 @@ struct BibItemHeader {
     int32_t number;
 };
 
-// A growing heap buffer of items.
+// --- Writing: the child ---
+
+// A growing heap buffer of items. Lack of memory ends the process: only the child fills large ones,
+// and the parent reports its end.
 struct BibItems {
     char *bytes;
     size_t length; // all of it
@@ -46,11 +49,43 @@ struct BibItems {
     size_t room;
 };
 
+// An item is begun, gets its texts, and is ended. Its number may be set once more before that.
+void BibItems_Begin(BibItems *items, BibItemKind kind, int line, int number);
+void BibItems_SetNumber(BibItems *items, int number);
+void BibItems_End(BibItems *items);
+
+// A whole text; null counts as an empty one.
+void BibItems_PackText(BibItems *items, const char *text);
+
+// A text in parts: what is appended up to its end. BeginText returns what EndText asks for.
+size_t BibItems_BeginText(BibItems *items);
+void BibItems_Append(BibItems *items, const void *bytes, size_t size);
+void BibItems_EndText(BibItems *items, size_t start);
+
+void BibItems_Free(BibItems *items);
+
+// --- Reading: the editor's process ---
+
+// The size of the item at the start of `bytes`, 0 when the bytes end before it does, -1 when it is
+// none: a child whose memory a broken file has damaged may send anything. An item with a size has
+// just the texts that its kind and number ask for.
+long BibItem_Size(const char *bytes, size_t length);
+
+// Reads the texts of one whole item, one after the other; more than there are must not be asked
+// for. The texts stay where they are, with their NUL; CopyText returns them malloc'd, or null.
+struct BibItemReader {
+    BibItemHeader header;
+    const char *next;
+};
+BibItemReader BibItem_Open(const char *item);
+const char *BibItem_NextText(BibItemReader *reader, uint32_t *length);
+const char *BibItem_NextText(BibItemReader *reader);
+char *BibItem_CopyText(BibItemReader *reader);
+
 // --- BibChild.cpp ---
 
 // One parsed item at the end of `items`. Returns the number of value pieces in it.
 size_t BibItems_PackAst(BibItems *items, struct _ast *ast);
-void BibItems_Free(BibItems *items);
 
 // The body of the loading child. Parses `text`, or the stream when there is none.
 struct BibParseJob {
@@ -60,7 +95,7 @@ struct BibParseJob {
 };
 void BibChild_Parse(void *job) noexcept; // lack of memory ends the child
 
-// --- BibLoad.cpp ---
+// --- Items to records ---
 
 enum BibStored {
     BIB_STORED,
@@ -70,9 +105,13 @@ enum BibStored {
     BIB_NO_MEMORY // the rest of the item was not stored
 };
 
-// The size of the item at the start of `bytes`, 0 when the bytes end before it does, -1 when it is
-// none: a child whose memory a broken file has damaged may send anything.
-long BibItem_Size(const char *bytes, size_t length);
-
 // Builds the records of one whole item and pushes them at the head of the file's lists.
 BibStored BibItem_Store(BibFile *file, const char *item);
+
+// Comment lines inside items are counted and the first ones reported; at the end, how many more
+// there were. `line` is that of the report.
+void Bib_ReportMoreDropped(BibFile *file, int line);
+
+// Free one record. Unlink it first.
+void Bib_FreeString(BibString *string);
+void Bib_FreeComment(BibComment *comment);

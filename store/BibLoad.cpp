@@ -21,21 +21,15 @@ enum { DROPPED_LISTED = 50 }; // comment lines inside items, of a file
 
 // --- Items to records ---
 
-// Reads the texts of one item, one after the other.
-struct ItemReader {
-    BibItemHeader header;
-    const char *next;
-};
-
-static ItemReader OpenItem(const char *item)
+BibItemReader BibItem_Open(const char *item)
 {
-    ItemReader reader;
+    BibItemReader reader;
     memcpy(&reader.header, item, sizeof reader.header);
     reader.next = item + sizeof reader.header;
     return reader;
 }
 
-static const char *NextText(ItemReader *reader, uint32_t *length)
+const char *BibItem_NextText(BibItemReader *reader, uint32_t *length)
 {
     memcpy(length, reader->next, sizeof *length);
     const char *text = reader->next + sizeof *length;
@@ -43,16 +37,16 @@ static const char *NextText(ItemReader *reader, uint32_t *length)
     return text;
 }
 
-static const char *NextText(ItemReader *reader)
+const char *BibItem_NextText(BibItemReader *reader)
 {
     uint32_t length;
-    return NextText(reader, &length);
+    return BibItem_NextText(reader, &length);
 }
 
-static char *CopyNextText(ItemReader *reader)
+char *BibItem_CopyText(BibItemReader *reader)
 {
     uint32_t length;
-    const char *text = NextText(reader, &length);
+    const char *text = BibItem_NextText(reader, &length);
     return Bib_CopyText(text, length);
 }
 
@@ -133,13 +127,13 @@ static void MoveCrossrefToFront(BibEntry *entry, int crossref)
 }
 
 // 1 when every field name of the entry, whose type and key are read, fits in the table.
-static int HasFieldRoom(ItemReader reader)
+static int HasFieldRoom(BibItemReader reader)
 {
     if (BibFieldCount + reader.header.number <= BIB_FIELD_LIMIT)
         return 1;
     for (int i = 0; i < reader.header.number; ++i) {
-        const char *name = NextText(&reader);
-        NextText(&reader);
+        const char *name = BibItem_NextText(&reader);
+        BibItem_NextText(&reader);
         if (!Bib_HasFieldRoom(name))
             return 0;
         Bib_FieldIndex(name);
@@ -147,14 +141,14 @@ static int HasFieldRoom(ItemReader reader)
     return 1;
 }
 
-static BibStored StoreEntry(BibFile *file, ItemReader reader)
+static BibStored StoreEntry(BibFile *file, BibItemReader reader)
 {
     if (!Bib_HasFieldRoom("crossref"))
         return BIB_NO_FIELD;
     int crossref = Bib_FieldIndex("crossref");
-    const char *typeName = NextText(&reader);
+    const char *typeName = BibItem_NextText(&reader);
     uint32_t keyLength;
-    const char *key = NextText(&reader, &keyLength);
+    const char *key = BibItem_NextText(&reader, &keyLength);
     if (keyLength == 0) {
         AppLog("ERROR: ", "invalid entry will be just skipped.");
         return BIB_SKIPPED;
@@ -171,8 +165,8 @@ static BibStored StoreEntry(BibFile *file, ItemReader reader)
     entry->key = Bib_CopyText(key, keyLength);
     int complete = entry->key != nullptr;
     for (int i = 0; i < entry->fieldCount; ++i) {
-        entry->fields[i].name = Bib_FieldIndex(NextText(&reader));
-        entry->fields[i].value = CopyNextText(&reader);
+        entry->fields[i].name = Bib_FieldIndex(BibItem_NextText(&reader));
+        entry->fields[i].value = BibItem_CopyText(&reader);
         complete = complete && entry->fields[i].value;
     }
     if (!complete) {
@@ -186,23 +180,23 @@ static BibStored StoreEntry(BibFile *file, ItemReader reader)
     return BIB_STORED;
 }
 
-static void FreeString(BibString *string)
+void Bib_FreeString(BibString *string)
 {
     free(string->value);
     free(string->name);
     free(string);
 }
 
-static BibStored StoreStrings(BibFile *file, ItemReader reader)
+static BibStored StoreStrings(BibFile *file, BibItemReader reader)
 {
     for (int i = 0; i < reader.header.number; ++i) {
         BibString *string = static_cast<BibString *>(Bib_Alloc(sizeof *string));
         if (!string)
             return BIB_NO_MEMORY;
-        string->name = CopyNextText(&reader);
-        string->value = CopyNextText(&reader);
+        string->name = BibItem_CopyText(&reader);
+        string->value = BibItem_CopyText(&reader);
         if (!string->name || !string->value) {
-            FreeString(string);
+            Bib_FreeString(string);
             return BIB_NO_MEMORY;
         }
         string->next = file->strings;
@@ -227,13 +221,13 @@ static int CountPieces(const char *preamble)
     return count;
 }
 
-static void StorePreamble(BibFile *file, ItemReader reader)
+static void StorePreamble(BibFile *file, BibItemReader reader)
 {
-    AppLog("Preamble: ", NextText(&reader));
+    AppLog("Preamble: ", BibItem_NextText(&reader));
     int lost = 0;
     for (int i = 0; i < reader.header.number; ++i) {
         uint32_t length;
-        const char *piece = NextText(&reader, &length);
+        const char *piece = BibItem_NextText(&reader, &length);
         size_t used = strlen(file->preamble);
         if (used + length + 2 >= BIB_PREAMBLE_SIZE) {
             AppLog("ERROR: Preamble too long in ", file->path);
@@ -249,21 +243,21 @@ static void StorePreamble(BibFile *file, ItemReader reader)
         ReportLostPieces(file, reader.header.line);
 }
 
-static void FreeComment(BibComment *comment)
+void Bib_FreeComment(BibComment *comment)
 {
     free(comment->text);
     free(comment);
 }
 
-static BibStored StoreComments(BibFile *file, ItemReader reader)
+static BibStored StoreComments(BibFile *file, BibItemReader reader)
 {
     for (int i = 0; i < reader.header.number; ++i) {
         BibComment *comment = static_cast<BibComment *>(Bib_Alloc(sizeof *comment));
         if (!comment)
             return BIB_NO_MEMORY;
-        comment->text = CopyNextText(&reader);
+        comment->text = BibItem_CopyText(&reader);
         if (!comment->text) {
-            FreeComment(comment);
+            Bib_FreeComment(comment);
             return BIB_NO_MEMORY;
         }
         AppLog("Comment: ", comment->text);
@@ -284,7 +278,7 @@ static void ReportDropped(BibFile *file, int line)
                           "a comment inside an entry is not kept when the file is saved");
 }
 
-static void ReportMoreDropped(BibFile *file, int line)
+void Bib_ReportMoreDropped(BibFile *file, int line)
 {
     int more = file->origin ? file->origin->dropped - DROPPED_LISTED : 0;
     if (more <= 0)
@@ -293,16 +287,16 @@ static void ReportMoreDropped(BibFile *file, int line)
     Bib_ReportMessage(nullptr, BTERR_NOTIFY, file->path, line, nullptr, -1, message.c_str());
 }
 
-static BibStored StoreOutside(BibFile *file, ItemReader reader)
+static BibStored StoreOutside(BibFile *file, BibItemReader reader)
 {
     uint32_t length;
-    const char *text = NextText(&reader, &length);
+    const char *text = BibItem_NextText(&reader, &length);
     return Outside_Add(file, text, length) ? BIB_STORED : BIB_NO_MEMORY;
 }
 
 BibStored BibItem_Store(BibFile *file, const char *item)
 {
-    ItemReader reader = OpenItem(item);
+    BibItemReader reader = BibItem_Open(item);
     switch (reader.header.kind) {
     case BIB_ITEM_ENTRY:
         return StoreEntry(file, reader);
@@ -328,7 +322,7 @@ BibStored BibItem_Store(BibFile *file, const char *item)
         break;
     case BIB_ITEM_MESSAGE:
         Bib_ReportMessage(nullptr, reader.header.number, file->path, reader.header.line, nullptr,
-                          -1, NextText(&reader));
+                          -1, BibItem_NextText(&reader));
         break;
     }
     return BIB_STORED;
@@ -493,7 +487,7 @@ static void LoadItems(BibFile *file)
     int answered = ReceiveItems(&load, &child, 2 * seconds + 30);
     SysChildEnd end = Sys_EndChild(&child);
     BibCurrentFile = file;
-    ReportMoreDropped(file, load.line);
+    Bib_ReportMoreDropped(file, load.line);
     const char *reason = ReasonOfEnd(&load, end, answered);
     if (reason)
         Report(file, load.line, reason);
@@ -575,11 +569,11 @@ void Bib_FreeFile(BibFile *file)
     }
     while (BibString *string = file->strings) {
         file->strings = string->next;
-        FreeString(string);
+        Bib_FreeString(string);
     }
     while (BibComment *comment = file->comments) {
         file->comments = comment->next;
-        FreeComment(comment);
+        Bib_FreeComment(comment);
     }
     free(file->baseName);
     free(file->path);
