@@ -95,7 +95,7 @@ struct BibParseJob {
 };
 void BibChild_Parse(void *job) noexcept; // lack of memory ends the child
 
-// --- Items to records ---
+// --- BibRecords.cpp ---
 
 enum BibStored {
     BIB_STORED,
