@@ -43,72 +43,6 @@ enum {
     LEAVE_TREE_SIZE = 100000 // pieces; the library frees a tree by recursion along them
 };
 
-// --- Packing ---
-
-static void Reserve(BibItems *items, size_t size)
-{
-    if (items->length + size <= items->room)
-        return;
-    size_t room = 2 * (items->length + size);
-    char *bytes = static_cast<char *>(realloc(items->bytes, room));
-    if (!bytes)
-        abort(); // only the child works with large items; the parent reports its end
-    items->bytes = bytes;
-    items->room = room;
-}
-
-void BibItems_Append(BibItems *items, const void *bytes, size_t size)
-{
-    Reserve(items, size);
-    memcpy(items->bytes + items->length, bytes, size);
-    items->length += size;
-}
-
-void BibItems_Begin(BibItems *items, BibItemKind kind, int line, int number)
-{
-    BibItemHeader header = {0, kind, line, number};
-    BibItems_Append(items, &header, sizeof header);
-}
-
-void BibItems_SetNumber(BibItems *items, int number)
-{
-    BibItemHeader header;
-    memcpy(&header, items->bytes + items->whole, sizeof header);
-    header.number = number;
-    memcpy(items->bytes + items->whole, &header, sizeof header);
-}
-
-void BibItems_End(BibItems *items)
-{
-    if (items->length - items->whole > UINT32_MAX)
-        abort(); // as for lack of memory
-    uint32_t size = static_cast<uint32_t>(items->length - items->whole);
-    memcpy(items->bytes + items->whole, &size, sizeof size);
-    items->whole = items->length;
-}
-
-size_t BibItems_BeginText(BibItems *items)
-{
-    uint32_t length = 0;
-    BibItems_Append(items, &length, sizeof length);
-    return items->length;
-}
-
-void BibItems_EndText(BibItems *items, size_t start)
-{
-    uint32_t length = static_cast<uint32_t>(items->length - start);
-    memcpy(items->bytes + start - sizeof length, &length, sizeof length);
-    BibItems_Append(items, "", 1);
-}
-
-void BibItems_PackText(BibItems *items, const char *text)
-{
-    size_t start = BibItems_BeginText(items);
-    if (text)
-        BibItems_Append(items, text, strlen(text));
-    BibItems_EndText(items, start);
-}
-
 // --- The parser's trees ---
 
 static void PackMessage(BibItems *items, int errorClass, int line, const char *message)
@@ -198,12 +132,6 @@ size_t BibItems_PackAst(BibItems *items, AST *ast)
     }
     BibItems_End(items);
     return pieces;
-}
-
-void BibItems_Free(BibItems *items)
-{
-    free(items->bytes);
-    *items = {};
 }
 
 // --- The child ---
