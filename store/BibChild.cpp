@@ -17,6 +17,7 @@
 
 #include "base/Sys.h"
 #include "encoding/Encoding.h"
+#include "store/BibHooks.h"
 #include "store/BibItem.h"
 #include "store/BibStore.h"
 #include "store/BibText.h"
@@ -136,7 +137,7 @@ size_t BibItems_PackAst(BibItems *items, AST *ast)
 
 // --- The child ---
 
-static BibItems *Sending = nullptr; // what the child has not sent yet; null in the parent
+static BibItems *Sending; // what the child has not sent yet
 static int EndWasSent = 0;
 
 static void Send(BibItems *items)
@@ -227,7 +228,7 @@ static int IsInBrackets(size_t at)
     return open < end && *open == '(';
 }
 
-static void FollowMode(int mode)
+static void OnMode(int mode)
 {
     // It counts the end of the file as well. At the start it still has the count of another text,
     // when this process has parsed one.
@@ -266,6 +267,24 @@ static void KeepAll(size_t words)
 }
 
 // --- Parsing ---
+
+// The library reports while an item is still being parsed, never while one is being packed.
+static void OnMessage(int errorClass, int line, const char *message)
+{
+    PackMessage(Sending, errorClass, line, message);
+    if (errorClass >= BTERR_USAGEERR)
+        Send(Sending);
+}
+
+static void OnComment(int line)
+{
+    if (Source.mode == LEXER_TOP)
+        return;
+    BibItems_Begin(Sending, BIB_ITEM_DROPPED, line, 0);
+    BibItems_End(Sending);
+}
+
+static const BibListener Listening = {OnMessage, OnMode, OnComment};
 
 // Frees an item's tree, unless the library's recursion would use up the stack.
 static void FreeTree(AST *ast, size_t pieces)
@@ -356,6 +375,7 @@ void BibChild_Parse(void *argument) noexcept
     static BibItems items;
     const BibParseJob *job = static_cast<const BibParseJob *>(argument);
     Sending = &items;
+    BibHooks_Listen(&Listening);
     Sys_OnChildCrash(OnCrash);
     atexit(OnExit);
 
@@ -390,18 +410,21 @@ void BibChild_Parse(void *argument) noexcept
 
 // --- Functions of the library that are replaced ---
 
+static const BibListener *Listener = nullptr;
+
+void BibHooks_Listen(const BibListener *listener)
+{
+    Listener = listener;
+}
+
 static void Report(const char *className, int errorClass, const char *fileName, int line,
                    const char *itemDescription, int itemNumber, const char *message)
 {
-    if (!Sending) {
+    if (Listener)
+        Listener->message(errorClass, line, message);
+    else
         Bib_ReportMessage(className, errorClass, fileName, line, itemDescription, itemNumber,
                           message);
-        return;
-    }
-    // The library reports while an item is still being parsed, never while one is being packed.
-    PackMessage(Sending, errorClass, line, message);
-    if (errorClass >= BTERR_USAGEERR)
-        Send(Sending);
 }
 
 static const char *const ClassNames[] = {"notification", "warning",       "warning",
@@ -458,17 +481,15 @@ static void (*const OriginalComment)() = Replaced<void()>("comment");
 // The lexer enters an item, a string in it, or leaves it.
 REPLACES_LIBRARY void zzmode(int mode) noexcept
 {
-    if (Sending)
-        FollowMode(mode);
+    if (Listener)
+        Listener->mode(mode);
     OriginalMode(mode);
 }
 
 // A comment line, which the library drops.
 REPLACES_LIBRARY void comment()
 {
-    if (Sending && Source.mode != LEXER_TOP) {
-        BibItems_Begin(Sending, BIB_ITEM_DROPPED, zzline, 0);
-        BibItems_End(Sending);
-    }
+    if (Listener)
+        Listener->comment(zzline);
     OriginalComment();
 }
