@@ -3,6 +3,8 @@
 // The parser library ends or breaks its process on input that people really have, so it runs in a
 // child of the editor.
 
+#include "store/BibChild.h"
+
 #include <algorithm>
 #include <climits>
 #include <cstdlib>
@@ -14,7 +16,6 @@
 #include "base/Sys.h"
 #include "encoding/Encoding.h"
 #include "store/BibHooks.h"
-#include "store/BibItem.h"
 #include "store/BibStore.h"
 #include "store/BibText.h"
 

@@ -5,6 +5,8 @@
 #include <cstdlib>
 #include <cstring>
 
+#include "store/BibStore.h"
+
 // --- Writing ---
 
 static void Reserve(BibItems *items, size_t size)

@@ -6,9 +6,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <cstdio>
-
-#include "store/BibStore.h"
 
 enum BibItemKind {
     BIB_ITEM_MESSAGE,  // number: the error class; the message
@@ -81,37 +78,3 @@ BibItemReader BibItem_Open(const char *item);
 const char *BibItem_NextText(BibItemReader *reader, uint32_t *length);
 const char *BibItem_NextText(BibItemReader *reader);
 char *BibItem_CopyText(BibItemReader *reader);
-
-// --- BibChild.cpp ---
-
-// One parsed item at the end of `items`. Returns the number of value pieces in it.
-size_t BibItems_PackAst(BibItems *items, struct _ast *ast);
-
-// The body of the loading child. Parses `text`, or the stream when there is none.
-struct BibParseJob {
-    FILE *stream;
-    const char *text;
-    const char *path; // for the parser's own use
-};
-void BibChild_Parse(void *job) noexcept; // lack of memory ends the child
-
-// --- BibRecords.cpp ---
-
-enum BibStored {
-    BIB_STORED,
-    BIB_SKIPPED,  // an entry without a key
-    BIB_NO_TYPE,  // the table of entry types is full; nothing was stored
-    BIB_NO_FIELD, // the table of field names is full; nothing was stored
-    BIB_NO_MEMORY // the rest of the item was not stored
-};
-
-// Builds the records of one whole item and pushes them at the head of the file's lists.
-BibStored BibItem_Store(BibFile *file, const char *item);
-
-// Comment lines inside items are counted and the first ones reported; at the end, how many more
-// there were. `line` is that of the report.
-void Bib_ReportMoreDropped(BibFile *file, int line);
-
-// Free one record. Unlink it first.
-void Bib_FreeString(BibString *string);
-void Bib_FreeComment(BibComment *comment);

@@ -1,6 +1,5 @@
 // store/BibLoad.cpp - loading a BIB file: records from the items that the child sends.
 
-#include "store/BibItem.h"
 #include "store/BibStore.h"
 
 #include <cstdlib>
@@ -11,7 +10,10 @@
 
 #include "base/Log.h"
 #include "base/Sys.h"
+#include "store/BibChild.h"
+#include "store/BibItem.h"
 #include "store/BibOutside.h"
+#include "store/BibRecords.h"
 
 int BibLoadSeconds = 10;
 

@@ -1,7 +1,6 @@
 // store/BibRecords.cpp - the records of a BIB file, out of the items that were parsed.
 
-#include "store/BibItem.h"
-#include "store/BibStore.h"
+#include "store/BibRecords.h"
 
 #include <cstdlib>
 #include <cstring>
@@ -10,6 +9,8 @@
 #include <btparse.h>
 
 #include "base/Log.h"
+#include "store/BibChild.h"
+#include "store/BibItem.h"
 #include "store/BibOutside.h"
 
 enum { DROPPED_LISTED = 50 }; // comment lines inside items, of a file

@@ -9,6 +9,7 @@
 #include <sys/resource.h>
 #include <unistd.h>
 
+#include "store/BibRecords.h"
 #include "tests/support/LoadText.h"
 #include "tests/support/LogCapture.h"
 

@@ -7,6 +7,7 @@
 #include <cstring>
 
 #include "store/BibItem.h"
+#include "store/BibRecords.h"
 #include "tests/fuzz/Demand.h"
 #include "tests/fuzz/Records.h"
 
