@@ -178,8 +178,9 @@ enum SysChildEnd {
 
 // Runs body(argument) in a copy of this process, with at most `cpuSeconds` of CPU time and no core
 // file. The child has the calling thread alone and leaves when body returns. 1, or 0 with the
-// reason in Sys_LastErrorText().
-int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds);
+// reason.
+int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds,
+                   SysReason *why);
 
 // What the child wrote next: the count of bytes, 0 at the end, -1 when nothing came for `seconds`.
 long Sys_ReadChild(SysChild *child, void *buffer, size_t size, int seconds);

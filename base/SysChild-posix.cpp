@@ -6,6 +6,7 @@
 #include <cerrno>
 #include <clocale>
 #include <csignal>
+#include <cstdio>
 #include <cstdlib>
 
 #include <dlfcn.h>
@@ -75,20 +76,30 @@ void Sys_KeepEndedChildren()
         signal(SIGCHLD, SIG_DFL);
 }
 
-int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds)
+// Puts the reason, which is in errno, where it is wanted. Returns 0.
+static int Explain(SysReason *why)
+{
+    if (!why)
+        return 0;
+    snprintf(why->text, sizeof why->text, "%s", Sys_LastErrorText());
+    why->isTaken = 0;
+    return 0;
+}
+
+int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds,
+                   SysReason *why)
 {
     int ends[2];
     if (!Sys_OpenPipe(ends))
-        return 0;
+        return Explain(why);
     Sys_KeepEndedChildren();
     fcntl(ends[1], F_SETPIPE_SZ, 1 << 20); // fewer switches between the two; it may be refused
     fflush(nullptr); // else the child would hold, and perhaps write, unwritten lines of ours
     pid_t pid = fork();
     if (pid < 0) {
-        int reason = errno;
+        Explain(why);
         close(ends[0]);
         close(ends[1]);
-        errno = reason;
         return 0;
     }
     if (pid == 0) {

@@ -166,8 +166,9 @@ static void LoadItems(BibFile *file)
     int seconds = SecondsFor(file->stream);
     BibParseJob job = {file->stream, nullptr, file->path};
     SysChild child;
-    if (!Sys_StartChild(&child, BibChild_Parse, &job, seconds)) {
-        Report(file, 0, Sys_LastErrorText());
+    SysReason why;
+    if (!Sys_StartChild(&child, BibChild_Parse, &job, seconds, &why)) {
+        Report(file, 0, why.text);
         return;
     }
     Load load = {};
@@ -290,7 +291,7 @@ int Bib_SelfTest()
 {
     BibParseJob job = {nullptr, "% comment\n@misc{key, field = }\n", "self-test"};
     SysChild child;
-    if (!Sys_StartChild(&child, BibChild_Parse, &job, BibLoadSeconds))
+    if (!Sys_StartChild(&child, BibChild_Parse, &job, BibLoadSeconds, nullptr))
         return 0;
     char bytes[4096]; // more than it sends
     size_t length = 0;

@@ -12,6 +12,7 @@
 #include <btparse.h>
 #include <dirent.h>
 #include <pthread.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -337,6 +338,24 @@ TEST_F(BibLoad, KeepsWhatCameBeforeAFatalError)
     EXPECT_EQ(1, file->errorCount);
     EXPECT_NE(std::string::npos, Messages(file).find("FATAL ERROR: line -1: ")) << Messages(file);
     EXPECT_EQ(std::string::npos, Messages(file).find("INTERNAL ERROR")) << Messages(file);
+}
+
+// The file itself still gets a descriptor, the child's pipe does not.
+TEST_F(BibLoad, TellsWhyNoChildStarts)
+{
+    TempFolder folder;
+    std::string path = folder.Write("refs.bib", "@misc{k, x = 1}\n");
+    int next = dup(0);
+    close(next);
+    struct rlimit limit;
+    getrlimit(RLIMIT_NOFILE, &limit);
+    struct rlimit low = {static_cast<rlim_t>(next) + 1, limit.rlim_max};
+    setrlimit(RLIMIT_NOFILE, &low);
+    file = Bib_LoadFile(path.c_str());
+    setrlimit(RLIMIT_NOFILE, &limit);
+    ASSERT_NE(nullptr, file);
+    EXPECT_EQ(nullptr, file->entries);
+    EXPECT_EQ("INTERNAL ERROR: line 0: Too many open files\r\n", Messages(file));
 }
 
 TEST_F(BibLoad, IsNotDisturbedByTheFileBefore)

@@ -2,11 +2,13 @@
 
 #include <gtest/gtest.h>
 
+#include <cerrno>
 #include <csignal>
 #include <cstdlib>
 #include <cstring>
 #include <string>
 
+#include <sys/resource.h>
 #include <unistd.h>
 
 namespace
@@ -32,7 +34,7 @@ struct Outcome {
 Outcome RunChild(void (*body)(void *), int cpuSeconds = 10)
 {
     SysChild child;
-    EXPECT_EQ(1, Sys_StartChild(&child, body, nullptr, cpuSeconds));
+    EXPECT_EQ(1, Sys_StartChild(&child, body, nullptr, cpuSeconds, nullptr));
     Outcome outcome;
     outcome.written = ReadAll(&child);
     outcome.end = Sys_EndChild(&child);
@@ -65,7 +67,7 @@ TEST(SysChild, GetsItsArgument)
                          const char *given = static_cast<const char *>(argument);
                          Sys_WriteParent(given, strlen(given));
                      },
-                     text, 10));
+                     text, 10, nullptr));
     EXPECT_EQ("argument", ReadAll(&child));
     EXPECT_EQ(SYS_CHILD_DONE, Sys_EndChild(&child));
 }
@@ -131,7 +133,7 @@ TEST(SysChild, IsGivenUpWhenItIsSilent)
 {
     SysChild child;
     ASSERT_EQ(1, Sys_StartChild(
-                     &child, [](void *) { pause(); }, nullptr, 10));
+                     &child, [](void *) { pause(); }, nullptr, 10, nullptr));
     char buffer[10];
     EXPECT_EQ(-1, Sys_ReadChild(&child, buffer, sizeof buffer, 1));
     EXPECT_EQ(SYS_CHILD_CRASHED, Sys_EndChild(&child));
@@ -147,8 +149,27 @@ TEST(SysChild, SeesThatNobodyReads)
                          while (Sys_WriteParent(block, sizeof block)) {
                          }
                      },
-                     nullptr, 10));
+                     nullptr, 10, nullptr));
     EXPECT_EQ(SYS_CHILD_CRASHED, Sys_EndChild(&child)); // killed: it was in mid-write
+}
+
+TEST(SysChild, TellsWhyItDoesNotStart)
+{
+    struct rlimit limit;
+    getrlimit(RLIMIT_NOFILE, &limit);
+    struct rlimit none = {0, limit.rlim_max};
+    setrlimit(RLIMIT_NOFILE, &none);
+    SysChild child;
+    SysReason why = {"", -1};
+    int started = Sys_StartChild(
+        &child, [](void *) {}, nullptr, 10, &why);
+    int startedUnasked = Sys_StartChild(
+        &child, [](void *) {}, nullptr, 10, nullptr);
+    setrlimit(RLIMIT_NOFILE, &limit);
+    EXPECT_EQ(0, started);
+    EXPECT_EQ(0, startedUnasked);
+    EXPECT_STREQ(strerror(EMFILE), why.text);
+    EXPECT_EQ(0, why.isTaken);
 }
 
 // The child turns its standard error away, which must not be the pipe.
