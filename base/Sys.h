@@ -163,6 +163,22 @@ void Sys_CloseListener(int listener, const char *path); // removes the socket fi
 
 // --- A child process that works for this one ---
 
+// What a child is given: all that it may know of this process, since a system that can't copy one
+// starts the program again. Whatever else a task needs, what is selected or set, goes into `bytes`.
+struct SysInput {
+    const void *bytes; // a block of any form, but without pointers: the child may have a copy of it
+    size_t size;
+    FILE *stream; // the child reads it, from where it stands; nobody else does, and it stays open,
+                  // up to Sys_EndChild. Null for none
+};
+
+// What a child can do, by name: a program that is started again gets `--child NAME`, and turns to
+// that row of its table before anything else.
+struct SysTask {
+    const char *name;
+    void (*run)(const SysInput *input);
+};
+
 struct SysChild {
     int pid;
     int pipe;  // what the child writes
@@ -176,10 +192,10 @@ enum SysChildEnd {
     SYS_CHILD_TIME_LIMIT // used up its CPU time
 };
 
-// Runs body(argument) in a copy of this process, with at most `cpuSeconds` of CPU time and no core
-// file. The child has the calling thread alone and leaves when body returns. 1, or 0 with the
-// reason.
-int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds,
+// Runs the task in a process of its own, with at most `cpuSeconds` of CPU time and no core file.
+// It has no other thread and leaves when the task returns. 1, or 0 with the reason. The block may
+// be freed after that.
+int Sys_StartChild(SysChild *child, const SysTask *task, const SysInput *input, int cpuSeconds,
                    SysReason *why);
 
 // What the child wrote next: the count of bytes, 0 at the end, -1 when nothing came for `seconds`.

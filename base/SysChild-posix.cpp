@@ -86,7 +86,20 @@ static int Explain(SysReason *why)
     return 0;
 }
 
-int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument, int cpuSeconds,
+// A copy of this process has the task and its input; the name is not needed.
+[[noreturn]] static void BecomeChild(int toParent, const SysTask *task, const SysInput *input,
+                                     int cpuSeconds)
+{
+    ToParent = toParent;
+    signal(SIGPIPE, SIG_IGN);
+    SilenceErrors();
+    LimitResources(cpuSeconds);
+    VolunteerForLackOfMemory();
+    task->run(input);
+    Sys_LeaveChild(0);
+}
+
+int Sys_StartChild(SysChild *child, const SysTask *task, const SysInput *input, int cpuSeconds,
                    SysReason *why)
 {
     int ends[2];
@@ -104,13 +117,7 @@ int Sys_StartChild(SysChild *child, void (*body)(void *argument), void *argument
     }
     if (pid == 0) {
         close(ends[0]);
-        ToParent = ends[1];
-        signal(SIGPIPE, SIG_IGN);
-        SilenceErrors();
-        LimitResources(cpuSeconds);
-        VolunteerForLackOfMemory();
-        body(argument);
-        Sys_LeaveChild(0);
+        BecomeChild(ends[1], task, input, cpuSeconds);
     }
     close(ends[1]);
     child->pid = pid;

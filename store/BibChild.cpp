@@ -339,7 +339,7 @@ static void SendForm(int form)
 // A file that only begins as UTF-8 would be hard to read without a word on why.
 static void ReportBadByte(const char *text, size_t length, int form)
 {
-    if (!(form & BIB_FORM_CODE_PAGE) || Enc_Current() != &EncodingUtf8)
+    if (!(form & BIB_FORM_CODE_PAGE))
         return;
     size_t valid = Enc_Utf8Length(text, length);
     if (form & BIB_FORM_MARK || !BibText_IsAscii(text, valid))
@@ -358,25 +358,77 @@ static bool ReportNul(const char *text, size_t length)
     return nul != nullptr;
 }
 
-void BibChild_Parse(void *argument) noexcept
+// --- The task ---
+
+// All room is made first: in the editor, lack of memory must not end the process.
+BibItems BibJob_Pack(const BibParseJob *job)
+{
+    const int32_t options = job->stringOptions;
+    const char *const texts[] = {job->encoding, job->path, job->text};
+    BibItems block = {};
+    block.room = sizeof options;
+    for (const char *text : texts)
+        block.room += BIB_ITEM_TEXT_FRAME + (text ? strlen(text) : 0);
+    block.bytes = static_cast<char *>(Bib_Alloc(block.room));
+    if (!block.bytes)
+        return {};
+    BibItems_Append(&block, &options, sizeof options);
+    for (const char *text : texts)
+        BibItems_PackText(&block, text);
+    return block;
+}
+
+// The texts stay in the block.
+static BibParseJob Unpack(const void *bytes)
+{
+    int32_t options;
+    memcpy(&options, bytes, sizeof options);
+    BibItemReader reader = {{}, static_cast<const char *>(bytes) + sizeof options};
+    BibParseJob job = {};
+    job.encoding = BibItem_NextText(&reader);
+    job.path = BibItem_NextText(&reader);
+    job.text = BibItem_NextText(&reader);
+    job.stringOptions = options;
+    return job;
+}
+
+// malloc'd, with a spare byte; null when it can't be read.
+static char *ReadText(FILE *stream, const BibParseJob *job, size_t *length)
+{
+    if (stream)
+        return Sys_ReadAll(stream, length);
+    *length = strlen(job->text);
+    return Bib_CopyText(job->text, *length);
+}
+
+// A program that was started again has not set up the library.
+static void SetUpLibrary(int stringOptions)
+{
+    Sys_UsePlainLocale();
+    bt_initialize();
+    for (bt_metatype kind : {BTE_MACRODEF, BTE_REGULAR, BTE_COMMENT, BTE_PREAMBLE})
+        bt_set_stringopts(kind, static_cast<btshort>(stringOptions));
+}
+
+static void Parse(const SysInput *input) noexcept
 {
     static BibItems items;
-    const BibParseJob *job = static_cast<const BibParseJob *>(argument);
+    const BibParseJob job = Unpack(input->bytes);
     Sending = &items;
     BibHooks_Listen(&Listening);
     Sys_OnChildCrash(OnCrash);
     atexit(OnExit);
 
     size_t length = 0;
-    char *text = job->text ? Bib_CopyText(job->text, length = strlen(job->text))
-                           : Sys_ReadAll(job->stream, &length);
+    char *text = ReadText(input->stream, &job, &length);
     if (!text || length >= INT_MAX) // the lexer counts with int
         Leave(BIB_END_UNREADABLE);
     const int form = BibText_Form(text, length);
     SendForm(form);
     const bool isBinary = ReportNul(text, length);
     length = BibText_Normalise(text, length);
-    ReportBadByte(text, length, form);
+    if (strcmp(job.encoding, EncodingUtf8.name) == 0)
+        ReportBadByte(text, length, form);
     ReportMarks(text, length);
     Source.text = text;
     Source.length = length;
@@ -388,10 +440,8 @@ void BibChild_Parse(void *argument) noexcept
     FILE *stream = Sys_OpenText(text, length);
     if (!stream)
         Leave(BIB_END_UNREADABLE);
-    Sys_UsePlainLocale();
-    bt_set_stringopts(BTE_MACRODEF, BibStringOptions);
-    bt_set_stringopts(BTE_REGULAR, BibStringOptions);
-    bt_set_stringopts(BTE_COMMENT, BibStringOptions);
-    bt_set_stringopts(BTE_PREAMBLE, BibStringOptions);
-    Leave(ParseAll(stream, job->path));
+    SetUpLibrary(job.stringOptions);
+    Leave(ParseAll(stream, job.path));
 }
+
+const SysTask BibTasks[] = {{"parse", Parse}, {nullptr, nullptr}};

@@ -35,10 +35,12 @@ struct BibItemHeader {
     int32_t number;
 };
 
+enum { BIB_ITEM_TEXT_FRAME = sizeof(uint32_t) + 1 }; // what a text takes besides its bytes
+
 // --- Writing: the child ---
 
-// A growing heap buffer of items. Lack of memory ends the process: only the child fills large ones,
-// and the parent reports its end.
+// A growing heap buffer of items. When it can't grow for lack of memory, the process ends: only the
+// child fills large ones, and the parent reports its end.
 struct BibItems {
     char *bytes;
     size_t length; // all of it

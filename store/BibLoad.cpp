@@ -10,6 +10,7 @@
 
 #include "base/Log.h"
 #include "base/Sys.h"
+#include "encoding/Encoding.h"
 #include "store/BibChild.h"
 #include "store/BibItem.h"
 #include "store/BibOutside.h"
@@ -160,14 +161,29 @@ static void Report(BibFile *file, int line, const char *message)
     Bib_ReportMessage(nullptr, BTERR_INTERNAL, file->path, line, nullptr, -1, message);
 }
 
+// The parser's child, which reads the stream, or `text` when that is null.
+static int StartParser(SysChild *child, FILE *stream, const char *text, const char *path,
+                       int seconds, SysReason *why)
+{
+    const BibParseJob job = {Enc_Current()->name, path, text, BibStringOptions};
+    BibItems block = BibJob_Pack(&job);
+    if (!block.bytes) {
+        *why = {"there is not enough memory", 0};
+        return 0;
+    }
+    const SysInput input = {block.bytes, block.length, stream};
+    int started = Sys_StartChild(child, &BibTasks[BIB_TASK_PARSE], &input, seconds, why);
+    BibItems_Free(&block);
+    return started;
+}
+
 // The child may be silent for longer than it computes, on a slow disk.
 static void LoadItems(BibFile *file)
 {
     int seconds = SecondsFor(file->stream);
-    BibParseJob job = {file->stream, nullptr, file->path};
     SysChild child;
     SysReason why;
-    if (!Sys_StartChild(&child, BibChild_Parse, &job, seconds, &why)) {
+    if (!StartParser(&child, file->stream, nullptr, file->path, seconds, &why)) {
         Report(file, 0, why.text);
         return;
     }
@@ -289,9 +305,10 @@ static int HasItem(const char *bytes, size_t length, BibItemKind kind)
 // The child parses a text that must give a message and a comment line, in the way it parses files.
 int Bib_SelfTest()
 {
-    BibParseJob job = {nullptr, "% comment\n@misc{key, field = }\n", "self-test"};
+    static const char text[] = "% comment\n@misc{key, field = }\n";
     SysChild child;
-    if (!Sys_StartChild(&child, BibChild_Parse, &job, BibLoadSeconds, nullptr))
+    SysReason why;
+    if (!StartParser(&child, nullptr, text, "self-test", BibLoadSeconds, &why))
         return 0;
     char bytes[4096]; // more than it sends
     size_t length = 0;

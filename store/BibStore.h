@@ -173,7 +173,7 @@ int Bib_EntryContains(const BibEntry *entry, const char *text);
 void *Bib_Alloc(size_t size);
 char *Bib_CopyText(const char *text, size_t length); // adds the NUL
 
-// --- Loading (BibLoad.cpp, BibChild.cpp) ---
+// --- Loading (BibLoad.cpp, BibRecords.cpp) ---
 
 // Reads one file. The parser runs in a child process, so that no input can harm this one: when the
 // child fails, what it had read is kept and the file counts an error. Logs and returns null when

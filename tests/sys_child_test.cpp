@@ -31,14 +31,28 @@ struct Outcome {
     SysChildEnd end;
 };
 
-Outcome RunChild(void (*body)(void *), int cpuSeconds = 10)
+using Body = void (*)(const SysInput *);
+
+int Start(SysChild *child, Body body, const SysInput &input = {}, int cpuSeconds = 10,
+          SysReason *why = nullptr)
+{
+    const SysTask task = {"test", body};
+    return Sys_StartChild(child, &task, &input, cpuSeconds, why);
+}
+
+Outcome Finish(SysChild *child)
+{
+    Outcome outcome;
+    outcome.written = ReadAll(child);
+    outcome.end = Sys_EndChild(child);
+    return outcome;
+}
+
+Outcome RunChild(Body body, int cpuSeconds = 10)
 {
     SysChild child;
-    EXPECT_EQ(1, Sys_StartChild(&child, body, nullptr, cpuSeconds, nullptr));
-    Outcome outcome;
-    outcome.written = ReadAll(&child);
-    outcome.end = Sys_EndChild(&child);
-    return outcome;
+    EXPECT_EQ(1, Start(&child, body, {}, cpuSeconds));
+    return Finish(&child);
 }
 
 void SayLastWords()
@@ -52,29 +66,47 @@ volatile int Endless = 1;
 
 TEST(SysChild, SendsWhatItWrites)
 {
-    Outcome outcome = RunChild([](void *) { Sys_WriteParent("hello", 5); });
+    Outcome outcome = RunChild([](const SysInput *) { Sys_WriteParent("hello", 5); });
     EXPECT_EQ("hello", outcome.written);
     EXPECT_EQ(SYS_CHILD_DONE, outcome.end);
 }
 
-TEST(SysChild, GetsItsArgument)
+TEST(SysChild, GetsItsBlock)
 {
+    std::string block("block\0of bytes", 14);
     SysChild child;
-    char text[] = "argument";
-    ASSERT_EQ(1, Sys_StartChild(
-                     &child,
-                     [](void *argument) {
-                         const char *given = static_cast<const char *>(argument);
-                         Sys_WriteParent(given, strlen(given));
-                     },
-                     text, 10, nullptr));
-    EXPECT_EQ("argument", ReadAll(&child));
-    EXPECT_EQ(SYS_CHILD_DONE, Sys_EndChild(&child));
+    ASSERT_EQ(1, Start(&child,
+                       [](const SysInput *input) {
+                           Sys_WriteParent(input->bytes, input->size);
+                           Sys_LeaveChild(input->stream ? 3 : 0);
+                       },
+                       {block.data(), block.size(), nullptr}));
+    std::string sent = block;
+    block.assign(14, '-'); // it is the parent's again
+    Outcome outcome = Finish(&child);
+    EXPECT_EQ(sent, outcome.written);
+    EXPECT_EQ(SYS_CHILD_DONE, outcome.end);
+}
+
+TEST(SysChild, ReadsItsStreamFromWhereItStands)
+{
+    FILE *stream = tmpfile();
+    fputs("first second", stream);
+    fseek(stream, 6, SEEK_SET);
+    SysChild child;
+    ASSERT_EQ(1, Start(&child,
+                       [](const SysInput *input) {
+                           char text[100];
+                           Sys_WriteParent(text, fread(text, 1, sizeof text, input->stream));
+                       },
+                       {nullptr, 0, stream}));
+    EXPECT_EQ("second", Finish(&child).written);
+    fclose(stream);
 }
 
 TEST(SysChild, SendsMoreThanAPipeHolds)
 {
-    Outcome outcome = RunChild([](void *) {
+    Outcome outcome = RunChild([](const SysInput *) {
         std::string much(1000000, 'x');
         Sys_WriteParent(much.data(), much.size());
     });
@@ -84,12 +116,12 @@ TEST(SysChild, SendsMoreThanAPipeHolds)
 
 TEST(SysChild, TellsOfAnotherStatus)
 {
-    EXPECT_EQ(SYS_CHILD_LEFT, RunChild([](void *) { Sys_LeaveChild(3); }).end);
+    EXPECT_EQ(SYS_CHILD_LEFT, RunChild([](const SysInput *) { Sys_LeaveChild(3); }).end);
 }
 
 TEST(SysChild, TellsOfACrashAndItsLastWords)
 {
-    Outcome outcome = RunChild([](void *) {
+    Outcome outcome = RunChild([](const SysInput *) {
         Sys_OnChildCrash(SayLastWords);
         raise(SIGSEGV);
     });
@@ -100,7 +132,7 @@ TEST(SysChild, TellsOfACrashAndItsLastWords)
 TEST(SysChild, IsStoppedAtItsTimeLimit)
 {
     Outcome outcome = RunChild(
-        [](void *) {
+        [](const SysInput *) {
             Sys_OnChildCrash(SayLastWords);
             while (Endless) {
             }
@@ -113,7 +145,7 @@ TEST(SysChild, IsStoppedAtItsTimeLimit)
 TEST(SysChild, TellsHowItEndedWhereEndedChildrenWereIgnored)
 {
     signal(SIGCHLD, SIG_IGN);
-    EXPECT_EQ(SYS_CHILD_LEFT, RunChild([](void *) { Sys_LeaveChild(3); }).end);
+    EXPECT_EQ(SYS_CHILD_LEFT, RunChild([](const SysInput *) { Sys_LeaveChild(3); }).end);
 }
 
 TEST(SysChild, SaysItsLastWordsWhereSignalsWereBlocked)
@@ -121,7 +153,7 @@ TEST(SysChild, SaysItsLastWordsWhereSignalsWereBlocked)
     sigset_t all;
     sigfillset(&all);
     sigprocmask(SIG_BLOCK, &all, nullptr);
-    Outcome outcome = RunChild([](void *) {
+    Outcome outcome = RunChild([](const SysInput *) {
         Sys_OnChildCrash(SayLastWords);
         raise(SIGSEGV);
     });
@@ -132,8 +164,7 @@ TEST(SysChild, SaysItsLastWordsWhereSignalsWereBlocked)
 TEST(SysChild, IsGivenUpWhenItIsSilent)
 {
     SysChild child;
-    ASSERT_EQ(1, Sys_StartChild(
-                     &child, [](void *) { pause(); }, nullptr, 10, nullptr));
+    ASSERT_EQ(1, Start(&child, [](const SysInput *) { pause(); }));
     char buffer[10];
     EXPECT_EQ(-1, Sys_ReadChild(&child, buffer, sizeof buffer, 1));
     EXPECT_EQ(SYS_CHILD_CRASHED, Sys_EndChild(&child));
@@ -142,14 +173,11 @@ TEST(SysChild, IsGivenUpWhenItIsSilent)
 TEST(SysChild, SeesThatNobodyReads)
 {
     SysChild child;
-    ASSERT_EQ(1, Sys_StartChild(
-                     &child,
-                     [](void *) {
-                         char block[100000] = {};
-                         while (Sys_WriteParent(block, sizeof block)) {
-                         }
-                     },
-                     nullptr, 10, nullptr));
+    ASSERT_EQ(1, Start(&child, [](const SysInput *) {
+                  char block[100000] = {};
+                  while (Sys_WriteParent(block, sizeof block)) {
+                  }
+              }));
     EXPECT_EQ(SYS_CHILD_CRASHED, Sys_EndChild(&child)); // killed: it was in mid-write
 }
 
@@ -161,10 +189,9 @@ TEST(SysChild, TellsWhyItDoesNotStart)
     setrlimit(RLIMIT_NOFILE, &none);
     SysChild child;
     SysReason why = {"", -1};
-    int started = Sys_StartChild(
-        &child, [](void *) {}, nullptr, 10, &why);
-    int startedUnasked = Sys_StartChild(
-        &child, [](void *) {}, nullptr, 10, nullptr);
+    int started = Start(
+        &child, [](const SysInput *) {}, {}, 10, &why);
+    int startedUnasked = Start(&child, [](const SysInput *) {});
     setrlimit(RLIMIT_NOFILE, &limit);
     EXPECT_EQ(0, started);
     EXPECT_EQ(0, startedUnasked);
@@ -177,7 +204,7 @@ TEST(SysChild, SendsWhereTheProgramHasNoStandardStreams)
 {
     for (int stream : {2, 1, 0}) {
         close(stream);
-        Outcome outcome = RunChild([](void *) { Sys_WriteParent("hello", 5); });
+        Outcome outcome = RunChild([](const SysInput *) { Sys_WriteParent("hello", 5); });
         EXPECT_EQ("hello", outcome.written);
         EXPECT_EQ(SYS_CHILD_DONE, outcome.end);
     }
@@ -185,7 +212,7 @@ TEST(SysChild, SendsWhereTheProgramHasNoStandardStreams)
 
 TEST(SysChild, IsTheFirstToGoWhenMemoryRunsOut)
 {
-    Outcome outcome = RunChild([](void *) {
+    Outcome outcome = RunChild([](const SysInput *) {
         char score[10] = "";
         FILE *stream = fopen("/proc/self/oom_score_adj", "r");
         if (stream && fgets(score, sizeof score, stream))
@@ -198,7 +225,7 @@ TEST(SysChild, DoesNotRepeatUnwrittenLinesOfTheParent)
 {
     FILE *file = tmpfile();
     fputs("once", file);
-    RunChild([](void *) {});
+    RunChild([](const SysInput *) {});
     fflush(file);
     EXPECT_EQ(4, ftell(file));
     fclose(file);
