@@ -34,7 +34,7 @@ enum {
 
 struct BibField {
     int32_t name;      // index into BibFieldTable
-    int32_t companion; // travels with the field; the store only copies it
+    int32_t companion; // travels with the field; the store only copies it. Not of base/Companion.h
     char *value;       // heap, never null
 };
 

@@ -161,6 +161,17 @@ TEST(CommandTable, HasTheToolsInTheirOrder)
               tools);
 }
 
+TEST(CommandTable, HasAPictureForEachTool)
+{
+    std::string resources = DEFAULT_INI;
+    resources.erase(resources.rfind('/'));
+    for (const Command *command = Commands; command < Commands + CommandCount; ++command)
+        if (command->tool.icon) {
+            std::string picture = resources + "/icons/" + command->tool.icon + ".svg";
+            EXPECT_TRUE(Sys_FileExists(picture.c_str())) << picture;
+        }
+}
+
 // --- Help ---
 
 static const char Types[] = "[article]\n* = a paper.\n";
