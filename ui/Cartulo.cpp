@@ -126,6 +126,7 @@ Cartulo::~Cartulo()
     if (config && m_sashPosition > 0)
         config->Write(SashKey, m_sashPosition);
     m_list->Drop_Index();
+    Grid_Clear(&m_grid); // the panes live on for a moment
     FileSet_Free(&m_set);
     TNSMessage("INFO: Cartulo::~Cartulo ", "End", TNS_LIFECYCLE);
 }
