@@ -41,9 +41,10 @@ class RawClient
 {
 public:
     explicit RawClient(const std::string &path, const std::string &bytes = "")
-        : m_socket(Sys_ConnectLocal(path.c_str(), 1000))
     {
-        EXPECT_NE(0, m_socket) << path << ": " << Sys_LastErrorText();
+        SysReason why = {};
+        m_socket = Sys_ConnectLocal(path.c_str(), 1000, &why);
+        EXPECT_NE(0, m_socket) << path << ": " << why.text;
         Say(bytes);
     }
     ~RawClient() { Leave(); }

@@ -241,8 +241,9 @@ TEST_F(Window, SaysThatAFileIsLockedElsewhere)
 {
     std::string path = folder.Write("taken.bib", OneEntry);
     OtherProgram other(path);
-    ASSERT_EQ(0, Sys_LockFile(path.c_str()));
-    wxString text = "File: `" + path + "'\n" + Sys_LastErrorText();
+    SysReason why = {};
+    ASSERT_EQ(0, Sys_LockFile(path.c_str(), &why));
+    wxString text = "File: `" + path + "'\n" + why.text;
     wxString messages;
     wxTEST_DIALOG((Open(path), HandleQueuedEvents()), ExpectBox("Openning BIB file", text, wxID_OK),
                   ExpectMessages("There are errors in loading BIB files", &messages));
@@ -489,9 +490,9 @@ TEST_F(Window, ForgetsNoChangeWhenAFileCannotBeSaved)
     Change(0, "Changed");
     std::filesystem::remove_all(folder.Path("gone"));
     // Neither the file nor its lock can be had again.
-    EXPECT_EQ(0, Sys_LockFile(path.c_str()));
-    wxString reason = Sys_LastErrorText();
-    ExpectBox lock("ReLocking BIB file", "File: `" + path + "'\n" + reason, wxID_OK);
+    SysReason why = {};
+    EXPECT_EQ(0, Sys_LockFile(path.c_str(), &why));
+    ExpectBox lock("ReLocking BIB file", "File: `" + path + "'\n" + why.text, wxID_OK);
     int result = 2;
     wxTEST_DIALOG(result = Panel()->SaveAll(true), lock);
     EXPECT_EQ(0, result);
@@ -499,7 +500,7 @@ TEST_F(Window, ForgetsNoChangeWhenAFileCannotBeSaved)
     EXPECT_EQ("ERROR: Can't save all modified BIB files.", Status());
 
     wxString caption = "Save Bibliography File - Question";
-    wxString question = "These Bib-files can't be saved:\n\nFile: `" + path + "'\n" + reason +
+    wxString question = "These Bib-files can't be saved:\n\nFile: `" + path + "'\n" + why.text +
                         "\n\nDo you want to close and to lose the changes ?";
     wxTEST_DIALOG(frame->Close(), ExpectBox(caption, question, wxID_NO));
     ASSERT_TRUE(frame && frame->IsShown());
