@@ -49,6 +49,7 @@ static bool ValueOf(const std::string &item, std::string *value)
 const std::string *MyConnection::OnRequest(const std::string &item)
 {
     if (!ValueOf(item, &m_reply)) {
+        // Misspelt, stands so.
         TNSMessage("ERROR: DDE server Unknown requestOnExecute ", item.c_str(), TNS_LIFECYCLE);
         return nullptr;
     }

@@ -207,6 +207,7 @@ void MyApp::OnActivateApp(wxActivateEvent &event)
 {
     bool autoSave = !m_frame || m_frame->AutoSave();
     TNSMessage(autoSave ? "INFO: Cartulo is now+ " : "INFO: Cartulo is now- ",
+               // Misspelt, stands so.
                event.GetActive() ? "Activated" : "Disactivated", TNS_LIFECYCLE);
     if (m_frame)
         m_frame->OnActivation(event.GetActive());

@@ -201,7 +201,7 @@ int FileSet_Open(BibFileSet *set, const char *path)
     if (lock != 0)
         return Load(set, path, lock, 0);
     std::string text = LockFailureText(path, why);
-    ReportLockFailure(set, "Openning BIB file", text);
+    ReportLockFailure(set, "Openning BIB file", text); // misspelt, stands so
     FileSet_AppendError(set, "ERROR: %s\n", text.c_str());
     return 1;
 }
@@ -222,7 +222,7 @@ static int SaveRecord(BibFileSet *set, BibFile *file, int isLast)
     SysReason why = {};
     file->lockHandle = Sys_LockFile(file->path, &why);
     if (file->lockHandle == 0)
-        ReportLockFailure(set, "ReLocking BIB file", LockFailureText(file->path, why));
+        ReportLockFailure(set, "ReLocking BIB file", LockFailureText(file->path, why)); // stands so
     return saved;
 }
 

@@ -29,7 +29,7 @@ const char *Messages_Heading(MessagesVerdict verdict)
     case MESSAGES_WARNINGS:
         return "There are warnings in loading BIB files";
     default:
-        return "There is no any messages related with loading BIB-files";
+        return "There is no any messages related with loading BIB-files"; // stands so
     }
 }
 

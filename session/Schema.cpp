@@ -203,8 +203,8 @@ static std::string Note(const std::vector<std::string> &missing)
     if (missing.empty())
         return "";
     if (missing.size() == 1)
-        return "There is missed mandatory field: " + missing[0] + ".";
-    std::string note = "There are missed mandatory fields: " + missing[0];
+        return "There is missed mandatory field: " + missing[0] + ".";     // stands so
+    std::string note = "There are missed mandatory fields: " + missing[0]; // stands so
     if (missing.size() == 2)
         return note + " and " + missing[1] + ".";
     for (size_t i = 1; i + 1 < missing.size(); ++i)

@@ -16,9 +16,9 @@ const char *Bib_CheckValue(const char *value)
     for (; *value; ++value) {
         if (*value == BIB_OPEN_ABBREVIATION) {
             if (abbreviations > 0)
-                return "Recursive Abbreviation is imposible";
+                return "Recursive Abbreviation is imposible"; // misspelt, stands so
             if (braces > 0)
-                return "Abbreviation can't be appeared inside braces";
+                return "Abbreviation can't be appeared inside braces"; // stands so
             abbreviations = 1;
         } else if (*value == BIB_CLOSE_ABBREVIATION) {
             if (abbreviations == 0)

@@ -41,6 +41,7 @@ static void Append(BibFile *file, const char *prefix, const char *message)
         return;
     size_t used = strlen(file->messages);
     if (used + strlen(prefix) + strlen(message) >= BIB_MESSAGES_SIZE - 4) {
+        // Misspelt, stands so.
         AppLog("WARNIG: ", "Too many errors/warnings, forget last messages.");
         return;
     }

@@ -87,7 +87,7 @@ static wxWindow *AddButton(wxWindow *parent)
 // As soon as what goes on now is done.
 static void ForceMessages(wxWindow *panel)
 {
-    TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE);
+    TNSMessage("INFO: Forcing displayign messages box. ", "", TNS_LIFECYCLE); // misspelt, stands so
     panel->GetEventHandler()->QueueEvent(new wxCommandEvent(wxEVT_MENU, ID_MESSAGES));
 }
 
@@ -102,7 +102,7 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
     m_set.changed = [](void *owner) { static_cast<Cartulo *>(owner)->UpdateSaveTool(); };
     m_set.owner = this;
     ReadSchema();
-    AppLog("IFNO: Cartulo::Cartulo ", "Parse_Command_Line");
+    AppLog("IFNO: Cartulo::Cartulo ", "Parse_Command_Line"); // misspelt, stands so
     ProcessCommand(commandLine, "OnInit");
     AppLog("More ...");
     m_sashPosition = int(wxConfigBase::Get()->ReadLong(SashKey, 0));
@@ -168,7 +168,8 @@ wxWindow *Cartulo::BlankPane(int pane)
         m_openPane = CreateBlankPane(
             this, "To open TeX Bibliography file (BIB) click the button:", OpenButton);
     if (pane == PANE_NEW && !m_newPane)
-        m_newPane = CreateBlankPane(this, "To add new enrty click the button:", AddButton);
+        m_newPane = // misspelt, stands so
+            CreateBlankPane(this, "To add new enrty click the button:", AddButton);
     return pane == PANE_OPEN ? m_openPane : m_newPane;
 }
 
@@ -471,7 +472,7 @@ void Cartulo::OnSearch(wxCommandEvent &event)
 {
     wxSearchCtrl *field = dynamic_cast<wxSearchCtrl *>(event.GetEventObject());
     if (!field) {
-        TNSMessage("ERROR: Cartulo::OnSearch ", "Uknown source", TNS_ERROR);
+        TNSMessage("ERROR: Cartulo::OnSearch ", "Uknown source", TNS_ERROR); // misspelt, stands so
         return;
     }
     m_searchText = field->GetValue().ToStdWstring();
@@ -543,7 +544,7 @@ void Cartulo::OnPaint(wxPaintEvent &event)
 void Cartulo::OnSashMove(wxSplitterEvent &event)
 {
     wxSize left = GetWindow1()->GetSize(), right = GetWindow2()->GetSize();
-    TNSMessage("INFO: Cartulo::OnSashMOve ",
+    TNSMessage("INFO: Cartulo::OnSashMOve ", // misspelt, stands so
                wxString::Format("sash pos=%d, w1=%dx%d, w2=%dx%d", event.GetSashPosition(), left.x,
                                 left.y, right.x, right.y)
                    .utf8_str(),

@@ -119,7 +119,7 @@ void Cartulo::OnEditEntry(wxCommandEvent &)
     if (m_set.files[item->file]->readOnly) {
         ShowStatusError(this, "ERROR: You can't edit records in readonly BIB-file");
         TNSMessage("WARNING: Cartulo::OnEditEntry ",
-                   "locked editing file opened in of readonly mode.", TNS_WARNING);
+                   "locked editing file opened in of readonly mode.", TNS_WARNING); // stands so
         return;
     }
     SetEditMode(!m_editMode);
@@ -229,6 +229,7 @@ bool Cartulo::CheckRows()
         Box_Warn(this, CommitTitle,
                  "Wrong syntax of value in the field: `" + m_entryPane->KeyText(i) + "':\n\n" +
                      reason +
+                     // "In this reason" stands so.
                      "\n\nIn this reason modification of entire entry can't be "
                      "accepted.\nFix an error and try again.");
     }
@@ -249,7 +250,7 @@ bool Cartulo::ReplaceEntry(int type)
     }
     BibEntry *entry = Grid_Build(&m_grid, type);
     if (!entry) {
-        AppLog("ERROR: Not enought memory for allocating new entry");
+        AppLog("ERROR: Not enought memory for allocating new entry"); // misspelt, stands so
         Box_Warn(this, CommitTitle, "There is not enough memory for the changed entry.");
         return false;
     }

@@ -124,6 +124,7 @@ Cartulo_NewEntry::Cartulo_NewEntry(wxWindow *parent, const EntryPlace &current,
                    "Adding New Entry", "Please enter key of the new bibliography entry.",
                    "Specified Key is already present in the BIB file.",
                    "Specified Key is already present in another BIB files.\n"
+                   // Misspelt, stands so.
                    "Are you shure that you want to add duplication in your BIB-File ?"}),
       m_ini(ini)
 {
@@ -149,7 +150,7 @@ void Cartulo_NewEntry::SelectFile()
         return;
     }
     m_file->SetSelection(current);
-    TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR);
+    TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR); // stands so
 }
 
 // -1 for none. The entry that a new one refers to has to be in the same file.
@@ -206,6 +207,7 @@ Cartulo_RenameEntry::Cartulo_RenameEntry(wxWindow *parent, const EntryPlace &cur
                    "Renaming Entry", "Please enter new key for the bibliography entry.",
                    "Specified New Key is already present in the BIB file.",
                    "Specified New Key is already present in another BIB files.\n"
+                   // Misspelt, stands so.
                    "Are you shure that you want to add duplication in your BIB-File ?"})
 {
     m_file->SetSelection(CurrentChoice());

@@ -15,7 +15,7 @@
 
 const char FieldKey_BadCharsText[] = "Specified field key includes wrong characters.\n"
                                      "We will remove them from key and continue.";
-const char FieldKey_TakenText[] = "Field with specified key is already exists.";
+const char FieldKey_TakenText[] = "Field with specified key is already exists."; // stands so
 
 // --- The value ---
 

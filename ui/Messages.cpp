@@ -41,6 +41,7 @@ Cartulo_Messages::Cartulo_Messages(wxWindow *parent, const BibFileSet *set)
     SetFont(wxFontInfo(10));
     m_heading = new wxStaticText(this, wxID_ANY, "");
     wxString text = TextOf(set);
+    // "There is no messages" stands so.
     m_text = new wxTextCtrl(this, ID_MESSAGES_TEXT, "There is no messages ...", wxDefaultPosition,
                             wxDefaultSize, wxTE_MULTILINE | wxTE_READONLY | Text_WrapStyle(text));
     m_text->SetFont(wxFontInfo(10).Family(wxFONTFAMILY_TELETYPE));

@@ -35,7 +35,7 @@ Cartulo_Preamble::Cartulo_Preamble(wxWindow *parent, const BibFileSet *files)
 {
     SetFont(wxFontInfo(10));
     m_file = new wxChoice(this, ID_PREAMBLE_FILE);
-    m_text = new wxTextCtrl(this, ID_PREAMBLE_TEXT, "There is no editable BIB-files",
+    m_text = new wxTextCtrl(this, ID_PREAMBLE_TEXT, "There is no editable BIB-files", // stands so
                             wxDefaultPosition, wxDefaultSize, wxTE_MULTILINE | wxTE_DONTWRAP);
     m_text->SetFont(wxFontInfo(10).Family(wxFONTFAMILY_TELETYPE));
     m_text->SetMinSize(FromDIP(wxSize(600, 200)));
@@ -52,7 +52,7 @@ Cartulo_Preamble::Cartulo_Preamble(wxWindow *parent, const BibFileSet *files)
 void Cartulo_Preamble::FillFiles()
 {
     if (m_files->count == 0) {
-        TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR);
+        TNSMessage("ERROR: ", "There is no editable BIB files", TNS_ERROR); // stands so
         ShowEditable(false);
         return;
     }
@@ -149,7 +149,7 @@ bool Cartulo_Preamble::LeaveFile()
     if (!IsChanged(file, edit))
         return true;
     int answer = wxMessageBox("There are changes in current preamble text.\n\n Do you want to "
-                              "accept they ?",
+                              "accept they ?", // stands so
                               QuestionCaption, wxYES_NO | wxICON_QUESTION, this);
     if (answer != wxYES)
         return answer == wxNO;
@@ -201,6 +201,7 @@ bool Cartulo_Preamble::Refuse(const std::vector<PreambleFault> &faults)
     for (const PreambleFault &fault : faults)
         Box_Warn(this, "Editing Preamble - Syntax Error",
                  BoundedText(StoreText(fault.piece.c_str(), Encoding())) + "\n:" + fault.reason +
+                     // Misspelt, stands so.
                      "\n\nWrong preamble can;t be accepted.\nFix it and then try again.");
     if (!CopyText(m_text->GetValue())) {
         Box_Warn(this, GetTitle(),

@@ -375,7 +375,7 @@ bool Cartulo_Strings_Edit::AcceptKey(const TypedName &key, NameVerdict verdict)
         return false;
     case NAME_BAD_CHARS:
         Box_OfferStripped(this, Caption,
-                          "String  key includes invalid characters.\n"
+                          "String  key includes invalid characters.\n" // two blanks, stands so
                           "We will remove them and continue.",
                           key, m_key);
         return false;
