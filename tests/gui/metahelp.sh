@@ -2,6 +2,7 @@
 # Starts the help program on a display as the editor does: metahelp.sh METAHELP VERSION. Fails unless
 # its window shows the manual and closes with the keyboard, and unless it says so when there is none.
 set -eu
+. "${0%/*}/wait.sh"
 program=$1
 version=$2
 folder=$(mktemp -d)
@@ -13,38 +14,14 @@ fail() {
     exit 1
 }
 
-# Runs a command until it succeeds, for about 20 seconds at the most.
-until_done() {
-    tries=0
-    until "$@"; do
-        tries=$((tries + 1))
-        [ "$tries" -lt 200 ] || return 1
-        sleep 0.1
-    done
-}
-
-has_window() {
-    window=$(xdotool search --all --onlyvisible --pid "$help" --name "$1" 2>/dev/null)
-}
-
-# Right after the start the window manager may not heed the first requests.
-closes_with() {
-    ! kill -0 "$help" 2>/dev/null && return 0
-    xdotool windowactivate "$window" 2>/dev/null || true
-    sleep 0.1
-    [ "$(xdotool getactivewindow 2>/dev/null)" != "$window" ] || xdotool key "$1"
-    sleep 0.1
-    ! kill -0 "$help" 2>/dev/null
-}
-
 # shows_manual KEY [TOPIC]
 shows_manual() {
     key=$1
     shift
     "$program" "$@" 2>"$folder/errors" &
     help=$!
-    until_done has_window '^Cartulo: the manual$' || fail "no window: $(cat "$folder/errors")"
-    until_done closes_with "$key" || fail "the window does not close with $key"
+    until_done has_window "$help" '^Cartulo: the manual$' || fail "no window: $(cat "$folder/errors")"
+    ends_with "$help" "$key" || fail "the window does not close with $key"
     wait "$help" || fail "the help program ended with status $?"
     help=
 }
@@ -59,12 +36,12 @@ esac
 # A second start brings the first one's window forward, and ends.
 "$program" .QRL.Cartulo &
 help=$!
-until_done has_window '^Cartulo: the manual$' || fail "no window"
+until_done has_window "$help" '^Cartulo: the manual$' || fail "no window"
 first=$window
-timeout 20 "$program" .QRL.Cartulo || fail "the second start ended with status $?"
+timeout 60 "$program" .QRL.Cartulo || fail "the second start ended with status $?"
 [ "$(xdotool search --all --onlyvisible --name '^Cartulo: the manual$')" = "$first" ] ||
     fail "there is a second window"
-until_done closes_with Escape || fail "the window does not close"
+ends_with "$help" Escape || fail "the window does not close"
 wait "$help" || fail "the help program ended with status $?"
 help=
 
@@ -80,8 +57,8 @@ env -u DISPLAY "$folder/metahelp" .QRL.Cartulo 2>"$folder/errors" || status=$?
 grep -q 'manual.html' "$folder/errors" || fail "nothing is said about the manual"
 "$folder/metahelp" .QRL.Cartulo 2>"$folder/errors" &
 help=$!
-until_done has_window '^Cartulo$' || fail "no box about the missing manual"
-until_done closes_with Escape || fail "the box does not close"
+until_done has_window "$help" '^Cartulo$' || fail "no box about the missing manual"
+ends_with "$help" Escape || fail "the box does not close"
 status=0
 wait "$help" || status=$?
 help=

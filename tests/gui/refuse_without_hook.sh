@@ -3,6 +3,7 @@
 # refuse_without_hook.sh PROGRAM. Fails unless it says so, in a box and on standard error, opens no
 # window, and ends with a failure status.
 set -eu
+. "${0%/*}/wait.sh"
 program=$1
 folder=$(mktemp -d)
 editor=
@@ -12,22 +13,12 @@ printf '@misc{one, note = {Note}}\n' >"$folder/refs.bib"
 XDG_CONFIG_HOME=$folder CARTULO_LOG=1:$folder/log "$program" "$folder/refs.bib" 2>"$folder/errors" &
 editor=$!
 
-tries=0
-while kill -0 "$editor" 2>/dev/null; do
-    tries=$((tries + 1))
-    [ "$tries" -lt 200 ] || { echo "the box does not close" >&2; exit 1; }
-    box=$(xdotool search --all --onlyvisible --pid "$editor" --name '^Cartulo$' || true)
-    if [ -n "$box" ]; then
-        touch "$folder/box"
-        [ "$(xdotool getactivewindow 2>/dev/null)" != "$box" ] || xdotool key Return
-    fi
-    sleep 0.1
-done
+until_done has_window "$editor" '^Cartulo$' || { echo "there was no box" >&2; exit 1; }
+ends_with "$editor" Return || { echo "the box does not close" >&2; exit 1; }
 status=0
 wait "$editor" || status=$?
 editor=
 
 [ "$status" -ne 0 ] || { echo "the program ended as if all were well" >&2; exit 1; }
-[ -e "$folder/box" ] || { echo "there was no box" >&2; exit 1; }
 grep -q "messages of the BibTeX parser do not reach this program" "$folder/errors"
 ! grep -q "Loading:" "$folder/log"

@@ -3,6 +3,7 @@
 # start_and_close.sh PROGRAM. Fails unless the file is loaded, the configuration folder made, and
 # the program ends well.
 set -eu
+. "${0%/*}/wait.sh"
 program=$1
 folder=$(mktemp -d)
 editor=
@@ -13,21 +14,8 @@ cd "$folder"
 XDG_CONFIG_HOME=$folder/config/new CARTULO_LOG=1:$folder/log "$program" "Müller's refs" &
 editor=$!
 
-tries=0
-until window=$(xdotool search --all --onlyvisible --pid "$editor" --name '^Quarlo Cartulo$'); do
-    tries=$((tries + 1))
-    [ "$tries" -lt 200 ] && kill -0 "$editor" || { echo "no window" >&2; exit 1; }
-    sleep 0.1
-done
-# Right after the start the window manager may not heed the first requests.
-while kill -0 "$editor" 2>/dev/null; do
-    tries=$((tries + 1))
-    [ "$tries" -lt 200 ] || { echo "the window does not close" >&2; exit 1; }
-    xdotool windowactivate "$window" 2>/dev/null || true
-    sleep 0.1
-    [ "$(xdotool getactivewindow 2>/dev/null)" != "$window" ] || xdotool key alt+F4
-    sleep 0.1
-done
+until_done has_window "$editor" '^Quarlo Cartulo$' || { echo "no window" >&2; exit 1; }
+ends_with "$editor" alt+F4 || { echo "the window does not close" >&2; exit 1; }
 wait "$editor" || { echo "the editor ended with status $?" >&2; exit 1; }
 editor=
 
