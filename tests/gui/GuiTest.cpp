@@ -5,7 +5,10 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <deque>
+#include <mutex>
 
+#include <glib.h>
 #include <wx/app.h>
 #include <wx/choice.h>
 #include <wx/fileconf.h>
@@ -124,6 +127,72 @@ int WhileBoxIsOpen::Enter(wxDialog *dialog)
     return m_answer;
 }
 
+// --- What is said on the side ---
+
+enum { REMARKS_MAX = 30 };
+
+// The last warnings of the program and of the toolkit. They help to understand a failure, and would
+// hide those of other tests.
+static std::deque<std::string> remarks;
+static size_t remarkCount = 0;
+static std::mutex remarksMutex; // the toolkit has threads of its own
+
+static void Remark(const std::string &text)
+{
+    std::lock_guard<std::mutex> lock(remarksMutex);
+    if (!testing::UnitTest::GetInstance()->current_test_info()) {
+        fprintf(stderr, "%s\n", text.c_str());
+        return;
+    }
+    ++remarkCount;
+    remarks.push_back(text);
+    if (remarks.size() > REMARKS_MAX)
+        remarks.pop_front();
+}
+
+// In the place of GLib's own, which prints.
+static GLogWriterOutput RemarkOfToolkit(GLogLevelFlags level, const GLogField *fields, gsize count,
+                                        gpointer data)
+{
+    if (level & (G_LOG_FLAG_FATAL | G_LOG_LEVEL_ERROR))
+        return g_log_writer_default(level, fields, count, data); // the program ends now
+    if (level & (G_LOG_LEVEL_CRITICAL | G_LOG_LEVEL_WARNING)) {
+        gchar *text = g_log_writer_format_fields(level, fields, count, FALSE);
+        Remark(text + strspn(text, "\n"));
+        g_free(text);
+    }
+    return G_LOG_WRITER_HANDLED;
+}
+
+// Prints the remarks of a test that has failed.
+class PrintRemarks : public testing::EmptyTestEventListener
+{
+    void OnTestStart(const testing::TestInfo &) override
+    {
+        std::lock_guard<std::mutex> lock(remarksMutex);
+        remarks.clear();
+        remarkCount = 0;
+    }
+
+    void OnTestEnd(const testing::TestInfo &test) override
+    {
+        std::lock_guard<std::mutex> lock(remarksMutex);
+        if (!test.result()->Failed() || remarks.empty())
+            return;
+        printf("During this test the program and the toolkit said, last %zu of %zu:\n",
+               remarks.size(), remarkCount);
+        for (const std::string &text : remarks)
+            printf("    %s\n", text.c_str());
+        fflush(stdout);
+    }
+};
+
+static void KeepRemarks()
+{
+    g_log_set_writer_func(RemarkOfToolkit, nullptr, nullptr);
+    testing::UnitTest::GetInstance()->listeners().Append(new PrintRemarks);
+}
+
 // --- The log ---
 
 static std::vector<LogLine> logged;
@@ -133,7 +202,7 @@ void TNSMessage(const char *prefix, const char *text, int level)
 {
     logged.push_back({std::string(prefix) + text, level});
     if (level >= TNS_WARNING)
-        fprintf(stderr, "%s%s\n", prefix, text);
+        Remark(logged.back().text);
 }
 
 void PrintTo(const LogLine &line, std::ostream *out)
@@ -391,6 +460,7 @@ int main(int argc, char **argv)
     testing::InitGoogleTest(&argc, argv);
     if (testing::GTEST_FLAG(list_tests))
         return RUN_ALL_TESTS();
+    KeepRemarks();
     Log_SetUpToolkit();
     return wxEntry(argc, argv);
 }
