@@ -123,7 +123,7 @@ protected:
     void Focus(wxWindow *window)
     {
         window->SetFocus();
-        ASSERT_TRUE(WaitFor([&] { return window->HasFocus(); }));
+        ASSERT_TRUE(WaitForKeys(window));
     }
 
     static ExpectBox Question(const char *type, int added, int modified, int removed, int button)

@@ -17,6 +17,7 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 #include <wx/toolbar.h>
+#include <wx/uiaction.h>
 
 #include "app/LogGui.h"
 #include "base/Companion.h"
@@ -241,6 +242,40 @@ bool WaitFor(const std::function<bool()> &condition, int milliseconds)
     return true;
 }
 
+static bool HasKeys(wxWindow *window)
+{
+    wxWindow *top = wxGetTopLevelParent(window);
+    return dynamic_cast<wxTopLevelWindow *>(top)->IsActive() &&
+           (window == top || window->HasFocus());
+}
+
+bool WaitForKeys(wxWindow *window)
+{
+    return WaitFor([window] { return HasKeys(window); });
+}
+
+void SendKey(wxWindow *window, int key, int modifiers)
+{
+    ASSERT_TRUE(WaitForKeys(window)) << "no focus for the key " << key;
+    wxUIActionSimulator().Char(key, modifiers);
+}
+
+void SendText(wxWindow *window, const char *text)
+{
+    ASSERT_TRUE(WaitForKeys(window)) << "no focus for the text " << text;
+    wxUIActionSimulator().Text(text);
+}
+
+void Click(wxWindow *control)
+{
+    ASSERT_TRUE(WaitForKeys(wxGetTopLevelParent(control)));
+    wxSize size = control->GetSize();
+    wxUIActionSimulator mouse;
+    mouse.MouseMove(control->ClientToScreen(wxPoint(size.x / 2, size.y / 2)));
+    ASSERT_TRUE(WaitFor([&] { return wxFindWindowAtPoint(wxGetMousePosition()) == control; }));
+    mouse.MouseClick();
+}
+
 void HandleQueuedEvents()
 {
     wxTheApp->ProcessPendingEvents();
@@ -265,7 +300,7 @@ void CartuloWindow::Open(const std::string &commandLine)
     ForgetLog();
     frame = new MyFrame("Quarlo Cartulo", commandLine.c_str(), &state);
     frame->Show();
-    ASSERT_TRUE(WaitFor([this] { return frame->IsShownOnScreen() && frame->IsActive(); }));
+    ASSERT_TRUE(WaitForKeys(frame));
 }
 
 void CartuloWindow::Close()

@@ -125,8 +125,23 @@ public:
     ~AllowDialogs();
 };
 
-// Lets the program run until the condition holds; false when it does not within the deadline.
-bool WaitFor(const std::function<bool()> &condition, int milliseconds = 5000);
+// Lets the program run until the condition holds; false when it does not within the deadline, which
+// leaves a busy machine all the time that it may need.
+bool WaitFor(const std::function<bool()> &condition, int milliseconds = 30000);
+
+// --- Real keys and clicks, as the user's ---
+//
+// The system hands them to whichever window has the keyboard at that moment, and a window that has
+// just opened, or has just come back from under a dialog, has it a little later. So everything here
+// names its window and waits first.
+
+// Waits until keys reach this window: a frame or dialog that is active, or a control that has the
+// focus in an active one.
+bool WaitForKeys(wxWindow *window);
+
+void SendKey(wxWindow *window, int key, int modifiers = 0);
+void SendText(wxWindow *window, const char *text);
+void Click(wxWindow *control); // in its middle
 
 // One message of the program, as it would be written.
 struct LogLine {

@@ -9,7 +9,6 @@
 #include <wx/settings.h>
 #include <wx/statbmp.h>
 #include <wx/stattext.h>
-#include <wx/uiaction.h>
 
 #include "tests/gui/GuiTest.h"
 #include "tests/support/DataFolder.h"
@@ -164,9 +163,7 @@ protected:
         AllowDialogs allow;
         AboutDlg about(nullptr);
         wxTheApp->CallAfter([&] {
-            EXPECT_TRUE(WaitFor([&] {
-                return about.IsActive() && wxWindow::FindFocus() == about.FindWindow(wxID_CANCEL);
-            }));
+            EXPECT_TRUE(WaitForKeys(about.FindWindow(wxID_CANCEL)));
             action(&about);
             if (!WaitFor([&] { return !about.IsModal(); }))
                 about.EndModal(wxID_NONE);
@@ -177,24 +174,17 @@ protected:
 
 TEST_F(OpenAbout, IsClosedByEsc)
 {
-    EXPECT_EQ(wxID_CANCEL, Show([](AboutDlg *) { wxUIActionSimulator().Char(WXK_ESCAPE); }));
+    EXPECT_EQ(wxID_CANCEL, Show([](AboutDlg *about) { SendKey(about, WXK_ESCAPE); }));
 }
 
 TEST_F(OpenAbout, IsClosedByEnter)
 {
-    EXPECT_EQ(wxID_CANCEL, Show([](AboutDlg *) { wxUIActionSimulator().Char(WXK_RETURN); }));
+    EXPECT_EQ(wxID_CANCEL, Show([](AboutDlg *about) { SendKey(about, WXK_RETURN); }));
 }
 
 TEST_F(OpenAbout, IsClosedByItsButton)
 {
-    EXPECT_EQ(wxID_CANCEL, Show([](AboutDlg *about) {
-                  wxWindow *button = about->FindWindow(wxID_CANCEL);
-                  wxSize size = button->GetSize();
-                  wxUIActionSimulator mouse;
-                  mouse.MouseMove(button->ClientToScreen(wxPoint(size.x / 2, size.y / 2)));
-                  WaitFor([&] { return wxFindWindowAtPoint(wxGetMousePosition()) == button; });
-                  mouse.MouseClick();
-              }));
+    EXPECT_EQ(wxID_CANCEL, Show([](AboutDlg *about) { Click(about->FindWindow(wxID_CANCEL)); }));
 }
 
 TEST_F(OpenAbout, IsClosedByTheWindowManager)

@@ -9,7 +9,6 @@
 #include <wx/srchctrl.h>
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
-#include <wx/uiaction.h>
 
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
@@ -123,8 +122,6 @@ protected:
     {
         ShowDialog<Dialog>([&] { Run(command); }, steps);
     }
-
-    wxUIActionSimulator keys;
 };
 
 using NewEntry = EntryCommands;
@@ -698,15 +695,13 @@ TEST_F(RemoveEntry, TakesBothRowsOfAFileThatIsListedTwice)
 TEST_F(NewEntry, IsMadeByKeyboardAlone)
 {
     Open(folder.Write("a.bib", Talks));
-    Show<Cartulo_NewEntry>(ID_NEW_ENTRY, [this](Cartulo_NewEntry &dialog) {
-        EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->HasFocus(); }));
-        keys.Text("new1");
+    Show<Cartulo_NewEntry>(ID_NEW_ENTRY, [](Cartulo_NewEntry &dialog) {
+        SendText(KeyOf(dialog), "new1");
         EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "new1"; }));
-        keys.Char(WXK_RETURN);
+        SendKey(KeyOf(dialog), WXK_RETURN);
     });
     EXPECT_EQ("new1 (a)", Selected());
-    ASSERT_TRUE(WaitFor([this] { return frame->IsActive() && List()->HasFocus(); }));
-    keys.Text("gr");
+    SendText(List(), "gr");
     EXPECT_TRUE(WaitFor([this] { return Selected() == "Griske84 (a)"; }));
 }
 
@@ -714,13 +709,14 @@ TEST_F(NewEntry, IsGivenUpWithEscape)
 {
     Open(folder.Write("a.bib", Talks));
     Search()->SetFocus();
-    ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
-    Show<Cartulo_NewEntry>(ID_NEW_ENTRY, [this](Cartulo_NewEntry &) { keys.Char(WXK_ESCAPE); });
+    ASSERT_TRUE(WaitForKeys(Search()));
+    Show<Cartulo_NewEntry>(ID_NEW_ENTRY,
+                           [](Cartulo_NewEntry &dialog) { SendKey(KeyOf(dialog), WXK_ESCAPE); });
     EXPECT_EQ(wxID_CANCEL, Panel()->DialogResult());
     EXPECT_EQ(0, Modified(0));
-    ASSERT_TRUE(WaitFor([this] { return frame->IsActive() && Search()->HasFocus(); }));
+    ASSERT_TRUE(WaitForKeys(Search()));
     ForgetLog();
-    keys.Char('M', wxMOD_ALT);
+    SendKey(Search(), 'M', wxMOD_ALT);
     auto isShown = [] { return !TakeLog("INFO: Cartulo::OnShowMessages").empty(); };
     wxTEST_DIALOG(EXPECT_TRUE(WaitFor(isShown)),
                   ExpectMessages("There is no any messages related with loading BIB-files"));
@@ -729,13 +725,12 @@ TEST_F(NewEntry, IsGivenUpWithEscape)
 TEST_F(RenameEntry, IsDoneByKeyboardAlone)
 {
     Open(folder.Write("a.bib", Talks));
-    Show<Cartulo_RenameEntry>(ID_RENAME_ENTRY, [this](Cartulo_RenameEntry &dialog) {
-        EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->HasFocus(); }));
-        keys.Char('A', wxMOD_CONTROL);
-        keys.Text("new1");
+    Show<Cartulo_RenameEntry>(ID_RENAME_ENTRY, [](Cartulo_RenameEntry &dialog) {
+        SendKey(KeyOf(dialog), 'A', wxMOD_CONTROL);
+        SendText(KeyOf(dialog), "new1");
         EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "new1"; }));
-        keys.Char(WXK_RETURN);
+        SendKey(KeyOf(dialog), WXK_RETURN);
     });
     EXPECT_EQ("new1 (a)", Selected());
-    EXPECT_TRUE(WaitFor([this] { return frame->IsActive() && List()->HasFocus(); }));
+    EXPECT_TRUE(WaitForKeys(List()));
 }

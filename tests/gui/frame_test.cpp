@@ -217,6 +217,7 @@ TEST_F(Frame, LeavesTheFocusWhereThereIsNoRoomForTheSearchField)
     folder.Write("Cartulo/environment.ini", "[Common]\nTOOLSIZE=100\n");
     Open(folder.Write("a.bib", OneEntry));
     ASSERT_TRUE(WaitFor([this] { return !Native_IsMapped(Search()); }));
+    ASSERT_TRUE(WaitForKeys(List()));
     PressShortcut('F', true, false);
     EXPECT_TRUE(List()->HasFocus());
     EXPECT_EQ("The window is too narrow for the search field.", Status());
@@ -271,7 +272,7 @@ protected:
 
     void ExpectAt(const wxRect &place)
     {
-        EXPECT_TRUE(WaitFor([&] { return frame->GetRect() == place; }, 2000))
+        EXPECT_TRUE(WaitFor([&] { return frame->GetRect() == place; }))
             << frame->GetPosition().x << ' ' << frame->GetPosition().y << ' ' << frame->GetSize().x
             << ' ' << frame->GetSize().y;
     }

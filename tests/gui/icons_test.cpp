@@ -7,7 +7,6 @@
 #include <wx/panel.h>
 #include <wx/sizer.h>
 #include <wx/textctrl.h>
-#include <wx/uiaction.h>
 
 #include "tests/gui/GuiTest.h"
 #include "tests/support/DataFolder.h"
@@ -318,22 +317,13 @@ protected:
         panel->SetSizer(column);
         m_frame->Show();
         before->SetFocus();
-        ASSERT_TRUE(WaitFor(
-            [this] { return m_frame->IsActive() && before->HasFocus() && IsDrawn(button); }));
+        ASSERT_TRUE(WaitForKeys(before));
+        ASSERT_TRUE(WaitFor([this] { return IsDrawn(button); }));
     }
     void TearDown() override
     {
         m_frame->Destroy();
         DeleteClosedWindows();
-    }
-
-    void Click()
-    {
-        wxSize size = button->GetSize();
-        wxUIActionSimulator mouse;
-        mouse.MouseMove(button->ClientToScreen(wxPoint(size.x / 2, size.y / 2)));
-        WaitFor([this] { return wxFindWindowAtPoint(wxGetMousePosition()) == button; });
-        mouse.MouseClick();
     }
 
     wxTextCtrl *before = nullptr, *after = nullptr; // children of the frame
@@ -351,19 +341,19 @@ private:
 
 TEST_F(BitmapButton, FiresOnAClickAndLeavesTheFocusAlone)
 {
-    Click();
+    Click(button);
     ASSERT_TRUE(WaitFor([this] { return pressed == 1; }));
     EXPECT_TRUE(before->HasFocus());
-    wxUIActionSimulator().Text("x");
+    SendText(before, "x");
     EXPECT_TRUE(WaitFor([this] { return before->GetValue() == "x"; }));
     EXPECT_EQ(1, pressed);
 }
 
 TEST_F(BitmapButton, IsPassedOverByTab)
 {
-    wxUIActionSimulator().Char(WXK_TAB);
+    SendKey(before, WXK_TAB);
     EXPECT_TRUE(WaitFor([this] { return after->HasFocus(); }));
-    wxUIActionSimulator().Char(WXK_TAB, wxMOD_SHIFT);
+    SendKey(after, WXK_TAB, wxMOD_SHIFT);
     EXPECT_TRUE(WaitFor([this] { return before->HasFocus(); }));
     EXPECT_EQ(0, pressed);
 }

@@ -203,7 +203,7 @@ wxIMPLEMENT_APP_NO_MAIN(PeerApp);
 static void UseService(const char *service)
 {
     std::string data;
-    MyClient client(1000);
+    MyClient client(30000);
     if (!client.Connect(service, Ipc_Topic))
         return;
     for (const char *item : {"known", "unknown"}) {
@@ -216,7 +216,7 @@ static void UseService(const char *service)
 static int Send(int argc, char **argv)
 {
     for (int i = 3; i < argc; ++i)
-        Say("sent: %d", SendCommand(argv[2], argv[i], 5000));
+        Say("sent: %d", SendCommand(argv[2], argv[i], 30000));
     if (argc == 3)
         UseService(argv[2]);
     return 0;

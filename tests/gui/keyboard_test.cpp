@@ -4,7 +4,6 @@
 
 #include <wx/scrolwin.h>
 #include <wx/srchctrl.h>
-#include <wx/uiaction.h>
 
 #include "base/Companion.h"
 #include "ui/Cartulo.h"
@@ -18,35 +17,32 @@ protected:
     {
         Open(folder.Write("a.bib", "@book{one, title = {First}, note = {Note}}\n"
                                    "@book{two, title = {Second}, note = {Note}}\n"));
-        ASSERT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
+        ASSERT_TRUE(WaitForKeys(List()));
     }
-
-    wxUIActionSimulator keys;
 };
 
 TEST_F(Keyboard, StartsInTheListAndFindsAKey)
 {
-    keys.Text("tw");
+    SendText(List(), "tw");
     EXPECT_TRUE(WaitFor([this] { return List()->GetSelection() == 1; }));
     EXPECT_EQ((Field{"title", "Second"}), ShownFields().at(0));
 }
 
 TEST_F(Keyboard, MovesThroughTheListWithTheArrows)
 {
-    keys.Char(WXK_DOWN);
+    SendKey(List(), WXK_DOWN);
     EXPECT_TRUE(WaitFor([this] { return List()->GetSelection() == 1; }));
     EXPECT_EQ((Field{"title", "Second"}), ShownFields().at(0));
 }
 
 TEST_F(Keyboard, SearchesWithEnterInTheSearchField)
 {
-    keys.Char('F', wxMOD_CONTROL);
-    ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
-    keys.Text("second");
+    SendKey(List(), 'F', wxMOD_CONTROL);
+    SendText(Search(), "second");
     EXPECT_TRUE(WaitFor([this] { return List()->GetItemCount() == 1; }));
     for (int key : {int(WXK_RETURN), int(WXK_NUMPAD_ENTER)}) {
         ForgetLog();
-        keys.Char(key);
+        SendKey(Search(), key);
         std::vector<LogLine> log;
         EXPECT_TRUE(WaitFor([&] {
             for (const LogLine &line : TakeLog("INFO: Cartulo::On"))
@@ -59,11 +55,10 @@ TEST_F(Keyboard, SearchesWithEnterInTheSearchField)
 
 TEST_F(Keyboard, SearchesWithCtrlFAndGoesDownIntoTheList)
 {
-    keys.Char('F', wxMOD_CONTROL);
-    ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
-    keys.Text("second");
+    SendKey(List(), 'F', wxMOD_CONTROL);
+    SendText(Search(), "second");
     EXPECT_TRUE(WaitFor([this] { return List()->GetItemCount() == 1; }));
-    keys.Char(WXK_DOWN);
+    SendKey(Search(), WXK_DOWN);
     EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
     EXPECT_EQ(0, List()->GetSelection());
 }
@@ -71,9 +66,8 @@ TEST_F(Keyboard, SearchesWithCtrlFAndGoesDownIntoTheList)
 TEST_F(Keyboard, ShowsTheMessagesFromTheSearchField)
 {
     Search()->SetFocus();
-    ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
     wxString text;
-    wxTEST_DIALOG((keys.Char('M', wxMOD_ALT), WaitFor([&] { return !text.empty(); })),
+    wxTEST_DIALOG((SendKey(Search(), 'M', wxMOD_ALT), WaitFor([&] { return !text.empty(); })),
                   ExpectMessages("There is no any messages related with loading BIB-files", &text));
     EXPECT_FALSE(text.empty());
 }
@@ -84,9 +78,9 @@ TEST_F(Keyboard, KeepsWorkingWhenTheOpenPaneGoes)
     frame->TakeCommand("");
     ASSERT_TRUE(WaitFor([this] { return IsShowing(ID_OPEN); }));
     Panel()->FindWindow(ID_OPEN)->SetFocus();
-    ASSERT_TRUE(WaitFor([this] { return Panel()->FindWindow(ID_OPEN)->HasFocus(); }));
+    ASSERT_TRUE(WaitForKeys(Panel()->FindWindow(ID_OPEN)));
     frame->TakeCommand(folder.Path("a.bib").c_str());
     EXPECT_TRUE(WaitFor([this] { return List()->HasFocus(); }));
-    keys.Text("tw");
+    SendText(List(), "tw");
     EXPECT_TRUE(WaitFor([this] { return List()->GetSelection() == 1; }));
 }

@@ -40,7 +40,7 @@ TEST_F(EditorPanel, OffersToAddAnEntryWhereThereIsNone)
     EXPECT_TRUE(IsShowing(ID_NEW_ENTRY));
     EXPECT_FALSE(IsShowing(ID_OPEN));
     EXPECT_FALSE(EntryPane()->IsShownOnScreen());
-    EXPECT_TRUE(List()->HasFocus());
+    EXPECT_TRUE(WaitForKeys(List()));
 }
 
 TEST_F(EditorPanel, FollowsTheNumberOfFilesAndEntries)
@@ -95,7 +95,7 @@ TEST_F(EditorPanel, OffersToAddAnEntryWhileTheSearchFindsNone)
 {
     Open(folder.Write("a.bib", OneEntry));
     Search()->SetFocus();
-    ASSERT_TRUE(WaitFor([this] { return Search()->HasFocus(); }));
+    ASSERT_TRUE(WaitForKeys(Search()));
     SearchFor("nothing like it");
     EXPECT_TRUE(IsShowing(ID_NEW_ENTRY));
     EXPECT_FALSE(EntryPane()->IsShownOnScreen());

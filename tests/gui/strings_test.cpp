@@ -4,7 +4,6 @@
 #include "tests/gui/EditTest.h"
 
 #include <wx/listbox.h>
-#include <wx/uiaction.h>
 
 #include "base/Companion.h"
 #include "ui/Strings.h"
@@ -99,8 +98,6 @@ protected:
     }
 
     BibFile *File(int i = 0) const { return Panel()->Files()->files[i]; }
-
-    wxUIActionSimulator keys;
 };
 
 // --- The list ---
@@ -366,25 +363,24 @@ TEST_F(Strings, StayInSightAmongTenThousand)
 TEST_F(Strings, AreLeftByTheArrowsFromTheSelectedRow)
 {
     OpenText("@string{a = {1}}\n@string{b = {2}}\n@string{c = {3}}\n@string{d = {4}}\n");
-    auto press = [this](Cartulo_Strings &dialog) {
+    auto press = [](Cartulo_Strings &dialog) {
         wxListBox *list = ListOf(dialog);
         auto expectRow = [&](int key, int row) {
-            ASSERT_TRUE(WaitFor([&] { return dialog.IsActive() && list->HasFocus(); }));
-            keys.Char(key);
+            SendKey(list, key);
             EXPECT_TRUE(WaitFor([&] { return list->GetSelection() == row; }))
                 << list->GetSelection() << " instead of " << row;
         };
         expectRow(WXK_DOWN, 1);
         ShowDialog<Cartulo_Strings_Edit>([&] { PressKey(list, 'E'); },
-                                         [this](Cartulo_Strings_Edit &edit) {
+                                         [](Cartulo_Strings_Edit &edit) {
                                              ValueOf(edit)->SetValue("changed");
-                                             keys.Char(WXK_RETURN);
+                                             SendKey(ValueOf(edit), WXK_RETURN);
                                          });
         expectRow(WXK_DOWN, 2);
         ShowDialog<Cartulo_Strings_Edit>([&] { PressKey(list, 'A'); },
-                                         [this](Cartulo_Strings_Edit &edit) {
+                                         [](Cartulo_Strings_Edit &edit) {
                                              KeyOf(edit)->SetValue("new");
-                                             keys.Char(WXK_RETURN);
+                                             SendKey(KeyOf(edit), WXK_RETURN);
                                          });
         EXPECT_EQ(4, list->GetSelection());
         expectRow(WXK_UP, 3);
@@ -610,14 +606,14 @@ TEST_F(NewString, IsRefusedWhenItCouldNotBeReadBack)
 TEST_F(NewString, IsTypedOnBehindItsCleanedKey)
 {
     OpenText(TwoStrings);
-    ShowString('A', [this](Cartulo_Strings_Edit &dialog) {
+    ShowString('A', [](Cartulo_Strings_Edit &dialog) {
         KeyOf(dialog)->SetValue("a{b}");
         wxTEST_DIALOG(PressButton(dialog, wxID_OK),
                       ExpectBox(Title,
                                 "String  key includes invalid characters.\n"
                                 "We will remove them and continue.",
                                 wxID_OK, Offer));
-        keys.Char('X');
+        SendKey(KeyOf(dialog), 'X');
         EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "abx"; }));
         dialog.EndModal(wxID_CANCEL);
     });
@@ -626,15 +622,13 @@ TEST_F(NewString, IsTypedOnBehindItsCleanedKey)
 TEST_F(NewString, TakesTheFocusAndTheKeys)
 {
     OpenText(TwoStrings);
-    ShowString('A', [this](Cartulo_Strings_Edit &dialog) {
-        EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->HasFocus(); }));
-        keys.Text("ade"); // letters that are commands in the list
+    ShowString('A', [](Cartulo_Strings_Edit &dialog) {
+        SendText(KeyOf(dialog), "ade"); // letters that are commands in the list
         EXPECT_TRUE(WaitFor([&] { return KeyOf(dialog)->GetValue() == "ade"; }));
-        keys.Char(WXK_TAB);
-        EXPECT_TRUE(WaitFor([&] { return ValueOf(dialog)->HasFocus(); }));
-        keys.Text("v");
+        SendKey(KeyOf(dialog), WXK_TAB);
+        SendText(ValueOf(dialog), "v");
         EXPECT_TRUE(WaitFor([&] { return ValueOf(dialog)->GetValue() == "v"; }));
-        keys.Char(WXK_RETURN);
+        SendKey(ValueOf(dialog), WXK_RETURN);
     });
     EXPECT_STREQ("ade", File()->strings->next->next->name);
 }
@@ -749,15 +743,14 @@ TEST_F(ChangedString, IsTypedOnWhereTheCursorWas)
     OpenText(TwoStrings);
     ShowString('E', [this](Cartulo_Strings_Edit &dialog) {
         wxTextCtrl *value = ValueOf(dialog);
-        EXPECT_TRUE(WaitFor([&] { return value->HasFocus(); }));
-        keys.Char('X');
+        SendKey(value, 'X');
         EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good Orderx"; }));
         value->SetValue("Good}");
         value->SetInsertionPoint(5);
         wxTEST_DIALOG(PressButton(dialog, wxID_OK), Wrong("Unbalanced braces (extra `}')"));
-        keys.Char(WXK_BACK);
+        SendKey(value, WXK_BACK);
         EXPECT_TRUE(WaitFor([&] { return value->GetValue() == "Good"; }));
-        keys.Char(WXK_RETURN);
+        SendKey(value, WXK_RETURN);
     });
     EXPECT_STREQ("Good", File()->strings->value);
 }

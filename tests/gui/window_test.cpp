@@ -2,6 +2,7 @@
 
 #include "tests/gui/GuiTest.h"
 
+#include <cmath>
 #include <csignal>
 #include <filesystem>
 #include <functional>
@@ -9,7 +10,6 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
-#include <wx/uiaction.h>
 #include <wx/button.h>
 #include <wx/scrolwin.h>
 #include <wx/settings.h>
@@ -291,10 +291,9 @@ TEST_F(Window, PressesTheFocusedButtonWithEnter)
     std::string path = folder.Write("a.bib", OneEntry);
     Open("");
     Panel()->FindWindow(ID_OPEN)->SetFocus();
-    ASSERT_TRUE(WaitFor([this] { return Panel()->FindWindow(ID_OPEN)->HasFocus(); }));
     AllowDialogs allow;
     AnswerFileDialog answer(path);
-    wxUIActionSimulator().Char(WXK_RETURN);
+    SendKey(Panel()->FindWindow(ID_OPEN), WXK_RETURN);
     EXPECT_TRUE(WaitFor([&] { return !Rows().empty(); }));
     EXPECT_EQ("Open BIB file", answer.title);
 }
@@ -707,12 +706,16 @@ TEST_F(Window, SharesItsWidthBetweenListAndEntry)
     EXPECT_EQ(frame->FromDIP(300), Panel()->GetSashPosition());
     ASSERT_TRUE(WaitFor([this] { return !frame->IsNew(); }));
     int width = EntryPane()->GetSize().x;
+    auto isSashNear = [this](double place) {
+        return std::abs(frame->ToDIP(Panel()->GetSashPosition()) - place) <= 10;
+    };
     frame->SetSize(frame->GetMinSize());
-    ASSERT_TRUE(WaitFor([&] { return EntryPane()->GetSize().x != width; }));
-    EXPECT_NEAR(300 - 0.35 * (800 - 512), frame->ToDIP(Panel()->GetSashPosition()), 10);
+    EXPECT_TRUE(WaitFor([&] {
+        return EntryPane()->GetSize().x != width && isSashNear(300 - 0.35 * (800 - 512));
+    })) << Panel()->GetSashPosition();
     frame->SetSize(frame->FromDIP(wxSize(800, 600)));
-    ASSERT_TRUE(WaitFor([&] { return EntryPane()->GetSize().x == width; }));
-    EXPECT_NEAR(300, frame->ToDIP(Panel()->GetSashPosition()), 10);
+    EXPECT_TRUE(WaitFor([&] { return EntryPane()->GetSize().x == width && isSashNear(300); }))
+        << Panel()->GetSashPosition();
 }
 
 // --- Colours ---
