@@ -19,7 +19,7 @@ xfwm4) manage="xfwm4 --compositor=off" ;;
     ;;
 esac
 
-seconds=30 # how long the screen and the window manager may take to come up
+seconds=60 # how long the screen and the window manager may take to come up
 work=$(mktemp -d) || exit 125
 screen= bus= manager= command=
 
