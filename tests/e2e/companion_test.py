@@ -5,7 +5,7 @@ import os
 
 import cases
 from cases import MORE, REFS, EditorTest
-from editor import minimise, poll, windows_named, xdotool
+from editor import FRAME, minimise, poll, windows_named, xdotool
 
 INSERTION = "execute CommandLine: -s ({}) ...InsCite"
 MANUAL = "Cartulo: the manual"
@@ -53,7 +53,7 @@ class Cite(EditorTest):
         minimise(self.other.frame)
         editor = self.start(f"-w{self.other.frame}/{self.service}", "refs.bib").ready()
         self.assert_inserts(editor, "alpha")
-        self.assertEqual([self.other.frame], self.other.windows("Quarlo Cartulo"))
+        self.assertEqual(self.other.frame, self.other.wait_for_window(FRAME))
 
     def test_takes_the_window_from_a_second_start(self):
         self.write("more.bib", MORE)

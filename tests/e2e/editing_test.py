@@ -184,13 +184,14 @@ class ByKeyboard(EditorTest):
     def test_keys_that_come_before_a_box_are_for_the_box(self):
         self.write("a.bib", b"@misc{a, note = {A}}\n@misc{b, note = {B}}\n@misc{c, note = {C}}\n")
         editor = self.start("a.bib").ready()
-        xdotool("key", "--delay", 0, "alt+d", "alt+d", "alt+n")
+        # No letter of these answers the box, where some may come when it is open already.
+        xdotool("key", "--delay", 0, "alt+d", "alt+d", "alt+a")
         editor.answer(REMOVE_ENTRY)
         editor.wait_until_active()
         editor.press("alt+b")
         self.assertEqual(b"@misc{b,\n\tnote = {B}\n}\n@misc{c,\n\tnote = {C}\n}\n",
                          self.read("a.bib"))
-        self.assertEqual([], editor.windows(RENAME_ENTRY))
+        self.assertEqual([], editor.windows(NEW_ENTRY))
 
     def test_a_dialog_is_done_before_the_next_key(self):
         self.write("a.bib", b"@misc{a, note = {A}}\n")
@@ -198,8 +199,8 @@ class ByKeyboard(EditorTest):
         editor.begin("alt+n")
         editor.type_into(RENAME_ENTRY, "b")
         xdotool("key", "--delay", 0, "Return", "Escape")
+        editor.wait_for_log("Fix crossref's on the entry: a")
         editor.wait(lambda: not editor.windows(RENAME_ENTRY), "the dialog closes")
-        self.assertIn("Fix crossref's on the entry: a", editor.log())
 
 
 class Fields(EditorTest):

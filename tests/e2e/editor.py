@@ -11,7 +11,7 @@ import re
 import subprocess
 import time
 
-DEADLINE = 30  # seconds
+DEADLINE = 60  # seconds
 FRAME = "Quarlo Cartulo"
 MESSAGES = "Bibliography File Loading Error Messages"
 LOCK_BOX = "Openning BIB file"

@@ -54,7 +54,7 @@ class GeometryTest(EditorTest):
 
     def assert_opens_at(self, place):
         editor = self.start_editor()
-        self.assertEqual(place, editor.place())
+        editor.wait(lambda: editor.place() == place, f"the window is at {place}")
         return editor
 
     def drag_sash(self, editor, start, way):

@@ -6,7 +6,7 @@ import signal
 
 import cases
 from cases import ALL_ROWS, MORE, MORE_ROWS, REFS, EditorTest
-from editor import LOCK_BOX, MESSAGES, OPEN_BOX, is_locked, minimise, windows_named
+from editor import FRAME, LOCK_BOX, MESSAGES, OPEN_BOX, is_locked, minimise, windows_named
 
 REFS_ROWS = ["alpha (refs)", "beta (refs)", "gamma (refs)"]
 
@@ -199,7 +199,7 @@ class ComesForward(InstanceTest):
         minimise(first.frame)
         other.wait_until_active()
         self.assert_carries_out(first, "more")
-        self.assertEqual([first.frame], first.windows("Quarlo Cartulo"))
+        self.assertEqual(first.frame, first.wait_for_window(FRAME))
         self.assertEqual(MORE_ROWS, first.rows())
 
     def test_from_being_minimised_as_the_only_one(self):
