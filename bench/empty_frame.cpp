@@ -1,5 +1,5 @@
-// The least that a program of the toolkit can show: a frame with an empty panel. Says on standard
-// error when the panel is painted for the first time.
+// bench/empty_frame.cpp - the least that a program of the toolkit can show: a frame with an empty
+// panel. Says on standard error when the panel is painted for the first time.
 #include <cstdio>
 
 #include <wx/app.h>

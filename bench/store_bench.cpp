@@ -1,4 +1,5 @@
-// What the store costs, as ratios against a plain reference in the same run.
+// bench/store_bench.cpp - what the store costs, as ratios against a plain reference in the same
+// run.
 //
 //   cartulo_bench [entries]      default 100000, about 54 MB
 //

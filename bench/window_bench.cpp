@@ -1,4 +1,5 @@
-// What the windows cost, and whether they can be kept from working. Needs a display:
+// bench/window_bench.cpp - what the windows cost, and whether they can be kept from working. Needs
+// a display:
 //
 //   scripts/with-display.sh cartulo_window_bench [starts] [seconds [attack]]   default 15, 5, all
 //

@@ -1,3 +1,4 @@
+// tests/bib_check_test.cpp - what a value and a key may hold.
 #include "store/BibStore.h"
 
 #include <gtest/gtest.h>

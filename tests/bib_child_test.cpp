@@ -1,3 +1,4 @@
+// tests/bib_child_test.cpp - the loading child, and what it knows of the editor.
 #include "store/BibChild.h"
 
 #include <gtest/gtest.h>

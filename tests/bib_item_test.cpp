@@ -1,3 +1,4 @@
+// tests/bib_item_test.cpp - items as bytes, and the records that are built of them.
 #include "store/BibItem.h"
 
 #include <gtest/gtest.h>

@@ -1,3 +1,4 @@
+// tests/bib_load_test.cpp - what a load makes of files, sound and broken.
 #include "store/BibStore.h"
 
 #include <gtest/gtest.h>

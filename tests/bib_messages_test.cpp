@@ -1,3 +1,4 @@
+// tests/bib_messages_test.cpp - the parser's messages: counted, logged, kept.
 #include "store/BibStore.h"
 
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-// What stands between the items of a file is there again after a save.
+// tests/bib_outside_test.cpp - what stands between the items of a file is there again after a save.
 #include "session/Changes.h"
 #include "store/BibOutside.h"
 

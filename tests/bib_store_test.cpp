@@ -1,3 +1,4 @@
+// tests/bib_store_test.cpp - name tables and entries.
 #include "store/BibStore.h"
 
 #include <gtest/gtest.h>

@@ -1,3 +1,4 @@
+// tests/bib_text_test.cpp - line ends, encodings and comments of plain text.
 #include "store/BibText.h"
 
 #include <gtest/gtest.h>

@@ -1,4 +1,4 @@
-// The INI file that the program comes with.
+// tests/cartulo_ini_test.cpp - the INI file that the program comes with.
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 

@@ -1,3 +1,4 @@
+// tests/changes_test.cpp - changes of open files: what they do, and that they count.
 #include "session/Changes.h"
 
 #include <gmock/gmock.h>

@@ -1,3 +1,4 @@
+// tests/colours_test.cpp - the colours of texts.
 #include <gmock/gmock.h>
 
 #include <vector>

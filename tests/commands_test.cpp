@@ -1,3 +1,4 @@
+// tests/commands_test.cpp - the table of commands: keys, tools, help.
 #include <gtest/gtest.h>
 
 #include <set>

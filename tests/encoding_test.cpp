@@ -1,3 +1,4 @@
+// tests/encoding_test.cpp - code pages and UTF-8, to and from Unicode.
 #include "tests/support/LogCapture.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// tests/entry_rules_test.cpp - which keys, types and files entries may have.
 #include "session/EntryRules.h"
 
 #include <gmock/gmock.h>

@@ -1,3 +1,4 @@
+// tests/field_check_test.cpp - the rules for fields.
 #include "session/FieldCheck.h"
 
 #include <gmock/gmock.h>

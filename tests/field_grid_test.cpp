@@ -1,3 +1,4 @@
+// tests/field_grid_test.cpp - the rows of the entry pane: filled, edited, compared, built.
 #include "session/Changes.h"
 #include "ui/FieldGrid.h"
 

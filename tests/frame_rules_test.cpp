@@ -1,3 +1,4 @@
+// tests/frame_rules_test.cpp - the frame's place, size and tool icons.
 #include <gtest/gtest.h>
 
 #include "app/FrameRules.h"

@@ -1,3 +1,4 @@
+// tests/known_strings_test.cpp - the abbreviations of files and lists.
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 

@@ -1,3 +1,4 @@
+// tests/log_test.cpp - the program's trace lines.
 #include "tests/support/LogCapture.h"
 
 #include <fstream>

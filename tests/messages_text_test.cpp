@@ -1,3 +1,4 @@
+// tests/messages_text_test.cpp - what the loading-messages window says.
 #include <cstring>
 
 #include <gtest/gtest.h>

@@ -1,3 +1,4 @@
+// tests/names_test.cpp - typed keys and names.
 #include <gtest/gtest.h>
 
 #include "encoding/Encoding.h"

@@ -1,3 +1,4 @@
+// tests/panel_rules_test.cpp - panes, tools and rows of the panel.
 #include <gtest/gtest.h>
 
 #include "ui/Ids.h"

@@ -1,3 +1,4 @@
+// tests/preamble_text_test.cpp - the preamble as text of a control, and back.
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 

@@ -1,4 +1,5 @@
-// What was loaded is what a save writes: real files, loaded, saved, and loaded again.
+// tests/round_trip_test.cpp - what was loaded is what a save writes: real files, loaded, saved, and
+// loaded again.
 #include "store/BibStore.h"
 
 #include <gmock/gmock.h>

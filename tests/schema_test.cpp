@@ -1,3 +1,4 @@
+// tests/schema_test.cpp - the INI file of entry types.
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 

@@ -1,3 +1,4 @@
+// tests/search_text_test.cpp - which entries a search finds.
 #include "ui/SearchText.h"
 
 #include <gtest/gtest.h>

@@ -1,3 +1,4 @@
+// tests/string_rules_test.cpp - decisions of the window for abbreviations.
 #include <gtest/gtest.h>
 
 #include <string>

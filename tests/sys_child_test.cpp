@@ -1,3 +1,4 @@
+// tests/sys_child_test.cpp - child processes.
 #include "base/Sys.h"
 
 #include <gtest/gtest.h>

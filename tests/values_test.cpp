@@ -1,3 +1,4 @@
+// tests/values_test.cpp - typed values, and how stored ones are shown.
 #include <gtest/gtest.h>
 
 #include "encoding/Encoding.h"

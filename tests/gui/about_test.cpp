@@ -1,3 +1,4 @@
+// tests/gui/about_test.cpp - the About box.
 #include "app/AboutDlg.h"
 
 #include <algorithm>

@@ -1,4 +1,5 @@
-// All commands in both modes: which of them apply, and where they leave the keyboard.
+// tests/gui/commands_test.cpp - all commands in both modes: which of them apply, and where they
+// leave the keyboard.
 
 #include "tests/gui/EditTest.h"
 

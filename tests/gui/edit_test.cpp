@@ -1,4 +1,5 @@
-// Editing an entry in its pane: the two modes, inherited fields, the commit.
+// tests/gui/edit_test.cpp - editing an entry in its pane: the two modes, inherited fields, the
+// commit.
 
 #include "tests/gui/EditTest.h"
 

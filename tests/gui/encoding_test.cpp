@@ -1,4 +1,4 @@
-// Files in UTF-8 and in a code page, side by side in one window.
+// tests/gui/encoding_test.cpp - files in UTF-8 and in a code page, side by side in one window.
 
 #include "tests/gui/DialogTest.h"
 #include "tests/gui/EditTest.h"

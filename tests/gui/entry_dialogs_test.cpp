@@ -1,4 +1,5 @@
-// The commands that add, rename and remove entries, and their windows.
+// tests/gui/entry_dialogs_test.cpp - the commands that add, rename and remove entries, and their
+// windows.
 
 #include "tests/gui/DialogTest.h"
 

@@ -1,4 +1,5 @@
-// The commands on the fields of the entry that is edited, and their windows.
+// tests/gui/fields_test.cpp - the commands on the fields of the entry that is edited, and their
+// windows.
 
 #include "tests/gui/DialogTest.h"
 #include "tests/gui/EditTest.h"

@@ -1,4 +1,5 @@
-// The main frame: tools, place and size, keys, help, commands of other programs, closing.
+// tests/gui/frame_test.cpp - the main frame: tools, place and size, keys, help, commands of other
+// programs, closing.
 
 #include "tests/gui/GuiTest.h"
 

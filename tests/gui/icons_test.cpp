@@ -1,3 +1,4 @@
+// tests/gui/icons_test.cpp - pictures of tools, and their buttons.
 #include "ui/Icons.h"
 
 #include <cstring>

@@ -1,4 +1,5 @@
-// The command channel: clients of every kind, as they meet a server behind a real window.
+// tests/gui/ipc_test.cpp - the command channel: clients of every kind, as they meet a server behind
+// a real window.
 
 #include "tests/gui/GuiTest.h"
 

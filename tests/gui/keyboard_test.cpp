@@ -1,4 +1,4 @@
-// The keyboard as the user's keys reach the window, with real focus.
+// tests/gui/keyboard_test.cpp - the keyboard as the user's keys reach the window, with real focus.
 
 #include "tests/gui/GuiTest.h"
 

@@ -1,4 +1,4 @@
-// The entry list in the window: rows, search, type-ahead.
+// tests/gui/list_test.cpp - the entry list in the window: rows, search, type-ahead.
 
 #include "tests/gui/GuiTest.h"
 

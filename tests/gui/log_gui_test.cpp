@@ -1,4 +1,4 @@
-// The toolkit's messages on their way to the program's log.
+// tests/gui/log_gui_test.cpp - the toolkit's messages on their way to the program's log.
 
 #include "tests/gui/GuiTest.h"
 

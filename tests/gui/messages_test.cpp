@@ -1,4 +1,4 @@
-// The window with the messages of loading.
+// tests/gui/messages_test.cpp - the window with the messages of loading.
 
 #include "tests/gui/DialogTest.h"
 

@@ -1,4 +1,4 @@
-// The editor panel: its panes, the tools that apply, the sash, citing.
+// tests/gui/panel_test.cpp - the editor panel: its panes, the tools that apply, the sash, citing.
 
 #include "tests/gui/GuiTest.h"
 

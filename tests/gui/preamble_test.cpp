@@ -1,4 +1,4 @@
-// The window for preambles.
+// tests/gui/preamble_test.cpp - the window for preambles.
 
 #include "tests/gui/DialogTest.h"
 #include "tests/gui/EditTest.h"

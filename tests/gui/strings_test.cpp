@@ -1,4 +1,4 @@
-// The windows for abbreviations.
+// tests/gui/strings_test.cpp - the windows for abbreviations.
 
 #include "tests/gui/DialogTest.h"
 #include "tests/gui/EditTest.h"

@@ -1,4 +1,4 @@
-// The window: files, saving, messages, keys, colours.
+// tests/gui/window_test.cpp - the window: files, saving, messages, keys, colours.
 
 #include "tests/gui/GuiTest.h"
 

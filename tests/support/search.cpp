@@ -1,5 +1,5 @@
-// Prints the answer of TNSearch, as a program sees it that is installed where this one is copied
-// to: search CATEGORY NAME
+// tests/support/search.cpp - prints the answer of TNSearch, as a program sees it that is installed
+// where this one is copied to: search CATEGORY NAME
 #include <cstdio>
 #include <cstdlib>
 
