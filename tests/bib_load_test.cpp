@@ -352,8 +352,9 @@ TEST_F(BibLoad, TellsWhyNoChildStarts)
     getrlimit(RLIMIT_NOFILE, &limit);
     struct rlimit low = {static_cast<rlim_t>(next) + 1, limit.rlim_max};
     setrlimit(RLIMIT_NOFILE, &low);
-    file = Bib_LoadFile(path.c_str());
+    BibFile *loaded = Bib_LoadFile(path.c_str()); // a sanitizer that looks at `this` needs pipes
     setrlimit(RLIMIT_NOFILE, &limit);
+    file = loaded;
     ASSERT_NE(nullptr, file);
     EXPECT_EQ(nullptr, file->entries);
     EXPECT_EQ("INTERNAL ERROR: line 0: Too many open files\r\n", Messages(file));
