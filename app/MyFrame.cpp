@@ -31,7 +31,9 @@
 enum { SMALLEST_WINDOW = 512, DEFAULT_PLACE = 50, TOOL_MARGIN = 4, SEARCH_WIDTH = 160 };
 enum { SMALLEST_SEARCH = 80, ENCODING_MARGIN = 32 };
 enum { LEAVING_TIMER = 1 };
-enum { PLACING_TIME = 500, LEAVING_TIME = 250 }; // milliseconds that a window manager may take
+// Milliseconds that a window manager may take; the longest when it never gives the window the
+// focus.
+enum { PLACING_TIME = 500, LONGEST_PLACING_TIME = 10000, LEAVING_TIME = 250 };
 
 // The first row that matches handles the event.
 wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
@@ -47,6 +49,7 @@ wxBEGIN_EVENT_TABLE(MyFrame, wxFrame)
     EVT_TEXT(ID_SEARCH, MyFrame::OnSearch)
     EVT_SEARCH(ID_SEARCH, MyFrame::OnSearch)
     EVT_CHAR_HOOK(MyFrame::OnCharHook)
+    EVT_ACTIVATE(MyFrame::OnActivate)
     EVT_MOVE(MyFrame::OnMove)
     EVT_SIZE(MyFrame::OnSize)
     EVT_TIMER(LEAVING_TIMER, MyFrame::OnLeft)
@@ -149,9 +152,21 @@ bool MyFrame::Show(bool show)
     return wxFrame::Show(show);
 }
 
+// The user can do nothing with it before it has the focus, which takes its time on a busy machine.
 bool MyFrame::IsNew() const
 {
-    return !IsShown() || Sys_Milliseconds() - m_shownAt < PLACING_TIME;
+    int32_t placing = m_hadFocus ? PLACING_TIME : LONGEST_PLACING_TIME;
+    return !IsShown() || Sys_Milliseconds() - m_shownAt < placing;
+}
+
+void MyFrame::OnActivate(wxActivateEvent &event)
+{
+    event.Skip();
+    if (!event.GetActive() || m_hadFocus)
+        return;
+    m_hadFocus = true;
+    m_shownAt = Sys_Milliseconds();
+    CallAfter(&MyFrame::Correct);
 }
 
 // Some window managers choose a place of their own for a new window, and none tells the size of

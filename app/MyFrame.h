@@ -67,6 +67,7 @@ private:
     bool SearchHasFocus() const;
     bool TakesEnter() const;
     void Correct();
+    void OnActivate(wxActivateEvent &event);
     void OnMove(wxMoveEvent &event);
     void OnSize(wxSizeEvent &event);
     void OnLeft(wxTimerEvent &event);
@@ -85,7 +86,8 @@ private:
     bool m_commandWaits = false; // for the end of editing
     wxRect m_place;              // where the window shall open
     int m_corrections = 2;       // tries that are left to put it there
-    int32_t m_shownAt = 0;       // Sys_Milliseconds
+    int32_t m_shownAt = 0;       // Sys_Milliseconds; from the first focus on, when that came
+    bool m_hadFocus = false;
 
     wxDECLARE_EVENT_TABLE();
 };

@@ -76,16 +76,6 @@ void Sys_KeepEndedChildren()
         signal(SIGCHLD, SIG_DFL);
 }
 
-// Puts the reason, which is in errno, where it is wanted. Returns 0.
-static int Explain(SysReason *why)
-{
-    if (!why)
-        return 0;
-    snprintf(why->text, sizeof why->text, "%s", Sys_LastErrorText());
-    why->isTaken = 0;
-    return 0;
-}
-
 // A copy of this process has the task and its input; the name is not needed.
 [[noreturn]] static void BecomeChild(int toParent, const SysTask *task, const SysInput *input,
                                      int cpuSeconds)
@@ -104,13 +94,13 @@ int Sys_StartChild(SysChild *child, const SysTask *task, const SysInput *input, 
 {
     int ends[2];
     if (!Sys_OpenPipe(ends))
-        return Explain(why);
+        return Sys_TellWhy(why);
     Sys_KeepEndedChildren();
     fcntl(ends[1], F_SETPIPE_SZ, 1 << 20); // fewer switches between the two; it may be refused
     fflush(nullptr); // else the child would hold, and perhaps write, unwritten lines of ours
     pid_t pid = fork();
     if (pid < 0) {
-        Explain(why);
+        Sys_TellWhy(why);
         close(ends[0]);
         close(ends[1]);
         return 0;

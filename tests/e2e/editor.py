@@ -119,7 +119,6 @@ class Editor:
             self.process = subprocess.Popen(command, cwd=folder, env=environment,
                                             stdin=subprocess.DEVNULL, stdout=output, stderr=output)
         self.frame = None
-        self.shown = None
 
     # --- What can be seen ---
 
@@ -190,7 +189,6 @@ class Editor:
     def await_frame(self):
         self.wait_for_log("Cartulo::Frame --- End.")
         self.frame = self.wait_for_window(FRAME)
-        self.shown = time.monotonic()
         return self
 
     def ready(self):
@@ -269,8 +267,11 @@ class Editor:
             rows += row
 
     def await_place(self):
-        """Waits until the window is the user's: in its first second it goes where it belongs."""
-        poll(lambda: time.monotonic() > self.shown + 1, "a second")
+        """Waits until the window is the user's: in its first second it goes where it belongs.
+
+        That second counts from the focus, so the window is ready before."""
+        ready = time.monotonic()
+        poll(lambda: time.monotonic() > ready + 1, "a second")
         self.settle()
 
     def change(self):
