@@ -329,8 +329,30 @@ protected:
         PressShortcut(WXK_RETURN, false, false);
     }
 
+    void SetUp() override
+    {
+        state.sendCommand = [](const char *service, const char *text) {
+            sent.push_back(std::string(service) + ": " + text);
+            return answer;
+        };
+        sent.clear();
+        answer = 1;
+    }
+
     Lines Expected() const { return {{"INFO: Cartulo::OnInsertCite", TNS_ACTION}}; }
+
+    static std::vector<std::string> sent;
+    static int answer;
 };
+std::vector<std::string> Cite::sent;
+int Cite::answer;
+
+TEST_F(Cite, SendsTheKeyToTheCompanion)
+{
+    Insert(" -w1/Srv");
+    EXPECT_EQ(std::vector<std::string>{"Srv: -s (one) ...InsCite"}, sent);
+    EXPECT_EQ("", Status());
+}
 
 TEST_F(Cite, DoesNothingWithoutACompanion)
 {
@@ -344,6 +366,7 @@ TEST_F(Cite, SendsNothingWithoutAWindowOrAService)
         strcpy(state.companionService, "");
         Insert(option);
         EXPECT_TRUE(TakeLog("Cartulo: Pass*").empty()) << option;
+        EXPECT_TRUE(sent.empty()) << option;
         Close();
     }
 }
@@ -358,7 +381,7 @@ TEST_F(Cite, SendsNothingWithoutAnEntry)
 
 TEST_F(Cite, SaysThatTheCompanionDoesNotAnswer)
 {
-    setenv("XDG_RUNTIME_DIR", folder.Path().c_str(), 1);
+    answer = 0;
     Insert(" -w1/NobodyServesThis");
     EXPECT_EQ((Lines{{"Cartulo: Pass* -s (one) ...InsCite", TNS_TRACE}}),
               TakeLog("Cartulo: Pass*"));
