@@ -8,7 +8,6 @@
 // Names and values are store text, each in the encoding of its source.
 #pragma once
 
-#include <cstdint>
 #include <string>
 #include <vector>
 

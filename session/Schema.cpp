@@ -115,11 +115,6 @@ std::vector<FieldClass> Schema_FieldClasses(const char *ini, const char *type,
     return classes;
 }
 
-FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key)
-{
-    return Schema_FieldClasses(ini, type, {key})[0];
-}
-
 std::string Schema_Description(const char *ini, const char *type)
 {
     char description[HELP_SIZE];

@@ -35,7 +35,8 @@ enum FieldClass {
     FIELD_MANDATORY,
     FIELD_OPTIONAL
 };
-FieldClass Schema_FieldClass(const char *ini, const char *type, const char *key);
+
+// One for each key, in their order, with one look at the file.
 std::vector<FieldClass> Schema_FieldClasses(const char *ini, const char *type,
                                             const std::vector<const char *> &keys);
 

@@ -377,7 +377,7 @@ TEST(DefaultIni, HasTheCommonFieldsInEveryType)
               "isbn issn language keywords abstract annote file note key");
     for (const string &type : Types()) {
         for (const string &field : common) {
-            FieldClass fieldClass = Schema_FieldClass(Ini, type.c_str(), field.c_str());
+            FieldClass fieldClass = Schema_FieldClasses(Ini, type.c_str(), {field.c_str()})[0];
             EXPECT_TRUE(fieldClass == FIELD_OPTIONAL || fieldClass == FIELD_MANDATORY)
                 << type << ": " << field;
         }

@@ -147,7 +147,7 @@ class SchemaFieldClass : public SchemaFile
 protected:
     FieldClass Of(const char *key, const char *type = "article")
     {
-        return Schema_FieldClass(ini.c_str(), type, key);
+        return Schema_FieldClasses(ini.c_str(), type, {key})[0];
     }
 
     std::string ini = folder.Write("a.ini", Types);

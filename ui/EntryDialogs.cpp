@@ -105,12 +105,6 @@ bool EntryDialog::Accept(KeyVerdict verdict, const TypedName &key)
     return AcceptDuplicate();
 }
 
-void EntryDialog::SetChanged(BibEntry *entry, int file)
-{
-    m_changed = entry;
-    m_changedFile = file;
-}
-
 // --- A new entry ---
 
 wxBEGIN_EVENT_TABLE(Cartulo_NewEntry, EntryDialog)
@@ -191,7 +185,7 @@ bool Cartulo_NewEntry::Create(int file, const std::string &key)
         Refuse("There is not enough memory for a new entry.");
         return false;
     }
-    SetChanged(entry, file);
+    m_changed = entry;
     return true;
 }
 
@@ -231,7 +225,7 @@ bool Cartulo_RenameEntry::Rename(BibFile *file, const std::string &key)
         Refuse("There is not enough memory for the new key.");
         return false;
     }
-    SetChanged(m_current.entry, m_current.file);
+    m_changed = m_current.entry;
     return true;
 }
 

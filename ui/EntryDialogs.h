@@ -30,7 +30,6 @@ class EntryDialog : public wxDialog
 {
 public:
     BibEntry *Changed() const { return m_changed; } // the entry; null when nothing was changed
-    int ChangedFile() const { return m_changedFile; }
 
 protected:
     struct Texts {
@@ -47,7 +46,6 @@ protected:
     // False when it can't be the key; the user knows why then, or has one without bad characters.
     bool Accept(KeyVerdict verdict, const TypedName &key);
     void Refuse(const wxString &text);
-    void SetChanged(BibEntry *entry, int file);
 
     EntryPlace m_current;
     std::vector<int> m_files; // the index in the set for each item of the choice
@@ -55,14 +53,13 @@ protected:
     wxTextCtrl *m_key;
     wxChoice *m_type;
     wxFlexGridSizer *m_rows; // for Dialog_Finish
+    BibEntry *m_changed = nullptr;
 
 private:
     void FillFiles();
     bool AcceptDuplicate();
 
     Texts m_texts;
-    BibEntry *m_changed = nullptr;
-    int m_changedFile = -1;
 };
 
 class Cartulo_NewEntry : public EntryDialog
