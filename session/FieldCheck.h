@@ -13,14 +13,17 @@
 struct EncodingRecord;
 struct StringSources;
 
-// A field as it would be stored, and what it was.
+// A field as it would be stored, and what it was. Who asks for refusals gives what refuses, who
+// asks for warnings what warns.
 struct FieldFacts {
-    std::string name; // store text
-    bool isNew;       // the name is new to the entry
+    bool isChanged; // the user has typed the value
 
+    // What refuses.
+    std::string name;  // store text; only read when it is new to the entry
+    bool isNew;        // it is
     std::string value; // store text
-    bool isChanged;    // the user has typed it; the rest counts only then
 
+    // What warns; only read when the value is changed.
     std::wstring label;             // how the user knows the field
     std::wstring text;              // what was typed
     std::wstring filled;            // what was shown before
@@ -31,7 +34,7 @@ struct FieldFacts {
 };
 
 struct FieldRule {
-    const char *id;
+    const char *id; // to name it in tests and reports
     bool (*applies)(const FieldFacts &field);
 
     // One of these, the other is null. Why the field can't be stored: static text, null when it

@@ -366,6 +366,7 @@ static FieldFacts Facts(const FieldGrid *grid, const GridRow *row)
 {
     FieldFacts field = {};
     field.name = row->key;
+    field.isNew = row->field == GRID_NO_FIELD || !IsNamed(grid->entry, row->field, row);
     field.isChanged = IsChanged(row);
     field.label = Enc_Decode(row->key.c_str(), grid->encoding);
     field.text = row->text;
