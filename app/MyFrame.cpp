@@ -3,6 +3,7 @@
 #include "app/MyFrame.h"
 
 #include <algorithm>
+#include <cstdlib>
 
 #include <wx/button.h>
 #include <wx/config.h>
@@ -15,7 +16,6 @@
 #include <wx/utils.h>
 
 #include "app/AboutDlg.h"
-#include "app/FrameRules.h"
 #include "base/Companion.h"
 #include "base/Log.h"
 #include "base/Sys.h"
@@ -148,15 +148,15 @@ void MyFrame::Place()
 
 bool MyFrame::Show(bool show)
 {
-    m_shownAt = Sys_Milliseconds();
+    m_placedSince = Sys_Milliseconds();
     return wxFrame::Show(show);
 }
 
-// The user can do nothing with it before it has the focus, which takes its time on a busy machine.
+// A window manager that is done gives it the focus; on a busy machine that takes a while.
 bool MyFrame::IsNew() const
 {
     int32_t placing = m_hadFocus ? PLACING_TIME : LONGEST_PLACING_TIME;
-    return !IsShown() || Sys_Milliseconds() - m_shownAt < placing;
+    return !IsShown() || Sys_Milliseconds() - m_placedSince < placing;
 }
 
 void MyFrame::OnActivate(wxActivateEvent &event)
@@ -165,7 +165,7 @@ void MyFrame::OnActivate(wxActivateEvent &event)
     if (!event.GetActive() || m_hadFocus)
         return;
     m_hadFocus = true;
-    m_shownAt = Sys_Milliseconds();
+    m_placedSince = Sys_Milliseconds();
     CallAfter(&MyFrame::Correct);
 }
 
@@ -254,10 +254,10 @@ void MyFrame::CreateTools()
     for (const Command *command = Commands; command < Commands + CommandCount; ++command) {
         if (!command->tool.label || (command->id == ID_MESSAGES && !hasMessages))
             continue;
-        if (command->id == ID_SEARCH)
-            AddSearch(*command);
-        else
+        if (command->tool.icon)
             AddTool(*command);
+        else
+            AddSearch(*command);
     }
     bar->Realize();
     m_toolsWidth = bar->GetBestSize().x - m_search->GetSize().x;

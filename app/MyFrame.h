@@ -7,6 +7,7 @@
 #include <wx/frame.h>
 #include <wx/timer.h>
 
+#include "app/FrameRules.h"
 #include "session/CommandLine.h"
 
 class Cartulo;
@@ -86,7 +87,7 @@ private:
     bool m_commandWaits = false; // for the end of editing
     wxRect m_place;              // where the window shall open
     int m_corrections = 2;       // tries that are left to put it there
-    int32_t m_shownAt = 0;       // Sys_Milliseconds; from the first focus on, when that came
+    int32_t m_placedSince = 0;   // when it was shown, or got its first focus (Sys_Milliseconds)
     bool m_hadFocus = false;
 
     wxDECLARE_EVENT_TABLE();

@@ -16,7 +16,7 @@ static int Done(const BibFileSet *set, BibFile *file)
 {
     ++file->modified;
     if (set && set->changed)
-        set->changed(set->owner);
+        set->changed(set->boxOwner);
     return 1;
 }
 

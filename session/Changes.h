@@ -12,7 +12,7 @@
 
 #include "session/FileSet.h"
 
-// A change that was made in another way: one more to save.
+// One change more, by other code that works on the records (Cartulo::SetModified).
 void Change_Count(const BibFileSet *set, BibFile *file);
 
 // --- Entries ---

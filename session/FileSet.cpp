@@ -157,7 +157,7 @@ static std::string LockFailureText(const char *path, const SysReason &why)
 static void ReportLockFailure(const BibFileSet *set, const char *caption, const std::string &text)
 {
     if (set->box)
-        set->box(set->owner, caption, text.c_str());
+        set->box(set->boxOwner, caption, text.c_str());
     AppLog("ERROR: ", text.c_str());
 }
 

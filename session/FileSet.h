@@ -16,9 +16,10 @@ struct BibFileSet {
                       // "File: `path'\nreason\n" each; null when it wrote everything
     // Shows a warning with an OK button and returns when it is closed. Null: only the log.
     void (*box)(void *owner, const char *caption, const char *text);
-    // Told after each change of an open file (Changes.h). Null: nobody.
+    // Told after each change of an open file (Changes.h); what was taken away is freed by then.
+    // Null: nobody.
     void (*changed)(void *owner);
-    void *owner; // whom both call
+    void *boxOwner; // of both
 };
 
 void FileSet_Append(BibFileSet *set, BibFile *file);

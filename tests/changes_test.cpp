@@ -26,7 +26,7 @@ protected:
     {
         Bib_Initialize();
         set.changed = [](void *owner) { ++static_cast<Changes *>(owner)->told; };
-        set.owner = this;
+        set.boxOwner = this;
     }
     void TearDown() override { FileSet_Free(&set); }
 

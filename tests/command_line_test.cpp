@@ -443,7 +443,7 @@ protected:
             static_cast<CommandProcess *>(owner)->boxes.push_back(std::string(caption) + "|" +
                                                                   text);
         };
-        set.owner = this;
+        set.boxOwner = this;
     }
 
     void TearDown() override

@@ -61,7 +61,7 @@ struct FileSet : testing::Test {
     void SetUp() override
     {
         Bib_Initialize();
-        set.owner = this;
+        set.boxOwner = this;
         set.box = [](void *owner, const char *caption, const char *text) {
             static_cast<FileSet *>(owner)->boxes.push_back(std::string(caption) + "|" + text);
         };

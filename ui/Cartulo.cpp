@@ -1,8 +1,6 @@
 // ui/Cartulo.cpp - the editor panel: the entry list at the left, the selected entry at the right.
 #include "ui/Cartulo.h"
 
-#include <cstdlib>
-
 #include <wx/button.h>
 #include <wx/config.h>
 #include <wx/filedlg.h>
@@ -27,7 +25,6 @@
 #include "ui/Ids.h"
 #include "ui/Messages.h"
 #include "ui/Native.h"
-#include "ui/PanelRules.h"
 #include "ui/Preamble.h"
 #include "ui/QListBox.h"
 #include "ui/Status.h"
@@ -100,7 +97,7 @@ Cartulo::Cartulo(wxWindow *parent, const char *commandLine, CommandState *state)
         Box_Warn(static_cast<Cartulo *>(owner), caption, PathText(text));
     };
     m_set.changed = [](void *owner) { static_cast<Cartulo *>(owner)->UpdateSaveTool(); };
-    m_set.owner = this;
+    m_set.boxOwner = this;
     ReadSchema();
     AppLog("IFNO: Cartulo::Cartulo ", "Parse_Command_Line"); // misspelt, stands so
     ProcessCommand(commandLine, "OnInit");
@@ -125,8 +122,7 @@ Cartulo::~Cartulo()
     wxConfigBase *config = wxConfigBase::Get(false);
     if (config && m_sashPosition > 0)
         config->Write(SashKey, m_sashPosition);
-    m_list->Drop_Index();
-    Grid_Clear(&m_grid); // the panes live on for a moment
+    DestroyChildren(); // they refer to the files and to the grid
     FileSet_Free(&m_set);
     TNSMessage("INFO: Cartulo::~Cartulo ", "End", TNS_LIFECYCLE);
 }
@@ -161,23 +157,31 @@ static wxPanel *CreateBlankPane(wxWindow *parent, const wxString &text,
     return pane;
 }
 
-// PANE_OPEN or PANE_NEW.
-wxWindow *Cartulo::BlankPane(int pane)
+// The blank ones are made when they are needed.
+wxWindow *Cartulo::Pane(PanelPane pane)
 {
-    if (pane == PANE_OPEN && !m_openPane)
-        m_openPane = CreateBlankPane(
-            this, "To open TeX Bibliography file (BIB) click the button:", OpenButton);
-    if (pane == PANE_NEW && !m_newPane)
-        m_newPane = // misspelt, stands so
-            CreateBlankPane(this, "To add new enrty click the button:", AddButton);
-    return pane == PANE_OPEN ? m_openPane : m_newPane;
+    static const char openText[] = "To open TeX Bibliography file (BIB) click the button:";
+    static const char newText[] = "To add new enrty click the button:"; // misspelt, stands so
+    switch (pane) {
+    case PANE_OPEN:
+        if (!m_openPane)
+            m_openPane = CreateBlankPane(this, openText, OpenButton);
+        return m_openPane;
+    case PANE_NEW:
+        if (!m_newPane)
+            m_newPane = CreateBlankPane(this, newText, AddButton);
+        return m_newPane;
+    case PANE_ENTRY:
+        break;
+    }
+    return m_entryPane;
 }
 
 // The panes that fit what is open.
 void Cartulo::Arrange()
 {
-    int pane = Panel_Pane(m_set.count, int(m_list->GetItemCount()));
-    wxWindow *window = pane == PANE_ENTRY ? m_entryPane : BlankPane(pane);
+    PanelPane pane = Panel_Pane(m_set.count, int(m_list->GetItemCount()));
+    wxWindow *window = Pane(pane);
     if (pane == PANE_OPEN)
         ShowAlone(window);
     else if (IsSplit())
@@ -421,11 +425,10 @@ void Cartulo::Update_Tools()
 void Cartulo::SetModified(int file)
 {
     if (file >= 0 && file < m_set.count)
-        Change_Count(&m_set, m_set.files[file]);
+        Change_Count(&m_set, m_set.files[file]); // brings the tool up to date
     else if (file > 0)
         AppLog("SetModified-ERROR - wrong file index ",
                wxString::Format(" %d out of 0..%d", file, m_set.count).utf8_str());
-    UpdateSaveTool();
 }
 
 int Cartulo::SaveAll(bool quiet)

@@ -2,6 +2,8 @@
 #pragma once
 
 #include <wx/panel.h>
+#include <wx/scrolwin.h>
+#include <wx/sizer.h>
 #include <wx/splitter.h>
 
 #include <string>
@@ -9,6 +11,7 @@
 #include "session/CommandLine.h"
 #include "session/FileSet.h"
 #include "ui/FieldGrid.h"
+#include "ui/PanelRules.h"
 
 class Cartulo_Messages;
 class EntryPane;
@@ -17,7 +20,8 @@ class QListBox;
 class Cartulo : public wxSplitterWindow
 {
 public:
-    // Loads the files that the command line names. `state` outlives the panel.
+    // Loads the files that the command line names. `state` outlives the panel; citing takes its
+    // `sendCommand`.
     Cartulo(wxWindow *parent, const char *commandLine, CommandState *state);
     ~Cartulo() override;
 
@@ -66,7 +70,7 @@ public:
 
 private:
     void ReadSchema();
-    wxWindow *BlankPane(int pane);
+    wxWindow *Pane(PanelPane pane);
     void Split(wxWindow *pane);
     void Arrange();
     void ShowAlone(wxWindow *pane);

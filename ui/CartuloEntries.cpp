@@ -97,9 +97,10 @@ void Cartulo::RemoveEntry(int row)
         return;
     }
     BibEntry *next = EntryIndex_Next(m_list->Item(0), int(m_list->GetItemCount()), row);
-    Grid_Clear(&m_grid); // it shows the entry
-    if (!Change_RemoveEntry(&m_set, file, m_entry))
-        return;
+    BibEntry *entry = m_entry;
     m_entry = nullptr;
-    ShowChanged(next);
+    Grid_Clear(&m_grid); // this and the list refer to the entry
+    m_list->Drop_Index();
+    bool isRemoved = Change_RemoveEntry(&m_set, file, entry) != 0;
+    ShowChanged(isRemoved ? next : entry);
 }

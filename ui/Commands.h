@@ -18,7 +18,7 @@ enum CommandHandler { COMMAND_OF_PANEL, COMMAND_OF_FRAME };
 // In the tool bar, where the tools stand in the order of the table.
 struct CommandTool {
     const char *label; // null: there is none
-    const char *icon;  // name of its picture; null: it is a control of its own kind
+    const char *icon;  // name of its picture; null: it is the search field
     const char *tip;
 };
 
@@ -28,8 +28,8 @@ struct CommandHelp {
 };
 
 struct Command {
-    int id;
-    CommandHandler handler;
+    int id;                 // from ui/Ids.h
+    CommandHandler handler; // whose event table has it; a test holds the two against each other
     CommandTool tool;
 
     // The keys that start it in the list, and while an entry is edited: letters in upper case,

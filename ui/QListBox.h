@@ -21,7 +21,8 @@ public:
              long style = 0);
     ~QListBox() override;
 
-    // Whose entries the list shows: those of the panel. It outlives the list.
+    // Whose entries the list shows: those of its owner, who says so right after making the list; it
+    // has none before. They outlive the list.
     void SetFiles(const BibFileSet *files) { m_files = files; }
 
     // Rebuilds the rows and selects that of `select`, else the first; raises no event. Call after
