@@ -9,6 +9,7 @@
 #include "base/Log.h"
 #include "session/EntryRules.h"
 #include "store/BibOutside.h"
+#include "store/BibRecords.h"
 
 // --- What all have in common ---
 
@@ -33,9 +34,7 @@ static void GiveUp(BibEntry *entry)
 
 static void GiveUp(BibString *string)
 {
-    free(string->value);
-    free(string->name);
-    free(string);
+    Bib_FreeString(string);
 }
 
 static void GiveUp(char *text)

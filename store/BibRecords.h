@@ -1,6 +1,6 @@
 // store/BibRecords.h - builds the records of a file out of items.
 //
-// Private to the loader and its tests. Records go to the head of the file's lists; text between the
+// But for the last two functions private to the loader and its tests. Records go to the head of the file's lists; text between the
 // items waits in the file's origin for the item that follows it (BibOutside.h). What is refused
 // leaves the file as it was, but for BIB_NO_MEMORY.
 #pragma once

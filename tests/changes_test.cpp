@@ -11,53 +11,21 @@
 
 #include "session/EntryRules.h"
 #include "session/Schema.h"
-#include "tests/support/LogWatch.h"
-#include "tests/support/TempFolder.h"
+#include "tests/support/OpenFiles.h"
 
 using testing::ElementsAre;
 
 namespace
 {
 
-class Changes : public testing::Test
+class Changes : public OpenFiles
 {
 protected:
     void SetUp() override
     {
-        Bib_Initialize();
+        OpenFiles::SetUp();
         set.changed = [](void *owner) { ++static_cast<Changes *>(owner)->told; };
         set.boxOwner = this;
-    }
-    void TearDown() override { FileSet_Free(&set); }
-
-    BibFile *Open(const std::string &name, const std::string &text)
-    {
-        int errors = FileSet_Open(&set, folder.Write(name, text).c_str());
-        EXPECT_EQ(0, errors) << name;
-        return set.files[set.count - 1];
-    }
-
-    std::string Saved(BibFile *file, const std::string &name)
-    {
-        EXPECT_EQ(1, FileSet_SaveOne(&set, file));
-        return folder.Read(name);
-    }
-
-    static BibEntry *Find(const BibFile *file, const std::string &key)
-    {
-        for (BibEntry *entry = file->entries; entry; entry = entry->next)
-            if (key == entry->key)
-                return entry;
-        ADD_FAILURE() << "no entry " << key;
-        return nullptr;
-    }
-
-    static std::string Keys(const BibFile *file)
-    {
-        std::string keys;
-        for (const BibEntry *entry = file->entries; entry; entry = entry->next)
-            keys += std::string(entry->key) + " ";
-        return keys;
     }
 
     static std::vector<std::string> StringNames(const BibFile *file)
@@ -77,9 +45,6 @@ protected:
         EXPECT_EQ(before + 1, told);
     }
 
-    LogWatch log; // before anything is logged
-    TempFolder folder;
-    BibFileSet set = {};
     int told = 0;
 };
 

@@ -9,8 +9,7 @@
 
 #include "encoding/Encoding.h"
 #include "session/Schema.h"
-#include "tests/support/LogWatch.h"
-#include "tests/support/TempFolder.h"
+#include "tests/support/OpenFiles.h"
 
 using testing::ElementsAre;
 using testing::HasSubstr;
@@ -18,51 +17,10 @@ using testing::HasSubstr;
 namespace
 {
 
-class EntryRules : public testing::Test
-{
-protected:
-    void SetUp() override { Bib_Initialize(); }
-    void TearDown() override { FileSet_Free(&set); }
-
-    BibFile *Open(const std::string &name, const std::string &text)
-    {
-        int errors = FileSet_Open(&set, folder.Write(name, text).c_str());
-        EXPECT_EQ(0, errors) << name;
-        return set.files[set.count - 1];
-    }
-
-    std::string Saved(BibFile *file, const std::string &name)
-    {
-        EXPECT_EQ(1, FileSet_SaveOne(&set, file));
-        return folder.Read(name);
-    }
-
-    static BibEntry *Find(const BibFile *file, const std::string &key)
-    {
-        for (BibEntry *entry = file->entries; entry; entry = entry->next)
-            if (key == entry->key)
-                return entry;
-        ADD_FAILURE() << "no entry " << key;
-        return nullptr;
-    }
-
-    static std::string Keys(const BibFile *file)
-    {
-        std::string keys;
-        for (const BibEntry *entry = file->entries; entry; entry = entry->next)
-            keys += std::string(entry->key) + " ";
-        return keys;
-    }
-
-    LogWatch log; // before anything is logged
-    TempFolder folder;
-    BibFileSet set = {};
-};
-
-using EntryFiles = EntryRules;
-using EntryKeys = EntryRules;
-using NewEntry = EntryRules;
-using ReferredEntry = EntryRules;
+using EntryFiles = OpenFiles;
+using EntryKeys = OpenFiles;
+using NewEntry = OpenFiles;
+using ReferredEntry = OpenFiles;
 
 const std::string Talks = "@misc{Griske84, note = {Talk}}\n";
 const std::string Books = "@book{Ost77, title = {East}}\n";

@@ -5,32 +5,14 @@
 #include <string>
 #include <vector>
 
-#include "session/FileSet.h"
-#include "session/KnownStrings.h"
-#include "tests/support/LoadText.h"
-#include "tests/support/TempFolder.h"
+#include "tests/support/LoadedStrings.h"
 
 using Lines = std::vector<std::string>;
 using testing::ElementsAre;
 
-class StringSourcesTest : public testing::Test
+class StringSourcesTest : public LoadedStrings
 {
 protected:
-    StringSourcesTest() { Bib_Initialize(); }
-    ~StringSourcesTest() override { FileSet_Free(&set); }
-
-    BibFile *Load(const std::string &text)
-    {
-        BibFile *file = LoadText(text);
-        FileSet_Append(&set, file);
-        return file;
-    }
-
-    StringSources Read(const std::string &ini)
-    {
-        return Strings_Sources(&set, folder.Write("a.ini", ini));
-    }
-
     // The source at a position of the choice.
     static int At(const StringSources &sources, int position)
     {
@@ -52,9 +34,6 @@ protected:
             names.push_back(string->name);
         return names;
     }
-
-    TempFolder folder;
-    BibFileSet set = {};
 };
 
 static const char TwoLists[] = "[String]\nMonths = *Months\nno list\nOther = *Other\n"

@@ -4,36 +4,14 @@
 #include <string>
 #include <vector>
 
-#include "session/FileSet.h"
-#include "tests/support/LoadText.h"
-#include "tests/support/TempFolder.h"
+#include "tests/support/LoadedStrings.h"
 #include "ui/StringRules.h"
 
 using Lines = std::vector<std::string>;
 
 // --- Sources ---
 
-class StringRulesSources : public testing::Test
-{
-protected:
-    StringRulesSources() { Bib_Initialize(); }
-    ~StringRulesSources() override { FileSet_Free(&set); }
-
-    BibFile *Load(const std::string &text)
-    {
-        BibFile *file = LoadText(text);
-        FileSet_Append(&set, file);
-        return file;
-    }
-
-    StringSources Read(const std::string &ini)
-    {
-        return Strings_Sources(&set, folder.Write("a.ini", ini));
-    }
-
-    TempFolder folder;
-    BibFileSet set = {};
-};
+using StringRulesSources = LoadedStrings;
 
 static const char TwoLists[] = "[String]\nMonths = *Months\nOther = *Other\n"
                                "[*Months]\njan = January\n[*Other]\nx = y\n";
